@@ -1,0 +1,170 @@
+// The Image record: creation, release, per-pixel accessors and copies.
+#include <pxfx/core.h>
+
+#include <cstring>
+
+#include "core/internal/image_check.hpp"
+#include "core/internal/pixel.hpp"
+
+using namespace pxfx;
+
+namespace {
+
+int32_t clamp_coord(int32_t v, int32_t n) { return v < 0 ? 0 : (v >= n ? n - 1 : v); }
+
+bool inside(const Image *im, int32_t x, int32_t y) { return x >= 0 && y >= 0 && x < im->width && y < im->height; }
+
+// Converting copy: walks dst, reading src with clamping. A 32-bit destination
+// keeps its own alpha bytes.
+template <class S, class D> void copy_convert(Image *dst, const Image *src) {
+    const int32_t sw = src->width, sh = src->height;
+    const int32_t dw = dst->width, dh = dst->height;
+    const int32_t direct = dw < sw ? dw : sw;
+    for (int32_t y = 0; y < dh; ++y) {
+        const typename S::CRow s = S::crow(src, y < sh ? y : sh - 1);
+        const typename D::Row d = D::row(dst, y);
+        const uint32_t last = S::load(s, sw - 1);
+        for (int32_t x = 0; x < dw; ++x) {
+            const uint32_t c = x < direct ? S::load(s, x) : last;
+            if constexpr (D::kBitCount == 32) {
+                uint8_t *p = d + 4 * x;
+                p[0] = static_cast<uint8_t>(c);
+                p[1] = static_cast<uint8_t>(c >> 8);
+                p[2] = static_cast<uint8_t>(c >> 16);
+            } else {
+                D::store(d, x, c);
+            }
+        }
+    }
+}
+
+} // namespace
+
+extern "C" {
+
+Image *malloc_Image(int32_t width, int32_t height, int32_t bitCount) {
+    if (width <= 0 || height <= 0) return nullptr;
+    const uint32_t stored = (bitCount == 16 || bitCount == 24 || bitCount == 32) ? static_cast<uint32_t>(bitCount) : 8;
+    const uint64_t pitch = ((static_cast<uint64_t>(width) * stored + 31) / 32) * 4;
+    const uint64_t bytes = pitch * static_cast<uint64_t>(height);
+    if (bytes > kMaxBlockBytes) return nullptr;
+
+    Image *im = static_cast<Image *>(PX_malloc(sizeof(Image)));
+    if (im == nullptr) return nullptr;
+    im->bits = static_cast<uint8_t *>(PX_malloc(static_cast<size_t>(bytes)));
+    if (im->bits == nullptr) {
+        PX_free(im);
+        return nullptr;
+    }
+    std::memset(im->bits, 255, static_cast<size_t>(bytes));
+    im->width = width;
+    im->height = height;
+    im->bitCount = stored;
+    im->pitch = static_cast<uint32_t>(pitch);
+    im->tag = 0;
+    return im;
+}
+
+void free_Image(Image **image, int32_t keepRecord) {
+    if (image == nullptr || *image == nullptr) return;
+    if ((*image)->bits != nullptr) {
+        PX_free((*image)->bits);
+        (*image)->bits = nullptr;
+    }
+    if (keepRecord == 0) {
+        PX_free(*image);
+        *image = nullptr;
+    }
+}
+
+uint8_t GetPixelIndex(const Image *image, int32_t x, int32_t y) {
+    if (!has_pixels(image) || static_cast<int32_t>(image->bitCount) > 8) return 0;
+    x = clamp_coord(x, image->width);
+    y = clamp_coord(y, image->height);
+    const uint8_t *row = row_ptr(image, y);
+    switch (image->bitCount) {
+    case 8: return row[x];
+    case 4: return (row[x / 2] >> ((1 - x % 2) * 4)) & 15;
+    case 1: return (row[x / 8] >> (7 - x % 8)) & 1;
+    default: return 0;
+    }
+}
+
+uint32_t GetPixelColor(const Image *image, int32_t x, int32_t y) {
+    if (!has_pixels(image)) return 0;
+    const int32_t cx = clamp_coord(x, image->width);
+    const int32_t cy = clamp_coord(y, image->height);
+    switch (image->bitCount) {
+    case 24: return Bgr24::load(row_ptr(image, cy), cx);
+    case 32: return Bgra32::load(row_ptr(image, cy), cx);
+    case 16: return Word16::load(row_ptr(image, cy), cx);
+    default: {
+        const uint32_t i = GetPixelIndex(image, cx, cy);
+        return pack(i, i, i, 255);
+    }
+    }
+}
+
+uint8_t GetPixelGray(const Image *image, int32_t x, int32_t y) {
+    const uint32_t c = GetPixelColor(image, x, y);
+    return static_cast<uint8_t>((306 * red_of(c) + 601 * green_of(c) + 117 * blue_of(c)) >> 10);
+}
+
+void SetPixelIndex(Image *image, int32_t x, int32_t y, int32_t index) {
+    if (!has_pixels(image) || !inside(image, x, y)) return;
+    uint8_t *row = row_ptr(image, y);
+    switch (image->bitCount) {
+    case 8: row[x] = static_cast<uint8_t>(index); break;
+    case 4: {
+        const int shift = (1 - x % 2) * 4;
+        row[x / 2] = static_cast<uint8_t>((row[x / 2] & ~(15 << shift)) | ((index & 15) << shift));
+        break;
+    }
+    case 1: {
+        const int shift = 7 - x % 8;
+        row[x / 8] = static_cast<uint8_t>((row[x / 8] & ~(1 << shift)) | ((index & 1) << shift));
+        break;
+    }
+    default: break;
+    }
+}
+
+void SetPixelColor(Image *image, int32_t x, int32_t y, uint32_t colour) {
+    if (!has_pixels(image) || !inside(image, x, y)) return;
+    if (static_cast<int32_t>(image->bitCount) <= 8) {
+        SetPixelIndex(image, x, y, static_cast<int32_t>(green_of(colour)));
+        return;
+    }
+    switch (image->bitCount) {
+    case 16: Word16::store(row_ptr(image, y), x, colour); break;
+    case 24: Bgr24::store(row_ptr(image, y), x, colour); break;
+    case 32: Bgra32::store(row_ptr(image, y), x, colour); break;
+    default: break;
+    }
+}
+
+int32_t PX_Img_Copy(Image *dst, const Image *src) {
+    if (!has_pixels(dst) || !has_pixels(src)) return 0;
+    if (dst->pitch == src->pitch && dst->height == src->height && dst->bitCount == src->bitCount) {
+        std::memmove(dst->bits, src->bits, block_bytes(src));
+        return 1;
+    }
+    with_format(src->bitCount, [&](auto s) {
+        with_format(dst->bitCount, [&](auto d) { copy_convert<decltype(s), decltype(d)>(dst, src); });
+    });
+    return 1;
+}
+
+int32_t PX_Img_CopyAlpha(Image *dst, const Image *src) {
+    if (!has_pixels(dst) || !has_pixels(src)) return 0;
+    if (dst->bitCount != 32 || src->bitCount != 32 || dst->height != src->height || dst->width != src->width) return 0;
+    for (int32_t y = 0; y < dst->height; ++y) {
+        const uint8_t *s = row_ptr(src, y);
+        uint8_t *d = row_ptr(dst, y);
+        for (int32_t x = 0; x < dst->width; ++x)
+            d[4 * x + 3] = s[4 * x + 3];
+    }
+    return 1;
+}
+
+} // extern "C"

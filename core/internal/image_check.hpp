@@ -1,0 +1,61 @@
+// Validity of caller records and overflow-checked sizes.
+//
+// Every function that touches pixels first asks `has_pixels`: a record counts
+// as having pixels only when it is non-null, has a pixel block, positive width
+// and height, a pitch that holds one row of its pixels, and a block of at most
+// kMaxBlockBytes. Records filled in by
+// hand that fail this are treated like records without pixels.
+#pragma once
+
+#include <pxfx/core.h>
+
+#include <cstddef>
+#include <cstdint>
+
+namespace pxfx {
+
+// Largest pixel block the library creates or accepts, in bytes. Keeping blocks
+// below 2^31 keeps every pixel count and byte offset in signed 32-bit range.
+inline constexpr uint64_t kMaxBlockBytes = 0x7FFFFFFFu;
+
+// Bytes that one row of `width` pixels needs at `bitCount` bits per pixel. Bit
+// counts that the accessors never read from memory need none.
+constexpr uint64_t min_row_bytes(uint32_t bitCount, int32_t width) {
+    const uint64_t w = width > 0 ? static_cast<uint64_t>(width) : 0;
+    switch (bitCount) {
+    case 1: return (w + 7) / 8;
+    case 4: return (w * 4 + 7) / 8;
+    case 8: return w;
+    case 16: return w * 2;
+    case 24: return w * 3;
+    case 32: return w * 4;
+    default: return 0;
+    }
+}
+
+// True when the record's geometry is usable (pixels may still be null).
+// Blocks above kMaxBlockBytes are refused, so for a valid record every pixel
+// count and byte offset fits in 31 bits, on 32-bit targets too.
+inline bool geometry_ok(const Image *im) {
+    return im->width > 0 && im->height > 0 && im->pitch >= min_row_bytes(im->bitCount, im->width) &&
+           static_cast<uint64_t>(im->pitch) * static_cast<uint64_t>(im->height) <= kMaxBlockBytes;
+}
+
+inline bool has_pixels(const Image *im) { return im != nullptr && im->bits != nullptr && geometry_ok(im); }
+
+// True for an 8-bit record with pixels.
+inline bool is_plane(const Image *im) { return has_pixels(im) && im->bitCount == 8; }
+
+// Bytes of the pixel block of a valid record.
+inline size_t block_bytes(const Image *im) { return static_cast<size_t>(im->pitch) * static_cast<size_t>(im->height); }
+
+// a * b * c as size_t, or 0 when the product overflows or exceeds kMaxBlockBytes.
+constexpr size_t checked_size(uint64_t a, uint64_t b, uint64_t c = 1) {
+    if (a == 0 || b == 0 || c == 0) return 0;
+    if (a > kMaxBlockBytes || b > kMaxBlockBytes / a) return 0;
+    const uint64_t ab = a * b;
+    if (c > kMaxBlockBytes / ab) return 0;
+    return static_cast<size_t>(ab * c);
+}
+
+} // namespace pxfx

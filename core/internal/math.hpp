@@ -1,0 +1,61 @@
+// Inline forms of the integer math helpers for per-pixel loops. The exported
+// functions of core/math.cpp are thin wrappers over these.
+#pragma once
+
+#include <cstdint>
+
+namespace pxfx {
+
+constexpr uint8_t clamp_u8(int32_t v) { return v > 255 ? 255 : (v < 0 ? 0 : static_cast<uint8_t>(v)); }
+
+template <class T> constexpr T clamp_to(T v, T lo, T hi) { return v < lo ? lo : (v > hi ? hi : v); }
+
+// Bit-by-bit square root over 32 bits, rounded to the nearest integer.
+constexpr uint32_t isqrt_round(uint32_t x) {
+    uint32_t root = 0;
+    uint32_t rem = x;
+    for (uint32_t bit = 1u << 30; bit != 0; bit >>= 2) {
+        if (rem >= root + bit) {
+            rem -= root + bit;
+            root = (root >> 1) + bit;
+        } else {
+            root >>= 1;
+        }
+    }
+    return rem > root ? root + 1 : root;
+}
+
+// Distance2D: the squared length formed modulo 2^32.
+constexpr uint32_t distance2d(int32_t dx, int32_t dy) {
+    const uint32_t ux = static_cast<uint32_t>(dx), uy = static_cast<uint32_t>(dy);
+    return isqrt_round(ux * ux + uy * uy);
+}
+
+// round(sin(i degrees) * 100000) for i = 0..90.
+inline constexpr int32_t kSinTable[91] = {
+    0,     1745,  3490,  5234,  6976,  8716,  10453, 12187, 13917, 15643, 17365, 19081, 20791, 22495, 24192, 25882,
+    27564, 29237, 30902, 32557, 34202, 35837, 37461, 39073, 40674, 42262, 43837, 45399, 46947, 48481, 50000, 51504,
+    52992, 54464, 55919, 57358, 58779, 60182, 61566, 62932, 64279, 65606, 66913, 68200, 69466, 70711, 71934, 73135,
+    74314, 75471, 76604, 77715, 78801, 79864, 80902, 81915, 82904, 83867, 84805, 85717, 86603, 87462, 88295, 89101,
+    89879, 90631, 91355, 92050, 92718, 93358, 93969, 94552, 95106, 95630, 96126, 96593, 97030, 97437, 97815, 98163,
+    98481, 98769, 99027, 99255, 99452, 99619, 99756, 99863, 99939, 99985, 100000};
+
+constexpr int32_t table_sin(int32_t angle) {
+    int32_t a = angle % 360;
+    if (a < 0) a += 360;
+    if (a <= 90) return kSinTable[a];
+    if (a <= 180) return kSinTable[180 - a];
+    if (a <= 270) return -kSinTable[a - 180];
+    return -kSinTable[360 - a];
+}
+
+constexpr int32_t table_cos(int32_t angle) {
+    int32_t a = angle % 360;
+    if (a < 0) a += 360;
+    if (a <= 90) return kSinTable[90 - a];
+    if (a <= 180) return -kSinTable[a - 90];
+    if (a <= 270) return -kSinTable[270 - a];
+    return kSinTable[a - 270];
+}
+
+} // namespace pxfx

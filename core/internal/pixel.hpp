@@ -1,0 +1,153 @@
+// Pixel-format traits: the accessor rules of the Image record as inlineable
+// row operations, so hot loops can be specialised per format instead of calling
+// GetPixelColor / SetPixelColor per pixel.
+//
+// Each format offers
+//   CRow / Row            row handles for reading / writing
+//   crow(im, y), row(im, y)
+//   load(crow, x)         packed colour exactly as GetPixelColor returns it
+//   store(row, x, c)      exactly as SetPixelColor stores it
+// `x` and `y` must lie inside the picture; clamping is the caller's loop
+// structure (border and interior handled separately).
+//
+// `with_format` picks the format once per call. 8, 16, 24 and 32 bits get
+// direct byte access; every other bit count (1, 4, and values no accessor
+// reads) goes through the accessor functions, which already handle them.
+#pragma once
+
+#include <pxfx/core.h>
+
+#include <cstddef>
+#include <cstdint>
+
+namespace pxfx {
+
+inline constexpr uint32_t kOpaque = 0xFF000000u;
+
+constexpr uint32_t pack(uint32_t b, uint32_t g, uint32_t r, uint32_t a) { return b | g << 8 | r << 16 | a << 24; }
+constexpr uint32_t blue_of(uint32_t c) { return c & 0xFF; }
+constexpr uint32_t green_of(uint32_t c) { return (c >> 8) & 0xFF; }
+constexpr uint32_t red_of(uint32_t c) { return (c >> 16) & 0xFF; }
+constexpr uint32_t alpha_of(uint32_t c) { return c >> 24; }
+
+// Gray of the drawing effects: (117 R + 601 G + 306 B) >> 10, with the small
+// weight on red and the large one on blue.
+constexpr uint32_t drawing_gray(uint32_t c) { return (117 * red_of(c) + 601 * green_of(c) + 306 * blue_of(c)) >> 10; }
+
+inline const uint8_t *row_ptr(const Image *im, int32_t y) { return im->bits + static_cast<size_t>(y) * im->pitch; }
+inline uint8_t *row_ptr(Image *im, int32_t y) { return im->bits + static_cast<size_t>(y) * im->pitch; }
+
+struct Gray8 {
+    static constexpr uint32_t kBitCount = 8;
+    static constexpr bool kDirect = true;
+    using CRow = const uint8_t *;
+    using Row = uint8_t *;
+    static CRow crow(const Image *im, int32_t y) { return row_ptr(im, y); }
+    static Row row(Image *im, int32_t y) { return row_ptr(im, y); }
+    static uint32_t load(CRow r, int32_t x) {
+        const uint32_t i = r[x];
+        return i | i << 8 | i << 16 | kOpaque;
+    }
+    // A colour written into an index image stores its green byte.
+    static void store(Row r, int32_t x, uint32_t c) { r[x] = static_cast<uint8_t>(c >> 8); }
+};
+
+// 16-bit words hold blue in the high bits and red in the low bits; channels
+// read back with zero low bits and alpha 0.
+struct Word16 {
+    static constexpr uint32_t kBitCount = 16;
+    static constexpr bool kDirect = true;
+    using CRow = const uint8_t *;
+    using Row = uint8_t *;
+    static CRow crow(const Image *im, int32_t y) { return row_ptr(im, y); }
+    static Row row(Image *im, int32_t y) { return row_ptr(im, y); }
+    static uint32_t load(CRow r, int32_t x) {
+        const uint32_t w = r[2 * x] | static_cast<uint32_t>(r[2 * x + 1]) << 8;
+        return pack((w >> 11) * 8, ((w >> 5) & 63) * 4, (w & 31) * 8, 0);
+    }
+    static void store(Row r, int32_t x, uint32_t c) {
+        const uint32_t w = ((blue_of(c) >> 3) << 11) + ((green_of(c) >> 2) << 5) + (red_of(c) >> 3);
+        r[2 * x] = static_cast<uint8_t>(w);
+        r[2 * x + 1] = static_cast<uint8_t>(w >> 8);
+    }
+};
+
+struct Bgr24 {
+    static constexpr uint32_t kBitCount = 24;
+    static constexpr bool kDirect = true;
+    using CRow = const uint8_t *;
+    using Row = uint8_t *;
+    static CRow crow(const Image *im, int32_t y) { return row_ptr(im, y); }
+    static Row row(Image *im, int32_t y) { return row_ptr(im, y); }
+    static uint32_t load(CRow r, int32_t x) {
+        const uint8_t *p = r + 3 * x;
+        return pack(p[0], p[1], p[2], 255);
+    }
+    static void store(Row r, int32_t x, uint32_t c) {
+        uint8_t *p = r + 3 * x;
+        p[0] = static_cast<uint8_t>(c);
+        p[1] = static_cast<uint8_t>(c >> 8);
+        p[2] = static_cast<uint8_t>(c >> 16);
+    }
+};
+
+struct Bgra32 {
+    static constexpr uint32_t kBitCount = 32;
+    static constexpr bool kDirect = true;
+    using CRow = const uint8_t *;
+    using Row = uint8_t *;
+    static CRow crow(const Image *im, int32_t y) { return row_ptr(im, y); }
+    static Row row(Image *im, int32_t y) { return row_ptr(im, y); }
+    static uint32_t load(CRow r, int32_t x) {
+        const uint8_t *p = r + 4 * x;
+        return pack(p[0], p[1], p[2], p[3]);
+    }
+    static void store(Row r, int32_t x, uint32_t c) {
+        uint8_t *p = r + 4 * x;
+        p[0] = static_cast<uint8_t>(c);
+        p[1] = static_cast<uint8_t>(c >> 8);
+        p[2] = static_cast<uint8_t>(c >> 16);
+        p[3] = static_cast<uint8_t>(c >> 24);
+    }
+};
+
+// Any other bit count: the accessors decide (1 and 4 bits read their index,
+// the rest read as opaque black and ignore writes).
+struct AnyFormat {
+    static constexpr uint32_t kBitCount = 0;
+    static constexpr bool kDirect = false;
+    struct CRow {
+        const Image *im;
+        int32_t y;
+    };
+    struct Row {
+        Image *im;
+        int32_t y;
+    };
+    static CRow crow(const Image *im, int32_t y) { return {im, y}; }
+    static Row row(Image *im, int32_t y) { return {im, y}; }
+    static uint32_t load(CRow r, int32_t x) { return GetPixelColor(r.im, x, r.y); }
+    static void store(Row r, int32_t x, uint32_t c) { SetPixelColor(r.im, x, r.y, c); }
+};
+
+// Calls fn(Format{}) with the format of `bitCount`.
+template <class Fn> decltype(auto) with_format(uint32_t bitCount, Fn &&fn) {
+    switch (bitCount) {
+    case 8: return fn(Gray8{});
+    case 16: return fn(Word16{});
+    case 24: return fn(Bgr24{});
+    case 32: return fn(Bgra32{});
+    default: return fn(AnyFormat{});
+    }
+}
+
+// Clamped reads, as GetPixelColor does, for border code of a known format.
+template <class F> struct Sampler {
+    const Image *im;
+    int32_t w, h;
+    explicit Sampler(const Image *image) : im(image), w(image->width), h(image->height) {}
+    static int32_t clamp(int32_t v, int32_t n) { return v < 0 ? 0 : (v >= n ? n - 1 : v); }
+    uint32_t at(int32_t x, int32_t y) const { return F::load(F::crow(im, clamp(y, h)), clamp(x, w)); }
+};
+
+} // namespace pxfx

@@ -1,0 +1,95 @@
+/*
+ * pxfx colour spaces and generic filters: per-pixel conversions between RGB and
+ * HSL, YUV, YIQ, XYZ; channel planes; hue/lightness/saturation shifts; the
+ * kernel convolution filter with its fixed kernels; the fast box smoothing.
+ *
+ * Packed colours are B in bits 0-7, G 8-15, R 16-23, A 24-31 for RGB. The other
+ * spaces keep their first component in bits 16-23, the second in 8-15 and the
+ * third in 0-7; alpha passes through. Mode numbers: 1 HSL, 2 YUV, 3 YIQ, 4 XYZ,
+ * anything else plain RGB.
+ */
+#ifndef PXFX_COLOR_H
+#define PXFX_COLOR_H
+
+#include "core.h"
+
+#ifdef __cplusplus
+extern "C" {
+#endif
+
+/* ---- Colour-space conversions ---------------------------------------------- */
+
+/* RGB to HSL (hue 0-255 a full turn, achromatic hue 170), integer arithmetic. */
+PXFX_API uint32_t RGBtoHSL(uint32_t colour);
+/* HSL to RGB, integer arithmetic. */
+PXFX_API uint32_t HSLtoRGB(uint32_t colour);
+/* One channel of HSLtoRGB from the two levels and a hue; result modulo 65536. */
+PXFX_API uint16_t HueToRGB(uint16_t lo, uint16_t hi, uint16_t hue);
+/* RGB to YUV (U, V offset by 128), single precision, truncated and clamped. */
+PXFX_API uint32_t RGBtoYUV(uint32_t colour);
+/* YUV to RGB, single precision, truncated and clamped. */
+PXFX_API uint32_t YUVtoRGB(uint32_t colour);
+/* RGB to YIQ (I, Q offset by 128), single precision, truncated and clamped. */
+PXFX_API uint32_t RGBtoYIQ(uint32_t colour);
+/* YIQ to RGB, single precision, truncated and clamped. */
+PXFX_API uint32_t YIQtoRGB(uint32_t colour);
+/* RGB to XYZ (Z scaled by 0.9184837), single precision, truncated. */
+PXFX_API uint32_t RGBtoXYZ(uint32_t colour);
+/* XYZ to RGB; the Z term is finished in double precision. */
+PXFX_API uint32_t XYZtoRGB(uint32_t colour);
+
+/* ---- Channel planes -------------------------------------------------------- */
+
+/* Splits src into three new 8-bit planes (first component, second, third) and
+ * optionally an alpha plane, releasing images already in the slots. 1 or 0. */
+PXFX_API int32_t Split(const Image *src, Image **plane1, Image **plane2, Image **plane3, Image **alphaPlane,
+                       int32_t mode);
+/* Joins three 8-bit planes (and an optional alpha plane) into a new 24-bit (32-bit
+ * with alpha) image; null on failure. Caller owns the result. */
+PXFX_API Image *Combine(const Image *plane1, const Image *plane2, const Image *plane3, const Image *alphaPlane,
+                        int32_t mode);
+
+/* ---- Hue, lightness and saturation ---------------------------------------- */
+
+/* Shifts an 8-bit hue plane by (amount * 255 - 25500) / 100, wrapping by 255. 1 or 0. */
+PXFX_API int32_t BaseTran_Hue(Image *plane, int32_t amount);
+/* Shifts an 8-bit saturation or lightness plane by the same step, clamped. 1 or 0. */
+PXFX_API int32_t BaseTran_LS(Image *plane, int32_t amount);
+/* Shifts hue (component 0), saturation (1) or lightness (2) of a picture by a
+ * slider amount (100 = unchanged) through HSL planes into *out. 1 or 0. */
+PXFX_API int32_t PX_IMG_Transform(const Image *src, Image **out, int32_t amount, int32_t component);
+
+/* ---- Kernel convolution ------------------------------------------------------ */
+
+/* Normalised Gaussian kernels: row r - 1 holds radius r (taps 0..2r), zero-padded. */
+PXFX_API extern const float matrixX[10][21];
+
+/* Convolves src with a size x size kernel, divides, offsets and clamps; into dst
+ * (same size and bit count) or, with dst null, in place. An 8-bit mask selects
+ * pixels of 8-bit images and limits the area of others; gray >= 1 writes gray.
+ * 1, or 0 for no pixels or a failed allocation. */
+PXFX_API int32_t Filter(Image *src, const int32_t *kernel, int32_t size, int32_t divisor, int32_t offset,
+                        const Image *mask, Image *dst, int32_t gray);
+/* 3 x 3 mean into *out (reused when it fits). Result of Filter, or 0. */
+PXFX_API int32_t PX_IMG_Blur(const Image *src, Image **out);
+/* 3 x 3 soften (centre weight 8, divisor 16) into *out. Result of Filter, or 0. */
+PXFX_API int32_t PX_IMG_Soften(const Image *src, Image **out);
+/* 3 x 3 sharpen (centre 15, divisor 7) into *out. Result of Filter, or 0. */
+PXFX_API int32_t PX_IMG_Sharpen(const Image *src, Image **out);
+/* Gray diagonal relief around 127 into *out. Result of Filter, or 0. */
+PXFX_API int32_t PX_IMG_Emboss1(const Image *src, Image **out);
+
+/* ---- Fast box smoothing ------------------------------------------------------- */
+
+/* In-place size x size box mean plus offset, clamped, edges repeated; alpha is
+ * smoothed too. 1 when processed, 0 when refused. */
+PXFX_API int32_t Filter_fast(Image *image, int32_t size, int32_t offset);
+/* Box smoothing by a 0-100 strength (box size strength / 10) into *out, or in
+ * place when out is null. 1 or 0. */
+PXFX_API int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength);
+
+#ifdef __cplusplus
+}
+#endif
+
+#endif /* PXFX_COLOR_H */

@@ -1,0 +1,41 @@
+# Compares the dynamic symbols that LIBRARY defines with the names listed in
+# EXPORT_LISTS (one name per line, # starts a comment). Fails on any difference.
+execute_process(COMMAND ${NM} -D --defined-only ${LIBRARY}
+  OUTPUT_VARIABLE nm_out RESULT_VARIABLE nm_rc)
+if(NOT nm_rc EQUAL 0)
+  message(FATAL_ERROR "nm failed on ${LIBRARY}")
+endif()
+
+set(exported)
+string(REPLACE "\n" ";" nm_lines "${nm_out}")
+foreach(line IN LISTS nm_lines)
+  if(line MATCHES "^[0-9a-fA-F]* +[A-Za-z] +([^ ]+)$")
+    set(name "${CMAKE_MATCH_1}")
+    # Versioned names carry @VERSION; the linker adds no others.
+    string(REGEX REPLACE "@.*$" "" name "${name}")
+    list(APPEND exported "${name}")
+  endif()
+endforeach()
+list(REMOVE_DUPLICATES exported)
+
+set(expected)
+foreach(list_file IN LISTS EXPORT_LISTS)
+  file(STRINGS ${list_file} names)
+  foreach(name IN LISTS names)
+    string(REGEX REPLACE "#.*$" "" name "${name}")
+    string(STRIP "${name}" name)
+    if(name)
+      list(APPEND expected "${name}")
+    endif()
+  endforeach()
+endforeach()
+
+set(missing ${expected})
+list(REMOVE_ITEM missing ${exported})
+set(extra ${exported})
+list(REMOVE_ITEM extra ${expected})
+list(LENGTH expected n_expected)
+if(missing OR extra)
+  message(FATAL_ERROR "export mismatch\n  missing: ${missing}\n  unexpected: ${extra}")
+endif()
+message(STATUS "exports: ${n_expected} interface names, nothing else")

@@ -1,0 +1,50 @@
+// Helpers shared by the test programs: owned images, seeded random pictures
+// and pixel comparisons.
+#pragma once
+
+#include <pxfx/pxfx.h>
+
+#include <cstdint>
+#include <memory>
+#include <random>
+#include <string>
+
+namespace pxtest {
+
+struct ImageDeleter {
+    void operator()(Image *im) const { free_Image(&im, 0); }
+};
+using Owned = std::unique_ptr<Image, ImageDeleter>;
+
+// A new image (filled with 255 by malloc_Image).
+Owned make(int32_t width, int32_t height, int32_t bitCount);
+
+// A new image whose every byte (padding included) comes from a seeded stream.
+Owned random_image(int32_t width, int32_t height, int32_t bitCount, uint32_t seed);
+
+// A new image filled with one packed colour through SetPixelColor.
+Owned filled(int32_t width, int32_t height, int32_t bitCount, uint32_t colour);
+
+// An independent deep copy (same pitch, same bytes).
+Owned clone(const Image *src);
+
+// Empty string when the two images have the same size, bit count and pixel
+// bytes (padding ignored); otherwise a description of the first difference.
+std::string diff(const Image *a, const Image *b);
+
+// Slot helper: releases whatever the slot holds when it goes out of scope.
+struct Slot {
+    Image *image = nullptr;
+    Slot() = default;
+    Slot(const Slot &) = delete;
+    Slot &operator=(const Slot &) = delete;
+    ~Slot() { free_Image(&image, 0); }
+    Image **operator&() { return &image; }
+    Image *operator->() const { return image; }
+    Image *get() const { return image; }
+};
+
+// The bit counts every Image function must handle.
+inline constexpr int32_t kBitCounts[] = {8, 16, 24, 32};
+
+} // namespace pxtest
