@@ -140,3 +140,15 @@ TEST_F(FilesTest, SaveBmpFailures) {
     ASSERT_EQ(saveBmp(path("c.bmp").c_str(), im.get()), 1);
     EXPECT_EQ(read(path("c.bmp")).size(), 54u + 16u);
 }
+
+TEST(Fixtures, BundledPicturesLoadAndRoundTripThroughSaveBmp) {
+    Owned portrait = load_fixture("portrait-128.bmp");
+    ASSERT_TRUE(portrait);
+    EXPECT_EQ(portrait->width, 128);
+    EXPECT_EQ(portrait->height, 128);
+    EXPECT_EQ(portrait->bitCount, 24u);
+    Owned coffee = load_fixture("coffee-100x66.bmp");
+    ASSERT_TRUE(coffee);
+    EXPECT_EQ(coffee->width, 100);
+    EXPECT_FALSE(load_fixture("missing.bmp"));
+}

@@ -1,7 +1,9 @@
 #include "support/test_images.hpp"
 
+#include <cstdio>
 #include <cstring>
 #include <sstream>
+#include <vector>
 
 namespace pxtest {
 
@@ -27,6 +29,24 @@ Owned filled(int32_t width, int32_t height, int32_t bitCount, uint32_t colour) {
 Owned clone(const Image *src) {
     Owned im = make(src->width, src->height, static_cast<int32_t>(src->bitCount));
     std::memcpy(im->bits, src->bits, static_cast<size_t>(src->pitch) * src->height);
+    return im;
+}
+
+Owned load_fixture(const std::string &name) {
+    int32_t size = 0;
+    unsigned char *file = PX_ReadMemFile((std::string(PXFX_TEST_DATA_DIR) + "/" + name).c_str(), &size);
+    if (file == nullptr) return Owned();
+    auto le = [&](int at) { return int32_t(file[at] | file[at + 1] << 8 | file[at + 2] << 16 | file[at + 3] << 24); };
+    Owned im;
+    if (size >= 54 && file[0] == 'B' && file[1] == 'M' && (file[28] | file[29] << 8) == 24) {
+        im = make(le(18), le(22), 24);
+        const size_t bytes = size_t(im->pitch) * im->height;
+        if (im && size_t(size) >= size_t(le(10)) + bytes)
+            std::memcpy(im->bits, file + le(10), bytes);
+        else
+            im.reset();
+    }
+    PX_ReleaseMemFile(file);
     return im;
 }
 

@@ -32,6 +32,9 @@ Owned clone(const Image *src);
 // bytes (padding ignored); otherwise a description of the first difference.
 std::string diff(const Image *a, const Image *b);
 
+// A picture from tests/data (a 24-bit BMP as saveBmp writes it), or null.
+Owned load_fixture(const std::string &name);
+
 // Slot helper: releases whatever the slot holds when it goes out of scope.
 struct Slot {
     Image *image = nullptr;
