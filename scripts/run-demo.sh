@@ -1,9 +1,9 @@
 #!/usr/bin/env bash
-# Builds pxfx and applies the pencil-sketch effect to the bundled portrait.
+# Builds pxfx and its command-line tool, then writes the effects gallery of the
+# bundled portrait to out/gallery/index.html (open it in a browser).
 set -euo pipefail
 cd "$(dirname "$0")/.."
 bash scripts/install-deps.sh
 cmake -S . -B build -G Ninja -DCMAKE_BUILD_TYPE=Release
-cmake --build build -j "$(nproc)" --target pxfx-sketch
-mkdir -p out
-./build/tools/pxfx-sketch samples/astronaut.png out/astronaut-sketch.png
+cmake --build build -j "$(nproc)" --target pxfx_cli
+./build/tools/pxfx gallery samples/astronaut.png -o out/gallery

@@ -1,6 +1,5 @@
-// Reading and writing pictures for the command-line programs: PNG through
-// libpng, BMP through the library's own saveBmp. Row 0 of an Image is the top
-// row of the PNG.
+// Reading and writing pictures for the command-line tool: PNG (libpng), JPEG
+// (libjpeg) and BMP. Row 0 of an Image is the top row of the picture.
 #pragma once
 
 #include <pxfx/core.h>
@@ -9,12 +8,16 @@
 
 namespace pxio {
 
-// Reads a PNG into a new 24-bit Image (32-bit when it has alpha); null and a
-// message in *error on failure.
-Image *read_png(const std::string &path, std::string *error);
+// Reads a PNG, JPEG or BMP file (recognised by its first bytes) into a new
+// 24-bit Image, 32-bit when the file has alpha, 8-bit for 8-bit BMP files.
+// Null and a message in *error on failure.
+Image *read_image(const std::string &path, std::string *error);
 
-// Writes an 8-, 16-, 24- or 32-bit Image as PNG (8 bits gray, 32 bits with
-// alpha, others RGB); false and a message in *error on failure.
-bool write_png(const std::string &path, const Image *image, std::string *error);
+// Writes an Image as PNG, JPEG or BMP, chosen by the extension of `path`
+// (.png, .jpg/.jpeg, .bmp). False and a message in *error on failure.
+bool write_image(const std::string &path, const Image *image, std::string *error);
+
+// True when write_image knows the extension of `path`.
+bool known_output(const std::string &path);
 
 } // namespace pxio

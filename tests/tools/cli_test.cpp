@@ -1,0 +1,110 @@
+// The pxfx tool end to end: every operation of the table through `pxfx apply`,
+// batches, and the error cases (exit status, no output left behind).
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <string>
+
+#include "image_io.hpp"
+#include "operations.hpp"
+#include "support/test_images.hpp"
+
+namespace fs = std::filesystem;
+using namespace pxtest;
+
+namespace {
+
+class Cli : public ::testing::Test {
+  protected:
+    fs::path dir;
+    void SetUp() override {
+        char tmpl[] = "/tmp/pxfx_cli_XXXXXX";
+        ASSERT_NE(mkdtemp(tmpl), nullptr);
+        dir = tmpl;
+        std::string error;
+        Owned colour = random_image(37, 23, 24, 1);
+        Owned alpha = random_image(21, 17, 32, 2);
+        ASSERT_TRUE(pxio::write_image((dir / "colour.png").string(), colour.get(), &error)) << error;
+        ASSERT_TRUE(pxio::write_image((dir / "alpha.png").string(), alpha.get(), &error)) << error;
+        ASSERT_TRUE(pxio::write_image((dir / "colour.bmp").string(), colour.get(), &error)) << error;
+    }
+    void TearDown() override { fs::remove_all(dir); }
+    static int run(const std::string &args) {
+        const int status = std::system((std::string(PXFX_CLI) + " " + args + " >/dev/null 2>&1").c_str());
+        return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+    }
+    std::string p(const char *name) const { return (dir / name).string(); }
+};
+
+} // namespace
+
+TEST_F(Cli, EveryOperationProducesADecodablePicture) {
+    for (const pxop::Operation &op : pxop::operations()) {
+        for (const char *input : {"colour.png", "alpha.png"}) {
+            const std::string out = p("out.png");
+            ASSERT_EQ(run("apply " + std::string(op.name) + " " + p(input) + " " + out), 0) << op.name << " " << input;
+            std::string error;
+            Owned in(pxio::read_image(p(input), &error)), result(pxio::read_image(out, &error));
+            ASSERT_TRUE(result) << op.name << ": " << error;
+            if (op.sameSize) {
+                EXPECT_EQ(result->width, in->width) << op.name;
+                EXPECT_EQ(result->height, in->height) << op.name;
+            }
+            fs::remove(out);
+        }
+    }
+}
+
+TEST_F(Cli, FormatsAndBatches) {
+    EXPECT_EQ(run("apply sketch " + p("colour.bmp") + " " + p("a.jpg")), 0);
+    EXPECT_EQ(run("apply sketch " + p("colour.png") + " " + p("a.bmp")), 0);
+    std::string error;
+    Owned jpg(pxio::read_image(p("a.jpg"), &error)), bmp(pxio::read_image(p("a.bmp"), &error));
+    ASSERT_TRUE(jpg && bmp);
+    EXPECT_EQ(jpg->width, 37);
+    // BMP output stands upright: it reads back as the PNG path's result.
+    EXPECT_EQ(run("apply sketch " + p("colour.png") + " " + p("a.png")), 0);
+    Owned png(pxio::read_image(p("a.png"), &error));
+    EXPECT_EQ(diff(bmp.get(), png.get()), "");
+
+    EXPECT_EQ(run("apply neon " + p("colour.png") + " " + p("alpha.png") + " -o " + p("batch") + " -j 2"), 0);
+    EXPECT_TRUE(fs::exists(p("batch/colour-neon.png")));
+    EXPECT_TRUE(fs::exists(p("batch/alpha-neon.png")));
+}
+
+TEST_F(Cli, ErrorsExitNonZeroAndLeaveNoOutput) {
+    std::ofstream(p("corrupt.png")) << "\x89PNG\r\n\x1a\n not really";
+    const std::string out = p("never.png");
+    EXPECT_EQ(run("apply no-such-operation " + p("colour.png") + " " + out), 2);
+    EXPECT_EQ(run("apply sketch " + p("missing.png") + " " + out), 1);
+    EXPECT_EQ(run("apply sketch " + p("corrupt.png") + " " + out), 1);
+    EXPECT_EQ(run("apply sketch " + p("colour.png") + " " + p("never.tiff")), 2);
+    EXPECT_EQ(run("apply sketch " + p("colour.png")), 2);
+    EXPECT_EQ(run("apply sketch --no-such-param 3 " + p("colour.png") + " " + out), 2);
+    EXPECT_EQ(run("apply sketch " + p("colour.png") + " " + p("no-dir/x.png")), 1);
+    EXPECT_EQ(run("frobnicate"), 2);
+    EXPECT_EQ(run(""), 2);
+    EXPECT_EQ(run("--help"), 0);
+    EXPECT_EQ(run("apply sketch --help"), 0);
+    EXPECT_EQ(run("list"), 0);
+    for (const auto &entry : fs::directory_iterator(dir)) {
+        const std::string name = entry.path().filename().string();
+        EXPECT_TRUE(name == "colour.png" || name == "alpha.png" || name == "colour.bmp" || name == "corrupt.png")
+            << "left behind: " << name;
+    }
+}
+
+TEST_F(Cli, ParametersAreRangeChecked) {
+    for (const pxop::Operation &op : pxop::operations()) {
+        for (const pxop::Param &prm : op.params) {
+            std::string base = "apply ";
+            base.append(op.name).append(" --").append(prm.name).append(" ");
+            const std::string files = std::string(" ").append(p("colour.png")).append(" ").append(p("r.png"));
+            EXPECT_EQ(run(base + std::to_string(prm.hi + 1) + files), 2) << op.name << " " << prm.name;
+            EXPECT_EQ(run(base + "abc" + files), 2) << op.name << " " << prm.name;
+            EXPECT_FALSE(fs::exists(p("r.png")));
+        }
+    }
+}

@@ -1,0 +1,65 @@
+// The operation table: one entry per exported image operation, with its
+// parameters, the formats it accepts and how to call it. The command-line tool,
+// the gallery and the tests all iterate this table; adding an operation means
+// adding one entry in operations.cpp.
+#pragma once
+
+#include <pxfx/pxfx.h>
+
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace pxop {
+
+// Bit of each pixel format in Operation::formats.
+enum Format : uint32_t { kGray8 = 1u, kWord16 = 2u, kBgr24 = 4u, kBgra32 = 8u };
+inline constexpr uint32_t kColour = kBgr24 | kBgra32;
+inline constexpr uint32_t kAllFormats = kGray8 | kWord16 | kBgr24 | kBgra32;
+
+// The format bit of a bit count (0 for bit counts no operation takes).
+uint32_t format_of(uint32_t bitCount);
+
+struct Param {
+    std::string_view name;
+    bool integer;
+    double lo, hi, def;
+    std::string_view help;
+};
+
+// Parameter values in the order of Operation::params.
+struct Args {
+    std::vector<double> values;
+    int32_t i(size_t k) const { return static_cast<int32_t>(values[k]); }
+    float f(size_t k) const { return static_cast<float>(values[k]); }
+};
+
+struct Operation {
+    std::string_view name;     // command-line name
+    std::string_view function; // the C function behind it
+    std::string_view group;
+    std::string_view summary;
+    std::vector<Param> params;
+    uint32_t formats; // Format bits the operation accepts
+    // Runs on `in` (of an accepted format); returns a new image the caller
+    // releases with free_Image, or null when the operation failed.
+    Image *(*run)(const Image *in, const Args &args);
+    // False for operations whose result has another size than their input.
+    bool sameSize = true;
+};
+
+const std::vector<Operation> &operations();
+const Operation *find_operation(std::string_view name);
+
+// The default arguments of an operation.
+Args default_args(const Operation &op);
+
+// A new copy of `in` in the format the operation takes: the same format when
+// accepted, else 32 or 24 bits for colour operations, 8-bit luma otherwise.
+Image *convert_for(const Operation &op, const Image *in);
+
+// A new copy of `in` at `bitCount` (8-bit copies hold the luma).
+Image *convert_to(const Image *in, uint32_t bitCount);
+
+} // namespace pxop
