@@ -1,0 +1,26 @@
+// Allocation accounting behind PX_malloc, and (in builds configured with
+// PXFX_ALLOCATION_HOOK) failure injection for tests. Internal: not exported
+// from the shared library.
+#pragma once
+
+#include <cstdint>
+
+namespace pxfx::alloc {
+
+// Calls and bytes that PX_malloc has handed out since the last reset.
+struct Stats {
+    uint64_t calls;
+    uint64_t bytes;
+};
+Stats stats();
+void reset_stats();
+
+// True when this build can make allocations fail on purpose.
+bool injection_available();
+
+// Lets the next `n` PX_malloc calls succeed and makes every later one fail,
+// until called again; a negative n turns failures off. No effect without
+// injection_available().
+void fail_after(int64_t n);
+
+} // namespace pxfx::alloc

@@ -1,0 +1,52 @@
+// Failed allocations: every function returns its failure result, leaves its
+// inputs intact and (checked by the leak sanitizer) releases what it made.
+#include <gtest/gtest.h>
+
+#include "support/alloc_failures.hpp"
+#include "support/test_images.hpp"
+
+using namespace pxtest;
+
+TEST(AllocationFailure, ImagesAndFiles) {
+    PXTEST_REQUIRE_ALLOCATION_HOOK();
+    EXPECT_EQ(sweep_allocation_failures([] {
+                  Image *im = malloc_Image(7, 5, 24);
+                  if (im != nullptr) {
+                      EXPECT_EQ(im->bits[0], 255);
+                  }
+                  free_Image(&im, 0);
+              }),
+              2);
+    const std::string path = std::string(PXFX_TEST_DATA_DIR) + "/SOURCES.txt";
+    sweep_allocation_failures([&] {
+        int32_t size = -1;
+        unsigned char *block = PX_ReadMemFile(path.c_str(), &size);
+        EXPECT_GT(size, 0);
+        PX_ReleaseMemFile(block);
+    });
+}
+
+TEST(AllocationFailure, DrawingEffects) {
+    PXTEST_REQUIRE_ALLOCATION_HOOK();
+    Owned src = random_image(9, 7, 32, 1);
+    Owned before = clone(src.get());
+    for (uint32_t effect = 0; effect < 4; ++effect) {
+        sweep_allocation_failures([&] {
+            Slot dst;
+            const uint32_t r = PX_ProcessImage(src.get(), &dst, effect);
+            if (r == 0 && effect == 2) {
+                EXPECT_EQ(dst.get(), nullptr); // photocopy drops its result
+            }
+            if (r == 1) {
+                EXPECT_NE(dst.get(), nullptr);
+            }
+        });
+        EXPECT_EQ(diff(src.get(), before.get()), "");
+    }
+    sweep_allocation_failures([&] {
+        Slot dst;
+        if (PX_IMG_Sketch_1(src.get(), &dst) == 1) {
+            EXPECT_NE(dst.get(), nullptr);
+        }
+    });
+}
