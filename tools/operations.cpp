@@ -1,57 +1,15 @@
 #include "operations.hpp"
 
+#include "operation_groups.hpp"
+#include "operation_kit.hpp"
+
 namespace pxop {
 
 namespace {
 
-// An effect of the shape f(src, &result, ...) -> 1 on success.
-template <class Fn, class... A> Image *effect(Fn fn, const Image *in, A... a) {
-    Image *out = nullptr;
-    if (fn(const_cast<Image *>(in), &out, a...) != 1) {
-        free_Image(&out, 0);
-        return nullptr;
-    }
-    return out;
-}
-
 std::vector<Operation> build_table() {
     std::vector<Operation> t;
-    // Drawing and relief effects.
-    t.push_back({"neon",
-                 "PX_IMG_Neon",
-                 "Drawing",
-                 "Edge glow: doubled gradient magnitude per channel",
-                 {},
-                 kAllFormats,
-                 [](const Image *in, const Args &) { return effect(PX_IMG_Neon, in); }});
-    t.push_back({"emboss",
-                 "PX_IMG_Emboss",
-                 "Drawing",
-                 "Gray relief from the diagonal difference",
-                 {},
-                 kAllFormats,
-                 [](const Image *in, const Args &) { return effect(PX_IMG_Emboss, in); }});
-    t.push_back({"photocopy",
-                 "PX_IMG_Photocopy",
-                 "Drawing",
-                 "Photocopier look by local contrast thresholds",
-                 {},
-                 kAllFormats,
-                 [](const Image *in, const Args &) { return effect(PX_IMG_Photocopy, in); }});
-    t.push_back({"sketch",
-                 "PX_IMG_Sketch",
-                 "Drawing",
-                 "Pencil sketch darkened along edges",
-                 {},
-                 kAllFormats,
-                 [](const Image *in, const Args &) { return effect(PX_IMG_Sketch, in); }});
-    t.push_back({"sketch-soft",
-                 "PX_IMG_Sketch_1",
-                 "Drawing",
-                 "Pencil sketch without the edge lines",
-                 {},
-                 kAllFormats,
-                 [](const Image *in, const Args &) { return effect(PX_IMG_Sketch_1, in); }});
+    add_effects(t);
     return t;
 }
 
@@ -106,5 +64,40 @@ Image *convert_for(const Operation &op, const Image *in) {
     if (op.formats & kGray8) return convert_to(in, 8);
     return convert_to(in, 16);
 }
+
+namespace kit {
+
+PXImage *to_packed(const Image *in) {
+    const uint32_t bytes = in->bitCount / 8;
+    auto *p = static_cast<PXImage *>(PX_malloc(sizeof(PXImage)));
+    if (p == nullptr) return nullptr;
+    const size_t row = static_cast<size_t>(in->width) * bytes;
+    p->width = in->width;
+    p->height = in->height;
+    p->bitcount = static_cast<int32_t>(in->bitCount);
+    p->data = static_cast<uint8_t *>(PX_malloc(row * in->height));
+    if (p->data == nullptr) {
+        PX_free(p);
+        return nullptr;
+    }
+    for (int32_t y = 0; y < in->height; ++y)
+        std::memcpy(p->data + row * y, in->bits + static_cast<size_t>(y) * in->pitch, row);
+    return p;
+}
+
+Image *from_packed(const PXImage *in) {
+    if (in == nullptr || in->data == nullptr || in->width <= 0 || in->height <= 0) return nullptr;
+    Image *out = malloc_Image(in->width, in->height, in->bitcount);
+    if (out == nullptr || out->bitCount != static_cast<uint32_t>(in->bitcount)) {
+        free_Image(&out, 0);
+        return nullptr;
+    }
+    const size_t row = static_cast<size_t>(in->width) * (out->bitCount / 8);
+    for (int32_t y = 0; y < in->height; ++y)
+        std::memcpy(out->bits + static_cast<size_t>(y) * out->pitch, in->data + row * y, row);
+    return out;
+}
+
+} // namespace kit
 
 } // namespace pxop

@@ -1,0 +1,12 @@
+// The entries of the operation table, one function per subsystem (tools/ops_*.cpp).
+#pragma once
+
+#include <vector>
+
+#include "operations.hpp"
+
+namespace pxop {
+
+void add_effects(std::vector<Operation> &table);
+
+} // namespace pxop
