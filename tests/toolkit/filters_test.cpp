@@ -93,16 +93,16 @@ TEST(Smooth, MeanAndMedianMatchSortedWindows) {
 
 TEST(Sort, PartitionExchangeOnAdversarialInputs) {
     const int n = 4000;
-    std::vector<std::vector<int32_t>> inputs(5, std::vector<int32_t>(n));
     std::mt19937 rng(5);
-    for (int i = 0; i < n; ++i) {
-        inputs[0][i] = i;                                     // sorted
-        inputs[1][i] = n - i;                                 // reversed
-        inputs[2][i] = 7;                                     // equal
-        inputs[3][i] = int32_t(rng());                        // random, both signs
-        inputs[4][i] = i % 2 ? INT32_MIN + i : INT32_MAX - i; // organ pipe of extremes
-    }
-    for (auto v : inputs) {
+    for (int kind = 0; kind < 5; ++kind) { // sorted, reversed, equal, random, alternating extremes
+        std::vector<int32_t> v(n);
+        for (int i = 0; i < n; ++i)
+            v[i] = kind == 0   ? i
+                   : kind == 1 ? n - i
+                   : kind == 2 ? 7
+                   : kind == 3 ? int32_t(rng())
+                   : i % 2     ? INT32_MIN + i
+                               : INT32_MAX - i;
         auto want = v;
         std::sort(want.begin(), want.end());
         px_ShellSort(v.data(), 0, n - 1);
@@ -135,21 +135,19 @@ TEST(Binarize, OtsuThresholdPerFormat) {
     ASSERT_EQ(PXImage_GrayToBinarization(twoLevel.get()), 1);
     EXPECT_EQ(bytes(twoLevel.get()), bytes(before.get()));
 
-    for (int bits : {8, 16, 24}) {
-        PX img = px_random(11, 7, bits, 12);
-        const size_t n = 77;
-        std::vector<uint8_t> plane(n);
-        for (size_t i = 0; i < n; ++i)
-            plane[i] = uint8_t(bits == 8    ? img->data[i]
-                               : bits == 24 ? img->data[3 * i + 1]
-                                            : ((img->data[2 * i] | img->data[2 * i + 1] << 8) & 0x7E0) >> 3);
-        const int t = ProbabilityDensityValue(plane.data(), 11, 7);
-        PX want = px_clone(img.get());
-        for (size_t i = 0; i < n; ++i)
-            for (int c = 0; c < (bits == 24 ? 3 : 1); ++c)
-                put_sample(want.get(), int(i / 11), int(i % 11), c, plane[i] > t ? (bits == 16 ? 65535 : 255) : 0);
-        ASSERT_EQ(PXImage_GrayToBinarization(img.get()), 1);
-        EXPECT_EQ(bytes(img.get()), bytes(want.get())) << bits;
+    // Gray levels 40 and 200 among unrelated bits (T = 40): the 16-bit middle field, 24-bit byte 1.
+    PX words = px_random(4, 4, 16, 7), rgb = px_random(4, 4, 24, 7);
+    for (int i = 0; i < 16; ++i) {
+        const int g = i % 2 ? 200 : 40, s = words->data[2 * i] | words->data[2 * i + 1] << 8;
+        put_sample(words.get(), i / 4, i % 4, 0, (s & 0xF81F) | (g >> 2) << 5);
+        rgb->data[3 * i + 1] = uint8_t(g);
+    }
+    ASSERT_EQ(PXImage_GrayToBinarization(words.get()), 1);
+    ASSERT_EQ(PXImage_GrayToBinarization(rgb.get()), 1);
+    for (int i = 0; i < 16; ++i) {
+        EXPECT_EQ(neighbour(words.get(), i / 4, i % 4, 0, 0, 0), i % 2 ? 65535 : 0);
+        for (int c = 0; c < 3; ++c)
+            EXPECT_EQ(rgb->data[3 * i + c], i % 2 ? 255 : 0);
     }
     PX rgba = px_random(3, 3, 32, 1);
     EXPECT_EQ(PXImage_GrayToBinarization(rgba.get()), 0);
@@ -179,69 +177,34 @@ TEST(Clip, PhotoShowsThroughDarkHolesInsideTheWindow) {
     EXPECT_EQ(PXImage_Effect_Clip(nullptr, frame.get()), nullptr);
 }
 
-// Literal grey and blue stretch workers.
-int ref_stretch(std::vector<uint8_t> &p, int w, int h, bool blue) {
-    std::vector<int> H(256);
-    for (uint8_t v : p)
-        ++H[v];
-    const int T = ProbabilityDensityValue(p.data(), w, h);
-    int S = 0;
-    for (int i = 0; i < T; ++i)
-        S += H[i];
-    if (S == 0) return 0;
-    int lo = -1, hi = -1;
-    if (!blue) {
-        for (int i = 0; i < T && lo < 0; ++i)
-            if (double(H[i]) / S > 0.01) lo = i;
-        lo = std::max(lo, 0);
-        for (int i = T - 1; i > lo && hi < 0; --i)
-            if (double(H[i]) / S > 0.01) hi = i;
-        if (hi < 0) return 0;
-    } else {
-        int cum = 0;
-        for (int i = 0; i < T && lo < 0; ++i)
-            if ((cum += H[i]) > 0.01 * S) lo = i;
-        if (lo < 0) return 0;
-        for (int i = lo; i < T && hi < 0; ++i)
-            if ((cum += H[i]) > 0.98 * S) hi = i;
-        if (hi <= lo) return 0;
-    }
-    const double base = blue ? 250.0 : 210.0, span = blue ? 5.0 : 45.0;
-    int table[256];
-    for (int j = 0; j < T; ++j)
-        table[j] = std::clamp(int(double((j - lo) * (hi - lo)) / T), 0, 255);
-    for (int k = 0; k <= 255 - T; ++k)
-        table[T + k] = std::clamp(int(k * span / (256 - T) + base), 0, 255);
-    for (uint8_t &v : p)
-        v = uint8_t(table[v]);
-    return 1;
-}
-
-TEST(Paint, StretchCurvesAndTwoToneResult) {
-    for (uint32_t seed = 1; seed <= 8; ++seed)
-        for (bool blue : {false, true}) {
-            PX img = px_random(13, 9, 8, seed);
-            for (size_t i = 0; i < 117; ++i) // a dark cluster and a spread of brighter levels
-                img->data[i] = uint8_t(i % 3 ? 20 + img->data[i] % (10 * seed) : img->data[i]);
-            std::vector<uint8_t> want = bytes(img.get());
-            const int r = ref_stretch(want, 13, 9, blue);
-            EXPECT_EQ(blue ? EffectPaint_BlueRowData(img->data, 13, 9) : EffectPaint_GrayRowData(img->data, 13, 9), r);
-            EXPECT_EQ(bytes(img.get()), want) << seed << (blue ? " blue" : " grey");
-        }
-    PX rgb = px_random(13, 9, 24, 4);
-    std::vector<uint8_t> g(117);
-    for (size_t i = 0; i < 117; ++i)
-        g[i] = rgb->data[3 * i + 1];
-    ref_stretch(g, 13, 9, false);
+TEST(Paint, TwoToneFromTheStretchedGreenPlane) {
+    PX rgb = px_random(13, 9, 24, 4), orig = px_clone(rgb.get());
     EXPECT_EQ(PXImage_Effect_Paint(rgb.get()), 0);
+    EXPECT_NE(bytes(rgb.get()), bytes(orig.get()));
     for (size_t i = 0; i < 117; ++i) {
-        const int v = g[i];
-        EXPECT_EQ(rgb->data[3 * i], v ? v - 1 : 0);
-        EXPECT_EQ(rgb->data[3 * i + 1], v);
-        EXPECT_EQ(rgb->data[3 * i + 2], std::min(255, v + (v >= 60 && v <= 128 ? 18 : 2)));
+        const uint8_t *p = rgb->data + 3 * i;
+        EXPECT_EQ(p[0], p[1] ? p[1] - 1 : 0);
+        EXPECT_EQ(p[2], std::min(255, p[1] + (p[1] >= 60 && p[1] <= 128 ? 18 : 2)));
     }
-    uint8_t one = 5;
-    EXPECT_EQ(EffectPaint_GrayRowData(&one, 0, 1), 0);
+    // Levels 20, 30, 40, 50 and 200..204: Otsu puts T at 50. Below T the grey worker spreads
+    // lo = 20 .. hi = 40 and the blue one lo = 20 .. hi = 30 (level 20 counted twice).
+    std::vector<uint8_t> plane(64);
+    for (size_t i = 0; i < 64; ++i)
+        plane[i] = uint8_t(i < 32 ? 20 + i % 4 * 10 : 200 + i % 5);
+    auto grey = plane, blue = plane;
+    ASSERT_EQ(ProbabilityDensityValue(plane.data(), 8, 8), 50);
+    ASSERT_EQ(EffectPaint_GrayRowData(grey.data(), 8, 8), 1);
+    ASSERT_EQ(EffectPaint_BlueRowData(blue.data(), 8, 8), 1);
+    for (size_t i = 0; i < 64; ++i) {
+        const int v = plane[i];
+        EXPECT_EQ(grey[i], v < 50 ? (v - 20) * 20 / 50 : int((v - 50) * 45.0 / 206 + 210.0)) << v;
+        EXPECT_EQ(blue[i], v < 50 ? (v - 20) * 10 / 50 : int((v - 50) * 5.0 / 206 + 250.0)) << v;
+    }
+    std::vector<uint8_t> flat(16, 9);
+    EXPECT_EQ(EffectPaint_GrayRowData(flat.data(), 4, 4), 0);
+    EXPECT_EQ(EffectPaint_BlueRowData(flat.data(), 4, 4), 0);
+    EXPECT_EQ(flat, std::vector<uint8_t>(16, 9));
+    EXPECT_EQ(EffectPaint_GrayRowData(flat.data(), 0, 1), 0);
     EXPECT_EQ(EffectPaint_BlueRowData(nullptr, 1, 1), 0);
 }
 
