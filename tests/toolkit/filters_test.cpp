@@ -74,6 +74,8 @@ TEST(Smooth, MeanAndMedianMatchSortedWindows) {
         for (const auto &sz : kSizes)
             for (int strength : {-1, 19, 20, 40, 60, 79, 80, 1000}) {
                 PX src = px_random(sz[0], sz[1], bits, uint32_t(sz[1] * 17 + strength));
+                for (size_t i = 0; strength % 20 == 0 && i < px_size(src.get()); ++i)
+                    src->data[i] &= 0x81; // few levels: windows full of ties
                 const int size = strength < 20 ? 3 : strength < 40 ? 5 : strength < 60 ? 7 : strength < 80 ? 5 : 7;
                 PX want = brute(src.get(), size, 0, [&](std::vector<int> w) {
                     if (strength < 60) return weighted(w, std::vector<int>(w.size(), 1)) / int(w.size());
@@ -85,9 +87,6 @@ TEST(Smooth, MeanAndMedianMatchSortedWindows) {
                     << bits << " bits " << sz[0] << "x" << sz[1] << " strength " << strength;
             }
     PX dot = px_make(9, 9, 8, 10);
-    dot->data[40] = 250;
-    ASSERT_EQ(PXImage_Smooth(dot.get(), 70), 1);
-    EXPECT_EQ(bytes(dot.get()), std::vector<uint8_t>(81, 10));
     EXPECT_EQ(PXImage_Smooth(dot.get(), 0), 0);
 }
 

@@ -48,19 +48,15 @@ TEST(Resize, MatchesInvertedBilinearMappingAtEveryBitCount) {
         }
 }
 
-TEST(Resize, PlaneFunctionsRejectBadArguments) {
-    uint8_t a[16] = {}, b[16] = {};
-    EXPECT_EQ(DualLinearIntepol(nullptr, 4, 4, b, 4, 4), 0);
-    EXPECT_EQ(DualLinearIntepol(a, 4, 4, b, -4, 4), 0);
-    EXPECT_EQ(DualLinearIntepol_KWB(a, 4, 4, b, 0, 4, 1.0f), 0);
-    EXPECT_EQ(DualLinearIntepol_KWB(a, 4, 4, b, 4, 4, 0.0f), 1); // saturated coordinates, no fault
-    PX src = px_random(6, 5, 8, 1);
+TEST(Resize, SingleScaleVariantAndRejections) {
+    PX src = px_random(6, 5, 8, 1), odd = px_random(3, 3, 32, 1);
     std::vector<uint8_t> got(35), want(35);
     ASSERT_EQ(DualLinearIntepol_KWB(src->data, 6, 5, got.data(), 7, 5, 0.7f), 1);
     ref_interp(src->data, 6, 5, 1, want.data(), 7, 5, 1, 0.7f, 0.7f);
     EXPECT_EQ(got, want);
+    EXPECT_EQ(DualLinearIntepol_KWB(src->data, 6, 5, got.data(), 7, 5, 0.0f), 1); // saturated coordinates
+    EXPECT_EQ(DualLinearIntepol(src->data, 6, 5, got.data(), -7, 5), 0);
     EXPECT_EQ(PXImage_Resize(src.get(), 0, 3), nullptr);
-    PX odd = px_random(3, 3, 32, 1);
     EXPECT_EQ(PXImage_Resize(odd.get(), 3, 3), nullptr);
 }
 
