@@ -33,8 +33,24 @@ bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, 
         const float wx = fx - static_cast<float>(x0);
         cols[j] = {clamp_index(x0, srcWidth), clamp_index(int64_t{x0} + 1, srcWidth), wx, 1.0f - wx};
     }
+    // Horizontally interpolated source rows, cached in two slots by row
+    // parity: consecutive output rows mostly reuse one or both.
+    Buffer<float> across = alloc_buffer<float>(2 * static_cast<size_t>(dstWidth));
+    if (!across) return false;
+    int32_t cached[2] = {-1, -1};
     const size_t srcRow = static_cast<size_t>(srcWidth) * srcStride;
     const size_t dstRow = static_cast<size_t>(dstWidth) * dstStride;
+    auto row_across = [&](int32_t y) {
+        float *h = across.get() + static_cast<size_t>(y & 1) * dstWidth;
+        if (cached[y & 1] == y) return static_cast<const float *>(h);
+        const uint8_t *a = src + static_cast<size_t>(y) * srcRow;
+        for (int32_t j = 0; j < dstWidth; ++j) {
+            const Tap &t = cols[j];
+            h[j] = t.omw * static_cast<float>(a[t.i0 * srcStride]) + t.w * static_cast<float>(a[t.i1 * srcStride]);
+        }
+        cached[y & 1] = y;
+        return static_cast<const float *>(h);
+    };
     for (int32_t i = 0; i < dstHeight; ++i) {
         const float fy = static_cast<float>(i) / ry;
         const int32_t y0 = trunc_sat<int32_t>(fy);
@@ -43,17 +59,12 @@ bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, 
         // where the clamp held.
         const float wy = fy - static_cast<float>(Y0);
         const float omwy = 1.0f - wy;
-        const uint8_t *a = src + static_cast<size_t>(Y0) * srcRow;
-        const uint8_t *b = src + static_cast<size_t>(Y1) * srcRow;
+        const float *top = row_across(Y0);
+        const float *bottom = row_across(Y1);
         uint8_t *out = dst + static_cast<size_t>(i) * dstRow;
-        for (int32_t j = 0; j < dstWidth; ++j) {
-            const Tap &t = cols[j];
-            const size_t p0 = static_cast<size_t>(t.i0) * srcStride, p1 = static_cast<size_t>(t.i1) * srcStride;
-            const float top = t.omw * static_cast<float>(a[p0]) + t.w * static_cast<float>(a[p1]);
-            const float bottom = t.omw * static_cast<float>(b[p0]) + t.w * static_cast<float>(b[p1]);
-            const float v = omwy * top + wy * bottom;
-            out[static_cast<size_t>(j) * dstStride] = static_cast<uint8_t>(trunc_sat<uint32_t>(v));
-        }
+        for (int32_t j = 0; j < dstWidth; ++j)
+            out[static_cast<size_t>(j) * dstStride] =
+                static_cast<uint8_t>(trunc_sat<uint32_t>(omwy * top[j] + wy * bottom[j]));
     }
     return true;
 }
