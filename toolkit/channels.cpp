@@ -5,6 +5,7 @@
 #include "toolkit/pximage_check.hpp"
 
 using namespace pxfx;
+using namespace pxfx::packed;
 
 extern "C" {
 

@@ -6,6 +6,7 @@
 #include "toolkit/pximage_check.hpp"
 
 using namespace pxfx;
+using namespace pxfx::packed;
 
 namespace {
 

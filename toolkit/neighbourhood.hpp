@@ -5,12 +5,13 @@
 
 #include <pxfx/toolkit.h>
 
+#include <cstddef>
 #include <cstdint>
 
 #include "core/internal/memory.hpp"
 #include "toolkit/pximage_check.hpp"
 
-namespace pxfx {
+namespace pxfx::packed {
 
 // Samples of a format: bytes for 8 bits (one per pixel) and 24 bits (three),
 // little-endian words for 16 bits.
@@ -171,4 +172,4 @@ void box_row(const T *const *rows, int32_t size, int32_t channels, size_t n, int
     }
 }
 
-} // namespace pxfx
+} // namespace pxfx::packed

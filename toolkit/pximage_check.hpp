@@ -12,7 +12,7 @@
 
 #include "core/internal/image_check.hpp"
 
-namespace pxfx {
+namespace pxfx::packed {
 
 // Bytes per pixel of a bit count the toolkit stores (8, 16, 24, 32), else 0.
 constexpr int32_t px_bytes(int32_t bitcount) {
@@ -82,4 +82,4 @@ inline void store16(uint8_t *p, uint32_t v) {
     p[1] = static_cast<uint8_t>(v >> 8);
 }
 
-} // namespace pxfx
+} // namespace pxfx::packed

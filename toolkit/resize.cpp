@@ -9,8 +9,9 @@
 #include "toolkit/resize_internal.hpp"
 
 using namespace pxfx;
+using namespace pxfx::packed;
 
-namespace pxfx {
+namespace pxfx::packed {
 
 namespace {
 
@@ -69,7 +70,7 @@ bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, 
     return true;
 }
 
-} // namespace pxfx
+} // namespace pxfx::packed
 
 namespace {
 

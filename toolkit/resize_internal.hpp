@@ -5,7 +5,7 @@
 #include <cstddef>
 #include <cstdint>
 
-namespace pxfx {
+namespace pxfx::packed {
 
 // Interpolates a srcWidth x srcHeight plane into dstWidth x dstHeight. Sample
 // (row, column) of the source is src[(row * srcWidth + column) * srcStride],
@@ -14,4 +14,4 @@ namespace pxfx {
 bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
                        int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx);
 
-} // namespace pxfx
+} // namespace pxfx::packed

@@ -11,6 +11,7 @@
 #include "toolkit/resize_internal.hpp"
 
 using namespace pxfx;
+using namespace pxfx::packed;
 
 namespace {
 
