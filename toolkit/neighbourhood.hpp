@@ -56,7 +56,7 @@ template <class F> class Window {
     Window(const PXImage *img, int32_t size)
         : img_(img), size_(size), half_(size / 2),
           padded_((static_cast<size_t>(img->width) + 2 * static_cast<size_t>(half_)) * C),
-          ring_(alloc_buffer<T>(padded_ * static_cast<size_t>(size))) {}
+          ring_(alloc_buffer<T>(checked_size(padded_, static_cast<uint64_t>(size)))) {}
 
     bool ok() const { return static_cast<bool>(ring_); }
     // Samples per output row (width x channels).
