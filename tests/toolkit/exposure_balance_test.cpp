@@ -80,11 +80,11 @@ TEST(Otsu, ThresholdsOfKnownHistograms) {
         return p;
     };
     const auto halves = plane({{50, 8}, {200, 8}}), quarter = plane({{10, 4}, {100, 12}});
-    const auto ends = plane({{0, 5}, {255, 11}}), top = plane({{100, 8}, {255, 8}});
+    const auto ends = plane({{0, 5}, {255, 11}}), top = plane({{10, 4}, {240, 4}, {255, 8}});
     EXPECT_EQ(ProbabilityDensityValue(halves.data(), 4, 4), 50);
     EXPECT_EQ(ProbabilityDensityValue(quarter.data(), 8, 2), 10);
     EXPECT_EQ(ProbabilityDensityValue(ends.data(), 16, 1), 120);
-    EXPECT_EQ(ProbabilityDensityValue(top.data(), 4, 4), 100); // level 255 is left out of the upper mean
+    EXPECT_EQ(ProbabilityDensityValue(top.data(), 4, 4), 240); // level 255 is left out of the upper mean
     EXPECT_EQ(ProbabilityDensityValue(nullptr, 4, 4), 120);
     EXPECT_EQ(ProbabilityDensityValue(halves.data(), 0, 4), 120);
 }
