@@ -34,74 +34,140 @@ typedef struct PXRect {
 
 /* ---- Record and geometry ---------------------------------------------------------- */
 
+/*
+ * Records taken as input must have non-null data, positive width and height,
+ * and a pixel block (width x height x bytes per pixel) of at most 2^31 - 1
+ * bytes; other records get the function's failure result.
+ */
+
 /* Releases the data and the record; null is ignored. */
 PXFX_API void PXImage_Free(PXImage *img);
-/* Bilinear resize to newWidth x newHeight (8-bit stays 8, 16 and 24 give 24); null on failure. */
+/* Bilinear resize to newWidth x newHeight (8-bit stays 8, 16 and 24 give 24); null on failure.
+ * Sizes are mapped as in DualLinearIntepol. A 16-bit source is read as three-byte pixels; the
+ * bytes that stride puts past the end of its block read as 0. Null also when a new size is not
+ * positive or the result or its working memory cannot be allocated. */
 PXFX_API PXImage *PXImage_Resize(const PXImage *src, int32_t newWidth, int32_t newHeight);
-/* Bilinear interpolation of one 8-bit plane (source coordinate i * dst / src). 1 or 0. */
+/* Bilinear interpolation of one 8-bit plane (source coordinate i * dst / src). 1 or 0.
+ * Single precision throughout. Float to integer conversions truncate and saturate (NaN gives 0,
+ * values past the range give its limit), so no argument makes them undefined. 0 for null planes,
+ * sizes that are not positive, or planes above 2^31 - 1 bytes. */
 PXFX_API int32_t DualLinearIntepol(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, uint8_t *dst,
                                    int32_t dstWidth, int32_t dstHeight);
-/* The same interpolation with one scale for both axes (coordinate i / scale). 1 or 0. */
+/* The same interpolation with one scale for both axes (coordinate i / scale). 1 or 0.
+ * Any scale is accepted (zero, negative or NaN scales give saturated or NaN coordinates, held
+ * to the plane by the clamps). */
 PXFX_API int32_t DualLinearIntepol_KWB(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, uint8_t *dst,
                                        int32_t dstWidth, int32_t dstHeight, float scale);
-/* Copy of a bottom-up rectangle, width rounded up to 8 columns; null on failure. */
+/* Copy of a bottom-up rectangle, width rounded up to 8 columns; null on failure.
+ * Coordinates are clamped to the picture; each result row is a copy of width pixels from the
+ * left column, running on into the next source row past the row end; bytes that would come
+ * from beyond the source block are 0. Null when the clamped rectangle is empty (right < left
+ * or top < bottom), for bit counts other than 8, 16 and 24, or when allocation fails. */
 PXFX_API PXImage *PXImage_Crop(const PXImage *src, const PXRect *rect);
-/* Quarter turn, result width rounded up to 8 columns; null on failure. */
+/* Quarter turn, result width rounded up to 8 columns; null on failure.
+ * Result pixel (i, j) is source row j, column width - 1 - i; the padding columns (height and
+ * beyond) are cleared to 0. 8, 16 and 24 bits only. */
 PXFX_API PXImage *PXImage_Rotate90(const PXImage *src);
-/* Half turn; null on failure. */
+/* Half turn; null on failure. 8, 16 and 24 bits only. */
 PXFX_API PXImage *PXImage_Rotate180(const PXImage *src);
-/* Three-quarter turn, result width rounded up to 8 columns; null on failure. */
+/* Three-quarter turn, result width rounded up to 8 columns; null on failure.
+ * Result pixel (i, j) is source row height - 1 - j, column i; the padding columns are cleared
+ * to 0. 8, 16 and 24 bits only. */
 PXFX_API PXImage *PXImage_Rotate270(const PXImage *src);
-/* 2x enlargement with rounded averages; null on failure. */
+/* 2x enlargement with rounded averages; null on failure.
+ * 24-bit images average each byte, 16-bit images whole little-endian samples. */
 PXFX_API PXImage *PXImage_ZoomIn(const PXImage *src);
-/* 2x reduction by decimation, width rounded up to 8 columns; null on failure. */
+/* 2x reduction by decimation, width rounded up to 8 columns; null on failure.
+ * Every result column x takes source column 2x held at the last column, the rounded-up ones
+ * included. Null for pictures narrower or lower than 2 pixels (an empty result). */
 PXFX_API PXImage *PXImage_ZoomOut(const PXImage *src);
-/* Scales a rectangle of a 32-bit image into another 32-bit image at (x, y). 1 or 0. */
+/* Scales a rectangle of a 32-bit image into another 32-bit image at (x, y). 1 or 0.
+ * Byte plane by byte plane, source rows from (int)(y / scale + 0.5), column x, are gathered
+ * w' = (int)(rect width / scale + 0.5) bytes a row into a plane read as source width x source
+ * height and interpolated to the rectangle's size. Gathered positions outside the source block,
+ * and plane bytes the gather does not reach, read as 0; target rows run on into the next row past
+ * the row end, and pixels past the target block are not written. 0 also for a rectangle
+ * with non-positive width or height, a non-finite or negative scale, or w' or h' outside
+ * 1 .. 2^31 - 1. */
 PXFX_API int32_t PXImage_ROI_Zoom(const PXImage *src, PXImage *dst, const PXRect *rect, double scale, int32_t x,
                                   int32_t y);
-/* 1 when two 8-, 24- or 32-bit images differ by at most half a level on average. */
+/* 1 when two 8-, 24- or 32-bit images differ by at most half a level on average.
+ * The absolute differences are summed modulo 2^32. 16-bit images always give 0. */
 PXFX_API int32_t PXImage_IsSameImage(const PXImage *a, const PXImage *b);
 /* 1 when the point lies strictly inside the rectangle. */
 PXFX_API int32_t px_PtInRect(const PXPoint *pt, const PXRect *rect);
-/* Floor of the square root of n (0 <= n < 2^31). */
+/* Floor of the square root of n (0 <= n < 2^31); 0 for negative n. */
 PXFX_API int32_t px_sqrt(int32_t n);
 /* Stamping is not carried out; always 0. */
 PXFX_API int32_t PXImage_Stamp(PXImage *img, const PXRect *rect, const PXPoint *pt);
 
 /* ---- Exposure and white balance --------------------------------------------------- */
 
-/* Percentile stretch with a 0.4 power curve, in place; 0 for bright or rejected images. */
+/* Percentile stretch with a 0.4 power curve, in place; 0 for bright or rejected images.
+ * 8-bit: 0 (unchanged) when the 0.5 % point is at 201 or above. 24-bit: such channels are left
+ * alone, the others corrected, result 1. 16-bit: wrapping 16-bit counters, percentile levels
+ * kept modulo 256, samples of 256 and above become 0; when the kept levels coincide the curve is
+ * 0 at that level and 65535 elsewhere (infinite powers saturate). Other bit counts give 0. */
 PXFX_API int32_t PXImage_AutoExposure(PXImage *img);
 /* As PXImage_AutoExposure with a fixed 0.4 power curve for 8-bit images. */
 PXFX_API int32_t PXImage_AutoExposure_1(PXImage *img);
-/* White balance against the colour around a picked point, in place. 1 or 0. */
+/* White balance against the colour around a picked point, in place. 1 or 0.
+ * The 3 x 3 reference walk stops after three columns in each row, so points at or right of the
+ * last column read that column repeatedly instead of never ending. 8-bit images take their
+ * reference bytes at row * width + column * 3 + 1; such bytes beyond the block read as 0. No
+ * working memory is kept for 8-bit images. 0 for a null point or bit counts other than 8, 24. */
 PXFX_API int32_t PXImage_AutoWhiteBalance(PXImage *img, const PXPoint *pt);
-/* Otsu threshold 0..254 of an 8-bit plane, or 120 for degenerate planes. */
+/* Otsu threshold 0..254 of an 8-bit plane, or 120 for degenerate planes.
+ * 120 also for a null plane or sizes that are not positive; scores that are not finite count
+ * as saturated integers. */
 PXFX_API int32_t ProbabilityDensityValue(const uint8_t *plane, int32_t width, int32_t height);
 /* Inverts every byte of a 24-bit image (8 and 16 bits unchanged). 1 or 0. */
 PXFX_API int32_t PXImage_BlueEnhancement(PXImage *img);
-/* Copies byte 1 of every 24- or 32-bit pixel into bytes 0, 1 and 2. 1 or 0. */
+/* Copies byte 1 of every 24- or 32-bit pixel into bytes 0, 1 and 2. 1 or 0.
+ * Byte 3 of a 32-bit pixel keeps its value. */
 PXFX_API int32_t PXImage_GreenChannel(PXImage *img);
 
 /* ---- Neighbourhood filters and binarisation ---------------------------------------- */
 
-/* Sharpens in place with a 3x3, 5x5 or 7x7 kernel chosen by strength (1..100). 1 or 0. */
+/*
+ * The neighbourhood filters clamp rows and columns to the picture; 24-bit images clamp the byte
+ * index 3 (x + dx) to the row and read three bytes from there, so right of the picture they read
+ * the row's last byte and the next row's first two; on the last row those two read as 0.
+ * Results are computed from the unchanged source and written in place.
+ */
+
+/* Sharpens in place with a 3x3, 5x5 or 7x7 kernel chosen by strength (1..100). 1 or 0.
+ * Below 40 (negative included): 3x3; 40..79: 5x5; 80..100: 7x7, whose rows start at source row
+ * 49: result row r holds filtered source row r + 49 and the last 49 rows (all rows of pictures
+ * up to 49 rows high) keep their content. Strengths above 100 return 1, image unchanged.
+ * 16-bit images are filtered as whole samples clamped to 0..65535; other bit counts return 1
+ * unchanged; 0 for strength 0 or when working memory is missing. */
 PXFX_API int32_t PXImage_Sharpen(PXImage *img, int32_t strength);
-/* Mean or median smoothing in place, chosen by strength. 1 or 0. */
+/* Mean or median smoothing in place, chosen by strength. 1 or 0.
+ * Below 20 (negative included): 3x3 mean; 20..39: 5x5 mean; 40..59: 7x7 mean; 60..79: 5x5
+ * median; 80 and above: 7x7 median (element size^2 / 2 of the sorted window). */
 PXFX_API int32_t PXImage_Smooth(PXImage *img, int32_t strength);
-/* Sorts values[first..last] ascending in place (partition exchange). */
+/* Sorts values[first..last] ascending in place (partition exchange).
+ * The pivot is values[first]; the shorter side of each partition is sorted by recursion and the
+ * longer one by iteration, so the stack depth stays logarithmic for any input. */
 PXFX_API void px_ShellSort(int32_t *values, int32_t first, int32_t last);
-/* 3x3 edge kernel, sum shifted right by 2, in place. 1 or 0. */
+/* 3x3 edge kernel, sum shifted right by 2, in place. 1 or 0.
+ * Other bit counts than 8, 16 and 24 return 1 unchanged. */
 PXFX_API int32_t PXImage_EdgeDetection(PXImage *img);
 /* Otsu binarisation in place. 1 or 0. */
 PXFX_API int32_t PXImage_GrayToBinarization(PXImage *img);
-/* New 24-bit copy of the frame with the photo shown through its dark window; null on failure. */
+/* New 24-bit copy of the frame with the photo shown through its dark window; null on failure.
+ * The frame must be a 24-bit image of at least 718 x 564 pixels, else null. Window position
+ * (r, c) takes photo pixel r * photo width + c (running on into the next photo row); positions
+ * whose photo pixel lies past the photo's block keep the frame pixel. */
 PXFX_API PXImage *PXImage_Effect_Clip(const PXImage *photo, const PXImage *frame);
-/* Two-tone paint effect in place; always 0. */
+/* Two-tone paint effect in place; always 0.
+ * Only the stretched byte-1 plane shapes the result, so only that plane is built; when it cannot
+ * be allocated the image is left unchanged. */
 PXFX_API int32_t PXImage_Effect_Paint(PXImage *img);
-/* Contrast stretch of a gray plane in place; 1 if changed. */
+/* Contrast stretch of a gray plane in place; 1 if changed. 0 for sizes that are not positive. */
 PXFX_API int32_t EffectPaint_GrayRowData(uint8_t *plane, int32_t width, int32_t height);
-/* Contrast stretch of a blue plane in place; 1 if changed. */
+/* Contrast stretch of a blue plane in place; 1 if changed. 0 for sizes that are not positive. */
 PXFX_API int32_t EffectPaint_BlueRowData(uint8_t *plane, int32_t width, int32_t height);
 
 /* ---- Curve-table colour filters ------------------------------------------------------- */

@@ -1,0 +1,209 @@
+// Sharpening, smoothing, edges, binarisation, the sort and the two effects
+// against brute-force versions on awkward sizes of every supported format.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cmath>
+
+#include "toolkit/px_images.hpp"
+
+using namespace pxtest;
+
+namespace {
+
+const int kSizes[][2] = {{1, 1}, {1, 9}, {9, 1}, {2, 3}, {8, 8}, {13, 7}, {6, 60}};
+
+std::vector<int> sharpen_kernel(int strength) {
+    if (strength < 40) return {0, -1, 0, -1, 5, -1, 0, -1, 0};
+    if (strength < 80) return {0, -1, -1, -1, 0, -1, 0, 1, 0, -1, -1, 1, 9, 1, -1, -1, 0, 1, 0, -1, 0, -1, -1, -1, 0};
+    std::vector<int> k(49, -1);
+    k[24] = 49;
+    return k;
+}
+
+// Applies `value(window samples in kernel order)` at every output position
+// from source row `first`, into row y - first; other rows keep their bytes.
+template <class Fn> PX brute(const PXImage *src, int size, int first, Fn value) {
+    PX out = px_clone(src);
+    const int ch = src->bitcount == 24 ? 3 : 1, half = size / 2;
+    for (int y = first; y < src->height; ++y)
+        for (int x = 0; x < src->width; ++x)
+            for (int c = 0; c < ch; ++c) {
+                std::vector<int> win;
+                for (int dy = -half; dy <= half; ++dy)
+                    for (int dx = -half; dx <= half; ++dx)
+                        win.push_back(neighbour(src, y, x, dy, dx, c));
+                put_sample(out.get(), y - first, x, c, value(win));
+            }
+    return out;
+}
+
+int limit(const PXImage *im, int v) { return std::clamp(v, 0, im->bitcount == 16 ? 65535 : 255); }
+
+int weighted(const std::vector<int> &win, const std::vector<int> &k) {
+    int s = 0;
+    for (size_t i = 0; i < win.size(); ++i)
+        s += k[i] * win[i];
+    return s;
+}
+
+TEST(Sharpen, KernelChosenByStrengthWithLateStartForTheLargest) {
+    for (int bits : {8, 16, 24})
+        for (const auto &sz : kSizes)
+            for (int strength : {-3, 39, 40, 79, 80, 100}) {
+                PX src = px_random(sz[0], sz[1], bits, uint32_t(sz[0] * 31 + strength));
+                const auto k = sharpen_kernel(strength);
+                const int size = int(std::sqrt(double(k.size())));
+                PX want = brute(src.get(), size, size == 7 ? 49 : 0,
+                                [&](const std::vector<int> &w) { return limit(src.get(), weighted(w, k)); });
+                ASSERT_EQ(PXImage_Sharpen(src.get(), strength), 1);
+                EXPECT_EQ(bytes(src.get()), bytes(want.get()))
+                    << bits << " bits " << sz[0] << "x" << sz[1] << " strength " << strength;
+            }
+    PX img = px_random(5, 5, 8, 1), orig = px_clone(img.get());
+    EXPECT_EQ(PXImage_Sharpen(img.get(), 0), 0);
+    EXPECT_EQ(PXImage_Sharpen(img.get(), INT32_MAX), 1);
+    EXPECT_EQ(bytes(img.get()), bytes(orig.get()));
+    PX rgba = px_random(5, 5, 32, 1);
+    EXPECT_EQ(PXImage_Sharpen(rgba.get(), 50), 1);
+}
+
+TEST(Smooth, MeanAndMedianMatchSortedWindows) {
+    for (int bits : {8, 16, 24})
+        for (const auto &sz : kSizes)
+            for (int strength : {-1, 19, 20, 40, 60, 79, 80, 1000}) {
+                PX src = px_random(sz[0], sz[1], bits, uint32_t(sz[1] * 17 + strength));
+                for (size_t i = 0; strength % 20 == 0 && i < px_size(src.get()); ++i)
+                    src->data[i] &= 0x81; // few levels: windows full of ties
+                const int size = strength < 20 ? 3 : strength < 40 ? 5 : strength < 60 ? 7 : strength < 80 ? 5 : 7;
+                PX want = brute(src.get(), size, 0, [&](std::vector<int> w) {
+                    if (strength < 60) return weighted(w, std::vector<int>(w.size(), 1)) / int(w.size());
+                    std::sort(w.begin(), w.end());
+                    return w[w.size() / 2];
+                });
+                ASSERT_EQ(PXImage_Smooth(src.get(), strength), 1);
+                EXPECT_EQ(bytes(src.get()), bytes(want.get()))
+                    << bits << " bits " << sz[0] << "x" << sz[1] << " strength " << strength;
+            }
+    PX dot = px_make(9, 9, 8, 10);
+    EXPECT_EQ(PXImage_Smooth(dot.get(), 0), 0);
+}
+
+TEST(Sort, PartitionExchangeOnAdversarialInputs) {
+    const int n = 4000;
+    std::mt19937 rng(5);
+    for (int kind = 0; kind < 5; ++kind) { // sorted, reversed, equal, random, alternating extremes
+        std::vector<int32_t> v(n);
+        for (int i = 0; i < n; ++i)
+            v[i] = kind == 0   ? i
+                   : kind == 1 ? n - i
+                   : kind == 2 ? 7
+                   : kind == 3 ? int32_t(rng())
+                   : i % 2     ? INT32_MIN + i
+                               : INT32_MAX - i;
+        auto want = v;
+        std::sort(want.begin(), want.end());
+        px_ShellSort(v.data(), 0, n - 1);
+        EXPECT_EQ(v, want);
+    }
+    std::vector<int32_t> part = {5, 4, 3, 2, 1, 0};
+    px_ShellSort(part.data(), 1, 4);
+    EXPECT_EQ(part, (std::vector<int32_t>{5, 1, 2, 3, 4, 0}));
+    px_ShellSort(nullptr, 0, 5);
+}
+
+TEST(Edges, LopsidedKernelShiftedByTwo) {
+    const std::vector<int> k = {1, 0, -1, 2, 0, -2, 1, 1, -1};
+    for (int bits : {8, 16, 24})
+        for (const auto &sz : kSizes) {
+            PX src = px_random(sz[0], sz[1], bits, uint32_t(bits + sz[0]));
+            PX want = brute(src.get(), 3, 0,
+                            [&](const std::vector<int> &w) { return limit(src.get(), weighted(w, k) >> 2); });
+            ASSERT_EQ(PXImage_EdgeDetection(src.get()), 1);
+            EXPECT_EQ(bytes(src.get()), bytes(want.get())) << bits << " bits " << sz[0] << "x" << sz[1];
+        }
+    EXPECT_EQ(PXImage_EdgeDetection(nullptr), 0);
+}
+
+TEST(Binarize, OtsuThresholdPerFormat) {
+    PX twoLevel = px_random(8, 8, 8, 3);
+    for (size_t i = 0; i < 64; ++i)
+        twoLevel->data[i] = twoLevel->data[i] & 1 ? 255 : 0;
+    PX before = px_clone(twoLevel.get());
+    ASSERT_EQ(PXImage_GrayToBinarization(twoLevel.get()), 1);
+    EXPECT_EQ(bytes(twoLevel.get()), bytes(before.get()));
+
+    // Gray levels 40 and 200 among unrelated bits (T = 40): the 16-bit middle field, 24-bit byte 1.
+    PX words = px_random(4, 4, 16, 7), rgb = px_random(4, 4, 24, 7);
+    for (int i = 0; i < 16; ++i) {
+        const int g = i % 2 ? 200 : 40, s = words->data[2 * i] | words->data[2 * i + 1] << 8;
+        put_sample(words.get(), i / 4, i % 4, 0, (s & 0xF81F) | (g >> 2) << 5);
+        rgb->data[3 * i + 1] = uint8_t(g);
+    }
+    ASSERT_EQ(PXImage_GrayToBinarization(words.get()), 1);
+    ASSERT_EQ(PXImage_GrayToBinarization(rgb.get()), 1);
+    for (int i = 0; i < 16; ++i) {
+        EXPECT_EQ(neighbour(words.get(), i / 4, i % 4, 0, 0, 0), i % 2 ? 65535 : 0);
+        for (int c = 0; c < 3; ++c)
+            EXPECT_EQ(rgb->data[3 * i + c], i % 2 ? 255 : 0);
+    }
+    PX rgba = px_random(3, 3, 32, 1);
+    EXPECT_EQ(PXImage_GrayToBinarization(rgba.get()), 0);
+}
+
+TEST(Clip, PhotoShowsThroughDarkHolesInsideTheWindow) {
+    PX frame = px_random(720, 566, 24, 4);
+    for (size_t i = 2; i < px_size(frame.get()); i += 3)
+        if (frame->data[i] < 40) frame->data[i] = uint8_t(frame->data[i] % 7); // some holes
+    for (int bits : {8, 24}) {
+        PX photo = px_random(700, 300, bits, 6); // shorter than the window
+        PX out(PXImage_Effect_Clip(photo.get(), frame.get()));
+        ASSERT_TRUE(out);
+        const int pb = bits / 8;
+        for (int y = 0; y < 566; ++y)
+            for (int x = 0; x < 720; ++x) {
+                const uint8_t *f = frame->data + (y * 720 + x) * 3, *o = out->data + (y * 720 + x) * 3;
+                const size_t p = size_t(y - 50) * 700 + (x - 40);
+                const bool shown = y >= 50 && y < 564 && x >= 40 && x < 718 && f[2] < 7 && p < 700 * 300;
+                for (int c = 0; c < 3; ++c)
+                    ASSERT_EQ(o[c], shown ? photo->data[p * pb + (pb == 3 ? c : 0)] : f[c]) << x << "," << y;
+            }
+    }
+    PX small = px_random(717, 564, 24, 1), photo = px_random(10, 10, 24, 1);
+    EXPECT_EQ(PXImage_Effect_Clip(photo.get(), small.get()), nullptr);
+    EXPECT_EQ(PXImage_Effect_Clip(photo.get(), nullptr), nullptr);
+    EXPECT_EQ(PXImage_Effect_Clip(nullptr, frame.get()), nullptr);
+}
+
+TEST(Paint, TwoToneFromTheStretchedGreenPlane) {
+    PX rgb = px_random(13, 9, 24, 4), orig = px_clone(rgb.get());
+    EXPECT_EQ(PXImage_Effect_Paint(rgb.get()), 0);
+    EXPECT_NE(bytes(rgb.get()), bytes(orig.get()));
+    for (size_t i = 0; i < 117; ++i) {
+        const uint8_t *p = rgb->data + 3 * i;
+        EXPECT_EQ(p[0], p[1] ? p[1] - 1 : 0);
+        EXPECT_EQ(p[2], std::min(255, p[1] + (p[1] >= 60 && p[1] <= 128 ? 18 : 2)));
+    }
+    // Levels 20, 30, 40, 50 and 200..204: Otsu puts T at 50. Below T the grey worker spreads
+    // lo = 20 .. hi = 40 and the blue one lo = 20 .. hi = 30 (level 20 counted twice).
+    std::vector<uint8_t> plane(64);
+    for (size_t i = 0; i < 64; ++i)
+        plane[i] = uint8_t(i < 32 ? 20 + i % 4 * 10 : 200 + i % 5);
+    auto grey = plane, blue = plane;
+    ASSERT_EQ(ProbabilityDensityValue(plane.data(), 8, 8), 50);
+    ASSERT_EQ(EffectPaint_GrayRowData(grey.data(), 8, 8), 1);
+    ASSERT_EQ(EffectPaint_BlueRowData(blue.data(), 8, 8), 1);
+    for (size_t i = 0; i < 64; ++i) {
+        const int v = plane[i];
+        EXPECT_EQ(grey[i], v < 50 ? (v - 20) * 20 / 50 : int((v - 50) * 45.0 / 206 + 210.0)) << v;
+        EXPECT_EQ(blue[i], v < 50 ? (v - 20) * 10 / 50 : int((v - 50) * 5.0 / 206 + 250.0)) << v;
+    }
+    std::vector<uint8_t> flat(16, 9);
+    EXPECT_EQ(EffectPaint_GrayRowData(flat.data(), 4, 4), 0);
+    EXPECT_EQ(EffectPaint_BlueRowData(flat.data(), 4, 4), 0);
+    EXPECT_EQ(flat, std::vector<uint8_t>(16, 9));
+    EXPECT_EQ(EffectPaint_GrayRowData(flat.data(), 0, 1), 0);
+    EXPECT_EQ(EffectPaint_BlueRowData(nullptr, 1, 1), 0);
+}
+
+} // namespace

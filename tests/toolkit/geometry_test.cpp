@@ -1,0 +1,187 @@
+// Resize, crop, rotations, zooms and the small record helpers against
+// straightforward per-pixel versions.
+#include <gtest/gtest.h>
+
+#include <cmath>
+
+#include "toolkit/px_images.hpp"
+
+using namespace pxtest;
+
+namespace {
+
+void ref_interp(const uint8_t *s, int sw, int sh, size_t ss, uint8_t *d, int dw, int dh, size_t ds, float ry,
+                float rx) {
+    for (int i = 0; i < dh; ++i) {
+        const float fy = i / ry;
+        const int y0 = int(fy), Y0 = clampi(y0, sh), Y1 = clampi(y0 + 1, sh);
+        const float wy = fy - Y0;
+        for (int j = 0; j < dw; ++j) {
+            const float fx = j / rx;
+            const int x0 = int(fx), X0 = clampi(x0, sw), X1 = clampi(x0 + 1, sw);
+            const float wx = fx - x0;
+            auto at = [&](int y, int x) { return s[(size_t(y) * sw + x) * ss]; };
+            const float v =
+                (1 - wy) * ((1 - wx) * at(Y0, X0) + wx * at(Y0, X1)) + wy * ((1 - wx) * at(Y1, X0) + wx * at(Y1, X1));
+            d[(size_t(i) * dw + j) * ds] = uint8_t(v < 0 ? 0u : unsigned(v));
+        }
+    }
+}
+
+TEST(Resize, MatchesInvertedBilinearMappingAtEveryBitCount) {
+    const int sizes[][4] = {{1, 1, 3, 2}, {7, 5, 3, 9}, {13, 11, 26, 22}, {5, 1, 1, 5}, {9, 9, 4, 4}, {4, 4, 8, 8}};
+    for (int bits : {8, 16, 24})
+        for (const auto &s : sizes) {
+            PX src = px_random(s[0], s[1], bits, 7u + bits);
+            PX out(PXImage_Resize(src.get(), s[2], s[3]));
+            ASSERT_TRUE(out);
+            ASSERT_EQ(out->bitcount, bits == 8 ? 8 : 24);
+            const float ry = float(s[1]) / float(s[3]), rx = float(s[0]) / float(s[2]);
+            const int ch = bits == 8 ? 1 : 3;
+            // 16-bit sources are read with a three-byte stride, zero past the block.
+            std::vector<uint8_t> packed(size_t(s[0]) * s[1] * ch, 0);
+            std::memcpy(packed.data(), src->data, std::min(packed.size(), px_size(src.get())));
+            std::vector<uint8_t> want(size_t(s[2]) * s[3] * ch);
+            for (int c = 0; c < ch; ++c)
+                ref_interp(packed.data() + c, s[0], s[1], ch, want.data() + c, s[2], s[3], ch, ry, rx);
+            EXPECT_EQ(bytes(out.get()), want) << bits << " bits " << s[0] << "x" << s[1];
+        }
+}
+
+TEST(Resize, SingleScaleVariantAndRejections) {
+    PX src = px_random(6, 5, 8, 1), odd = px_random(3, 3, 32, 1);
+    std::vector<uint8_t> got(35), want(35);
+    ASSERT_EQ(DualLinearIntepol_KWB(src->data, 6, 5, got.data(), 7, 5, 0.7f), 1);
+    ref_interp(src->data, 6, 5, 1, want.data(), 7, 5, 1, 0.7f, 0.7f);
+    EXPECT_EQ(got, want);
+    EXPECT_EQ(DualLinearIntepol_KWB(src->data, 6, 5, got.data(), 7, 5, 0.0f), 1); // saturated coordinates
+    EXPECT_EQ(DualLinearIntepol(src->data, 6, 5, got.data(), -7, 5), 0);
+    EXPECT_EQ(PXImage_Resize(src.get(), 0, 3), nullptr);
+    EXPECT_EQ(PXImage_Resize(odd.get(), 3, 3), nullptr);
+}
+
+TEST(Crop, RoundsWidthUpAndRunsIntoFollowingRows) {
+    PX src = px_random(20, 6, 8, 5);
+    PXRect r{6, 5, 14, 1}; // nine columns, rows 1..5, copies run past the row end
+    PX out(PXImage_Crop(src.get(), &r));
+    ASSERT_TRUE(out);
+    EXPECT_EQ(out->width, 16);
+    EXPECT_EQ(out->height, 5);
+    for (int k = 0; k < 5; ++k)
+        for (int j = 0; j < 16; ++j) {
+            const size_t from = size_t(1 + k) * 20 + 6 + j;
+            EXPECT_EQ(out->data[k * 16 + j], from < 120 ? src->data[from] : 0) << k << "," << j;
+        }
+    PXRect wide{-5, 99, 99, -3};
+    PX all(PXImage_Crop(src.get(), &wide));
+    EXPECT_EQ(all->width, 20);
+    EXPECT_EQ(bytes(all.get()), bytes(src.get()));
+    PXRect backwards{10, 3, 1, 1};
+    EXPECT_EQ(PXImage_Crop(src.get(), &backwards), nullptr);
+}
+
+TEST(Rotate, QuarterTurnsMapPixelsAndClearPadding) {
+    for (int bits : {8, 16, 24}) {
+        const int w = 10, h = 5, bpp = bits / 8;
+        PX src = px_random(w, h, bits, 11);
+        PX r90(PXImage_Rotate90(src.get())), r270(PXImage_Rotate270(src.get())), r180(PXImage_Rotate180(src.get()));
+        ASSERT_TRUE(r90 && r270 && r180);
+        EXPECT_EQ(r90->width, 8);
+        EXPECT_EQ(r90->height, 10);
+        for (int i = 0; i < w; ++i)
+            for (int j = 0; j < 8; ++j)
+                for (int b = 0; b < bpp; ++b) {
+                    const uint8_t *a = r90->data + (i * 8 + j) * bpp + b, *c = r270->data + (i * 8 + j) * bpp + b;
+                    EXPECT_EQ(*a, j < h ? src->data[(j * w + w - 1 - i) * bpp + b] : 0);
+                    EXPECT_EQ(*c, j < h ? src->data[((h - 1 - j) * w + i) * bpp + b] : 0);
+                }
+        for (int i = 0; i < h; ++i)
+            for (int j = 0; j < w; ++j)
+                EXPECT_EQ(0, std::memcmp(r180->data + (i * w + j) * bpp,
+                                         src->data + ((h - 1 - i) * w + w - 1 - j) * bpp, bpp));
+    }
+    PX odd = px_random(3, 3, 32, 1);
+    EXPECT_EQ(PXImage_Rotate90(odd.get()), nullptr);
+}
+
+TEST(Zoom, InAveragesWithRoundingPerSample) {
+    for (int bits : {8, 16, 24}) {
+        const int w = 5, h = 4, ch = bits == 24 ? 3 : 1;
+        PX src = px_random(w, h, bits, 21);
+        PX out(PXImage_ZoomIn(src.get()));
+        ASSERT_TRUE(out);
+        ASSERT_EQ(out->width, 2 * w);
+        for (int y = 0; y < 2 * h; ++y)
+            for (int x = 0; x < 2 * w; ++x)
+                for (int c = 0; c < ch; ++c) {
+                    const int a = y / 2, b = std::min(a + 1, h - 1), x0 = x / 2, x1 = std::min(x / 2 + 1, w - 1);
+                    auto s = [&](int r, int col) { return neighbour(src.get(), r, col, 0, 0, c); };
+                    const int top = x % 2 ? (s(a, x0) + s(a, x1) + 1) >> 1 : s(a, x0);
+                    const int bot = x % 2 ? (s(b, x0) + s(b, x1) + 1) >> 1 : s(b, x0);
+                    EXPECT_EQ(neighbour(out.get(), y, x, 0, 0, c), y % 2 ? (top + bot + 1) >> 1 : top);
+                }
+    }
+}
+
+TEST(Zoom, OutDecimatesAndHoldsTheLastColumn) {
+    PX src = px_random(5, 5, 24, 4);
+    PX out(PXImage_ZoomOut(src.get()));
+    ASSERT_TRUE(out);
+    EXPECT_EQ(out->width, 8);
+    EXPECT_EQ(out->height, 2);
+    for (int y = 0; y < 2; ++y)
+        for (int x = 0; x < 8; ++x)
+            EXPECT_EQ(0, std::memcmp(out->data + (y * 8 + x) * 3, src->data + (2 * y * 5 + std::min(2 * x, 4)) * 3, 3));
+    PX thin = px_random(1, 9, 8, 4);
+    EXPECT_EQ(PXImage_ZoomOut(thin.get()), nullptr);
+}
+
+TEST(Zoom, RegionOfInterestScalesEachBytePlane) {
+    PX src = px_random(16, 12, 32, 8);
+    PX dst = px_make(30, 20, 32, 0xAA);
+    PXRect rect{0, 8, 10, 0};
+    ASSERT_EQ(PXImage_ROI_Zoom(src.get(), dst.get(), &rect, 2.0, 3, 4), 1);
+    // Gather w' = 5 bytes per source row from row 2, column 3, read as 16 x 12.
+    std::vector<uint8_t> plane(16 * 12, 0), out(80);
+    PX want = px_clone(dst.get());
+    std::memset(want->data, 0xAA, px_size(want.get()));
+    for (int b = 0; b < 4; ++b) {
+        for (int i = 0; i < 12 * 5; ++i) {
+            const int p = (2 + i / 5) * 16 + 3 + i % 5; // rows 12 and 13 lie past the source
+            plane[i] = p < 16 * 12 ? src->data[p * 4 + b] : 0;
+        }
+        ASSERT_EQ(DualLinearIntepol(plane.data(), 16, 12, out.data(), 10, 8), 1);
+        for (int r = 0; r < 8; ++r)
+            for (int c = 0; c < 10; ++c)
+                want->data[((4 + r) * 30 + 3 + c) * 4 + b] = out[r * 10 + c];
+    }
+    EXPECT_EQ(bytes(dst.get()), bytes(want.get()));
+    // Targets running past the block and gathers past the source stay inside.
+    EXPECT_EQ(PXImage_ROI_Zoom(src.get(), dst.get(), &rect, 0.5, 25, 18), 1);
+    EXPECT_EQ(PXImage_ROI_Zoom(src.get(), dst.get(), &rect, 1e-14, 0, 0), 0);
+    EXPECT_EQ(PXImage_ROI_Zoom(src.get(), dst.get(), &rect, -1.0, 0, 0), 0);
+    PXRect flat{0, 0, 10, 0};
+    EXPECT_EQ(PXImage_ROI_Zoom(src.get(), dst.get(), &flat, 1.0, 0, 0), 0);
+}
+
+TEST(Helpers, SimilaritySqrtAndPointInRect) {
+    PX a = px_random(8, 3, 24, 1), b = px_clone(a.get());
+    for (size_t i = 0; i < px_size(b.get()); i += 2) // mean difference exactly one half
+        b->data[i] ^= 1;
+    EXPECT_EQ(PXImage_IsSameImage(a.get(), b.get()), 1);
+    b->data[1] ^= 1;
+    EXPECT_EQ(PXImage_IsSameImage(a.get(), b.get()), 0);
+    PX w1 = px_random(4, 4, 16, 2), w2 = px_clone(w1.get());
+    EXPECT_EQ(PXImage_IsSameImage(w1.get(), w2.get()), 0);
+
+    for (int32_t n : {0, 3, 4, 65535, 65536, 2147395599, 2147395600, 2147483647})
+        EXPECT_EQ(px_sqrt(n), int32_t(std::floor(std::sqrt(double(n))))) << n;
+
+    const PXRect r{1, 5, 4, 2};
+    const PXPoint in{2, 3}, edges[] = {{1, 3}, {4, 3}, {2, 2}, {2, 5}};
+    EXPECT_EQ(px_PtInRect(&in, &r), 1);
+    for (const PXPoint &p : edges)
+        EXPECT_EQ(px_PtInRect(&p, &r), 0);
+}
+
+} // namespace

@@ -1,0 +1,175 @@
+// Clamped square neighbourhoods of packed 8-, 16- and 24-bit images for the
+// in-place filters: each source row is widened once into a padded copy so the
+// filters run border-free over whole rows.
+#pragma once
+
+#include <pxfx/toolkit.h>
+
+#include <cstddef>
+#include <cstdint>
+
+#include "core/internal/memory.hpp"
+#include "toolkit/pximage_check.hpp"
+
+namespace pxfx::packed {
+
+// Samples of a format: bytes for 8 bits (one per pixel) and 24 bits (three),
+// little-endian words for 16 bits.
+struct Bytes1 {
+    using T = uint8_t;
+    static constexpr int32_t kChannels = 1;
+    static constexpr int32_t kMax = 255;
+};
+struct Bytes3 {
+    using T = uint8_t;
+    static constexpr int32_t kChannels = 3;
+    static constexpr int32_t kMax = 255;
+};
+struct Words1 {
+    using T = uint16_t;
+    static constexpr int32_t kChannels = 1;
+    static constexpr int32_t kMax = 65535;
+};
+
+// Calls fn(Format{}) for 8, 16 or 24 bits and returns true, or returns false.
+template <class Fn> bool with_sample_format(int32_t bitcount, Fn &&fn) {
+    switch (bitcount) {
+    case 8: fn(Bytes1{}); return true;
+    case 16: fn(Words1{}); return true;
+    case 24: fn(Bytes3{}); return true;
+    default: return false;
+    }
+}
+
+// Neighbourhood rows of `size` x `size` windows. Padded row r holds the
+// samples at columns -half .. width - 1 + half, sample (p, c) at index
+// (p + half) * C + c, read as the filters define their clamp: rows and
+// columns are held to the picture, except that 24-bit pictures hold the byte
+// index 3p to 0 .. 3 width - 1 and read three bytes from there, so right of
+// the picture they read the last byte of the row and the first two of the
+// next one. Bytes past the end of the block read as 0.
+template <class F> class Window {
+  public:
+    using T = typename F::T;
+    static constexpr int32_t C = F::kChannels;
+
+    Window(const PXImage *img, int32_t size)
+        : img_(img), size_(size), half_(size / 2),
+          padded_((static_cast<size_t>(img->width) + 2 * static_cast<size_t>(half_)) * C),
+          ring_(alloc_buffer<T>(checked_size(padded_, static_cast<uint64_t>(size)))) {}
+
+    bool ok() const { return static_cast<bool>(ring_); }
+    // Samples per output row (width x channels).
+    size_t samples() const { return static_cast<size_t>(img_->width) * C; }
+
+    // Fills rows[0 .. size - 1] with the padded rows y - half .. y + half
+    // (clamped). Rows must be asked for in increasing order of y; the source
+    // rows from y + half on must still hold their original content.
+    void rows_for(int32_t y, const T **rows) {
+        const int32_t h = img_->height;
+        const int32_t need = y + half_ < h ? y + half_ : h - 1;
+        while (built_ < need)
+            build(++built_);
+        for (int32_t k = 0; k < size_; ++k) {
+            int32_t r = y - half_ + k;
+            r = r < 0 ? 0 : (r >= h ? h - 1 : r);
+            rows[k] = slot(r) + static_cast<size_t>(half_) * C;
+        }
+    }
+
+  private:
+    T *slot(int32_t r) { return ring_.get() + static_cast<size_t>(r % size_) * padded_; }
+
+    void build(int32_t r) {
+        T *out = slot(r);
+        const int32_t w = img_->width;
+        const uint8_t *block = img_->data;
+        if constexpr (C == 3) {
+            const size_t rowStart = static_cast<size_t>(r) * w * 3, end = px_block(img_);
+            const int64_t last = int64_t{w} * 3 - 1;
+            for (int32_t p = -half_; p < w + half_; ++p) {
+                int64_t idx = int64_t{p} * 3;
+                idx = idx < 0 ? 0 : (idx > last ? last : idx);
+                for (int32_t c = 0; c < 3; ++c) {
+                    const size_t k = rowStart + static_cast<size_t>(idx) + c;
+                    out[static_cast<size_t>(p + half_) * 3 + c] = k < end ? block[k] : 0;
+                }
+            }
+        } else {
+            const size_t rowStart = static_cast<size_t>(r) * w;
+            for (int32_t p = -half_; p < w + half_; ++p) {
+                const int32_t x = p < 0 ? 0 : (p >= w ? w - 1 : p);
+                if constexpr (sizeof(T) == 1)
+                    out[p + half_] = block[rowStart + x];
+                else
+                    out[p + half_] = static_cast<T>(load16(block + 2 * (rowStart + x)));
+            }
+        }
+    }
+
+    const PXImage *img_;
+    int32_t size_, half_;
+    size_t padded_;
+    Buffer<T> ring_;
+    int32_t built_ = -1;
+};
+
+// Writes a row of sums into image row y, each passed through `fix` and
+// clamped to the format's range.
+template <class F, class Fix> void store_row(PXImage *img, int32_t y, const int32_t *acc, size_t n, Fix fix) {
+    if constexpr (sizeof(typename F::T) == 1) {
+        uint8_t *out = img->data + static_cast<size_t>(y) * n;
+        for (size_t i = 0; i < n; ++i) {
+            const int32_t v = fix(acc[i]);
+            out[i] = static_cast<uint8_t>(v < 0 ? 0 : (v > F::kMax ? F::kMax : v));
+        }
+    } else {
+        uint8_t *out = img->data + static_cast<size_t>(y) * n * 2;
+        for (size_t i = 0; i < n; ++i) {
+            const int32_t v = fix(acc[i]);
+            store16(out + 2 * i, static_cast<uint32_t>(v < 0 ? 0 : (v > F::kMax ? F::kMax : v)));
+        }
+    }
+}
+
+// acc[i] = sum of kernel[ky * size + kx] * rows[ky][i + (kx - half) * C]
+// for the non-zero entries.
+template <class T>
+void convolve_row(const T *const *rows, const int32_t *kernel, int32_t size, int32_t channels, size_t n, int32_t *acc) {
+    const int32_t half = size / 2;
+    for (size_t i = 0; i < n; ++i)
+        acc[i] = 0;
+    for (int32_t ky = 0; ky < size; ++ky)
+        for (int32_t kx = 0; kx < size; ++kx) {
+            const int32_t k = kernel[ky * size + kx];
+            if (k == 0) continue;
+            const T *src = rows[ky] + static_cast<ptrdiff_t>(kx - half) * channels;
+            for (size_t i = 0; i < n; ++i)
+                acc[i] += k * static_cast<int32_t>(src[i]);
+        }
+}
+
+// acc[i] = sum of the size x size window around sample i; `cols` holds
+// n + (size - 1) * channels column sums.
+template <class T>
+void box_row(const T *const *rows, int32_t size, int32_t channels, size_t n, int32_t *cols, int32_t *acc) {
+    const int32_t half = size / 2;
+    const size_t span = n + static_cast<size_t>(size - 1) * channels;
+    const ptrdiff_t lead = static_cast<ptrdiff_t>(half) * channels;
+    for (size_t i = 0; i < span; ++i)
+        cols[i] = 0;
+    for (int32_t ky = 0; ky < size; ++ky) {
+        const T *src = rows[ky] - lead;
+        for (size_t i = 0; i < span; ++i)
+            cols[i] += src[i];
+    }
+    for (size_t i = 0; i < n; ++i)
+        acc[i] = 0;
+    for (int32_t kx = 0; kx < size; ++kx) {
+        const int32_t *c = cols + static_cast<size_t>(kx) * channels;
+        for (size_t i = 0; i < n; ++i)
+            acc[i] += c[i];
+    }
+}
+
+} // namespace pxfx::packed

@@ -1,0 +1,138 @@
+// Bilinear resize of packed images and the two exported plane
+// interpolations. The source coordinate of destination index i is i / r with
+// r = source size / destination size (the inverse of the usual mapping), all
+// in single precision.
+#include <pxfx/toolkit.h>
+
+#include "core/internal/memory.hpp"
+#include "toolkit/pximage_check.hpp"
+#include "toolkit/resize_internal.hpp"
+
+using namespace pxfx;
+using namespace pxfx::packed;
+
+namespace pxfx::packed {
+
+namespace {
+
+struct Tap {
+    int32_t i0, i1; // clamped sample indices
+    float w, omw;   // weight of i1 and 1 - weight
+};
+
+int32_t clamp_index(int64_t v, int32_t n) { return v < 0 ? 0 : (v >= n ? n - 1 : static_cast<int32_t>(v)); }
+
+} // namespace
+
+bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
+                       int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
+    Buffer<Tap> cols = alloc_buffer<Tap>(static_cast<size_t>(dstWidth));
+    if (!cols) return false;
+    for (int32_t j = 0; j < dstWidth; ++j) {
+        const float fx = static_cast<float>(j) / rx;
+        const int32_t x0 = trunc_sat<int32_t>(fx);
+        const float wx = fx - static_cast<float>(x0);
+        cols[j] = {clamp_index(x0, srcWidth), clamp_index(int64_t{x0} + 1, srcWidth), wx, 1.0f - wx};
+    }
+    // Horizontally interpolated source rows, cached in two slots by row
+    // parity: consecutive output rows mostly reuse one or both.
+    Buffer<float> across = alloc_buffer<float>(2 * static_cast<size_t>(dstWidth));
+    if (!across) return false;
+    int32_t cached[2] = {-1, -1};
+    const size_t srcRow = static_cast<size_t>(srcWidth) * srcStride;
+    const size_t dstRow = static_cast<size_t>(dstWidth) * dstStride;
+    auto row_across = [&](int32_t y) {
+        float *h = across.get() + static_cast<size_t>(y & 1) * dstWidth;
+        if (cached[y & 1] == y) return static_cast<const float *>(h);
+        const uint8_t *a = src + static_cast<size_t>(y) * srcRow;
+        for (int32_t j = 0; j < dstWidth; ++j) {
+            const Tap &t = cols[j];
+            h[j] = t.omw * static_cast<float>(a[t.i0 * srcStride]) + t.w * static_cast<float>(a[t.i1 * srcStride]);
+        }
+        cached[y & 1] = y;
+        return static_cast<const float *>(h);
+    };
+    for (int32_t i = 0; i < dstHeight; ++i) {
+        const float fy = static_cast<float>(i) / ry;
+        const int32_t y0 = trunc_sat<int32_t>(fy);
+        const int32_t Y0 = clamp_index(y0, srcHeight), Y1 = clamp_index(int64_t{y0} + 1, srcHeight);
+        // The vertical weight comes from the clamped row, so it exceeds 1
+        // where the clamp held.
+        const float wy = fy - static_cast<float>(Y0);
+        const float omwy = 1.0f - wy;
+        const float *top = row_across(Y0);
+        const float *bottom = row_across(Y1);
+        uint8_t *out = dst + static_cast<size_t>(i) * dstRow;
+        for (int32_t j = 0; j < dstWidth; ++j)
+            out[static_cast<size_t>(j) * dstStride] =
+                static_cast<uint8_t>(trunc_sat<uint32_t>(omwy * top[j] + wy * bottom[j]));
+    }
+    return true;
+}
+
+} // namespace pxfx::packed
+
+namespace {
+
+bool plane_args_ok(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, const uint8_t *dst, int32_t dstWidth,
+                   int32_t dstHeight) {
+    return src != nullptr && dst != nullptr && srcWidth > 0 && srcHeight > 0 && dstWidth > 0 && dstHeight > 0 &&
+           checked_size(static_cast<uint64_t>(srcWidth), static_cast<uint64_t>(srcHeight)) != 0 &&
+           checked_size(static_cast<uint64_t>(dstWidth), static_cast<uint64_t>(dstHeight)) != 0;
+}
+
+} // namespace
+
+extern "C" {
+
+int32_t DualLinearIntepol(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, uint8_t *dst, int32_t dstWidth,
+                          int32_t dstHeight) {
+    if (!plane_args_ok(src, srcWidth, srcHeight, dst, dstWidth, dstHeight)) return 0;
+    const float ry = static_cast<float>(srcHeight) / static_cast<float>(dstHeight);
+    const float rx = static_cast<float>(srcWidth) / static_cast<float>(dstWidth);
+    return interpolate_plane(src, srcWidth, srcHeight, 1, dst, dstWidth, dstHeight, 1, ry, rx) ? 1 : 0;
+}
+
+int32_t DualLinearIntepol_KWB(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, uint8_t *dst, int32_t dstWidth,
+                              int32_t dstHeight, float scale) {
+    if (!plane_args_ok(src, srcWidth, srcHeight, dst, dstWidth, dstHeight)) return 0;
+    return interpolate_plane(src, srcWidth, srcHeight, 1, dst, dstWidth, dstHeight, 1, scale, scale) ? 1 : 0;
+}
+
+PXImage *PXImage_Resize(const PXImage *src, int32_t newWidth, int32_t newHeight) {
+    if (!px_usable(src)) return nullptr;
+    if (src->bitcount != 8 && src->bitcount != 16 && src->bitcount != 24) return nullptr;
+    const int32_t w = src->width, h = src->height;
+    PXImage *out = px_new(newWidth, newHeight, src->bitcount == 8 ? 8 : 24);
+    if (out == nullptr) return nullptr;
+    const float ry = static_cast<float>(h) / static_cast<float>(newHeight);
+    const float rx = static_cast<float>(w) / static_cast<float>(newWidth);
+    bool ok = true;
+    if (src->bitcount == 8) {
+        ok = interpolate_plane(src->data, w, h, 1, out->data, newWidth, newHeight, 1, ry, rx);
+    } else if (src->bitcount == 24) {
+        for (int32_t c = 0; c < 3 && ok; ++c)
+            ok = interpolate_plane(src->data + c, w, h, 3, out->data + c, newWidth, newHeight, 3, ry, rx);
+    } else {
+        // A 16-bit source is read as three-byte pixels; the bytes that this
+        // stride puts past the end of its block read as 0.
+        const size_t n = static_cast<size_t>(w) * static_cast<size_t>(h);
+        const size_t have = px_block(src);
+        Buffer<uint8_t> plane = alloc_buffer<uint8_t>(n);
+        ok = static_cast<bool>(plane);
+        for (int32_t c = 0; c < 3 && ok; ++c) {
+            for (size_t p = 0; p < n; ++p) {
+                const size_t k = p * 3 + static_cast<size_t>(c);
+                plane[p] = k < have ? src->data[k] : 0;
+            }
+            ok = interpolate_plane(plane.get(), w, h, 1, out->data + c, newWidth, newHeight, 3, ry, rx);
+        }
+    }
+    if (!ok) {
+        PXImage_Free(out);
+        return nullptr;
+    }
+    return out;
+}
+
+} // extern "C"

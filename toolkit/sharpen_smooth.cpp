@@ -1,0 +1,185 @@
+// Sharpening with three fixed kernels, mean and median smoothing, and the
+// partition-exchange sort px_ShellSort. The filters run in place: every row
+// is read through a padded copy made before the row can be overwritten.
+#include <pxfx/toolkit.h>
+
+#include <algorithm>
+#include <utility>
+
+#include "core/internal/memory.hpp"
+#include "toolkit/neighbourhood.hpp"
+#include "toolkit/pximage_check.hpp"
+
+using namespace pxfx;
+using namespace pxfx::packed;
+
+namespace {
+
+const int32_t kSharpen3[9] = {0, -1, 0, -1, 5, -1, 0, -1, 0};
+const int32_t kSharpen5[25] = {0, -1, -1, -1, 0, -1, 0, 1, 0, -1, -1, 1, 9, 1, -1, -1, 0, 1, 0, -1, 0, -1, -1, -1, 0};
+
+// The 7 x 7 kernel's rows start at source row 49: result row r holds the
+// filtered source row r + 49.
+constexpr int32_t kSharpen7FirstRow = 49;
+
+// Sharpening with the 3 x 3 or 5 x 5 kernel from row 0, or with the 7 x 7
+// kernel (49 at the centre, -1 elsewhere, summed as 50 centre - window sum)
+// from row 49; rows left without a result keep their content.
+template <class F> bool sharpen(PXImage *img, int32_t size) {
+    Window<F> win(img, size);
+    const size_t n = win.samples();
+    Buffer<int32_t> acc = alloc_buffer<int32_t>(n);
+    Buffer<int32_t> cols = alloc_buffer<int32_t>(n + static_cast<size_t>(size - 1) * F::kChannels);
+    if (!win.ok() || !acc || !cols) return false;
+    const typename F::T *rows[7];
+    const int32_t first = size == 7 ? kSharpen7FirstRow : 0;
+    for (int32_t y = first; y < img->height; ++y) {
+        win.rows_for(y, rows);
+        if (size == 7) {
+            box_row(rows, 7, F::kChannels, n, cols.get(), acc.get());
+            const typename F::T *centre = rows[3];
+            for (size_t i = 0; i < n; ++i)
+                acc[i] = 50 * static_cast<int32_t>(centre[i]) - acc[i];
+        } else {
+            convolve_row(rows, size == 3 ? kSharpen3 : kSharpen5, size, F::kChannels, n, acc.get());
+        }
+        store_row<F>(img, y - first, acc.get(), n, [](int32_t v) { return v; });
+    }
+    return true;
+}
+
+template <class F> bool mean_smooth(PXImage *img, int32_t size) {
+    Window<F> win(img, size);
+    const size_t n = win.samples();
+    Buffer<int32_t> acc = alloc_buffer<int32_t>(n);
+    Buffer<int32_t> cols = alloc_buffer<int32_t>(n + static_cast<size_t>(size - 1) * F::kChannels);
+    if (!win.ok() || !acc || !cols) return false;
+    const typename F::T *rows[7];
+    const auto area = static_cast<uint32_t>(size * size);
+    for (int32_t y = 0; y < img->height; ++y) {
+        win.rows_for(y, rows);
+        box_row(rows, size, F::kChannels, n, cols.get(), acc.get());
+        store_row<F>(img, y, acc.get(), n,
+                     [area](int32_t v) { return static_cast<int32_t>(static_cast<uint32_t>(v) / area); });
+    }
+    return true;
+}
+
+// Median of byte samples with a sliding histogram per row and channel: the
+// level m with count(< m) <= k < count(<= m), k = size^2 / 2, is element k of
+// the sorted window.
+template <class F> void median_row_bytes(const uint8_t *const *rows, int32_t size, size_t width, int32_t *acc) {
+    constexpr int32_t C = F::kChannels;
+    const int32_t half = size / 2, k = size * size / 2;
+    for (int32_t c = 0; c < C; ++c) {
+        int32_t hist[256] = {};
+        for (int32_t ky = 0; ky < size; ++ky)
+            for (int32_t kx = -half; kx <= half; ++kx)
+                ++hist[rows[ky][static_cast<ptrdiff_t>(kx) * C + c]];
+        int32_t med = 0, below = 0;
+        for (size_t x = 0;; ++x) {
+            while (below > k)
+                below -= hist[--med];
+            while (below + hist[med] <= k)
+                below += hist[med++];
+            acc[x * C + c] = med;
+            if (x + 1 == width) break;
+            const ptrdiff_t out = (static_cast<ptrdiff_t>(x) - half) * C + c;
+            const ptrdiff_t in = (static_cast<ptrdiff_t>(x) + half + 1) * C + c;
+            for (int32_t ky = 0; ky < size; ++ky) {
+                const uint8_t a = rows[ky][out], b = rows[ky][in];
+                --hist[a];
+                below -= a < med;
+                ++hist[b];
+                below += b < med;
+            }
+        }
+    }
+}
+
+// Median of 16-bit samples by selection of element size^2 / 2.
+void median_row_words(const uint16_t *const *rows, int32_t size, size_t width, int32_t *acc) {
+    const int32_t half = size / 2, k = size * size / 2;
+    int32_t window[49];
+    for (size_t x = 0; x < width; ++x) {
+        int32_t m = 0;
+        for (int32_t ky = 0; ky < size; ++ky)
+            for (int32_t kx = -half; kx <= half; ++kx)
+                window[m++] = rows[ky][static_cast<ptrdiff_t>(x) + kx];
+        std::nth_element(window, window + k, window + m);
+        acc[x] = window[k];
+    }
+}
+
+template <class F> bool median_smooth(PXImage *img, int32_t size) {
+    Window<F> win(img, size);
+    const size_t n = win.samples();
+    Buffer<int32_t> acc = alloc_buffer<int32_t>(n);
+    if (!win.ok() || !acc) return false;
+    const typename F::T *rows[7];
+    for (int32_t y = 0; y < img->height; ++y) {
+        win.rows_for(y, rows);
+        if constexpr (sizeof(typename F::T) == 1)
+            median_row_bytes<F>(rows, size, static_cast<size_t>(img->width), acc.get());
+        else
+            median_row_words(rows, size, static_cast<size_t>(img->width), acc.get());
+        store_row<F>(img, y, acc.get(), n, [](int32_t v) { return v; });
+    }
+    return true;
+}
+
+} // namespace
+
+extern "C" {
+
+int32_t PXImage_Sharpen(PXImage *img, int32_t strength) {
+    if (!px_usable(img) || strength == 0) return 0;
+    if (strength > 100) return 1;
+    const int32_t size = strength < 40 ? 3 : (strength < 80 ? 5 : 7);
+    bool ok = true;
+    if (!with_sample_format(img->bitcount, [&](auto f) { ok = sharpen<decltype(f)>(img, size); })) return 1;
+    return ok ? 1 : 0;
+}
+
+int32_t PXImage_Smooth(PXImage *img, int32_t strength) {
+    if (!px_usable(img) || strength == 0) return 0;
+    const bool median = strength >= 60;
+    const int32_t size = strength < 20 ? 3 : (strength < 40 ? 5 : (strength < 60 ? 7 : (strength < 80 ? 5 : 7)));
+    bool ok = true;
+    if (!with_sample_format(img->bitcount, [&](auto f) {
+            using F = decltype(f);
+            ok = median ? median_smooth<F>(img, size) : mean_smooth<F>(img, size);
+        }))
+        return 1;
+    return ok ? 1 : 0;
+}
+
+void px_ShellSort(int32_t *values, int32_t first, int32_t last) {
+    if (values == nullptr) return;
+    // Hole-based partition around values[first]. The smaller side is sorted
+    // by recursion and the larger one by the loop, which bounds the stack
+    // depth by log2 of the length; the sorted result is the same whichever
+    // side recurses.
+    while (first < last) {
+        const int32_t pivot = values[first];
+        int32_t i = first, j = last;
+        while (i < j) {
+            while (i < j && values[j] >= pivot)
+                --j;
+            if (i < j) values[i++] = values[j];
+            while (i < j && values[i] < pivot)
+                ++i;
+            if (i < j) values[j--] = values[i];
+        }
+        values[i] = pivot;
+        if (i - first < last - i) {
+            if (first < i - 1) px_ShellSort(values, first, i - 1);
+            first = i + 1;
+        } else {
+            if (i + 1 < last) px_ShellSort(values, i + 1, last);
+            last = i - 1;
+        }
+    }
+}
+
+} // extern "C"

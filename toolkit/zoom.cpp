@@ -1,0 +1,169 @@
+// 2x zoom in (rounded averages) and out (decimation), and the zoom of a
+// rectangle of one 32-bit image into another, byte plane by byte plane.
+#include <pxfx/toolkit.h>
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+
+#include "core/internal/memory.hpp"
+#include "toolkit/pximage_check.hpp"
+#include "toolkit/resize_internal.hpp"
+
+using namespace pxfx;
+using namespace pxfx::packed;
+
+namespace {
+
+// Sample traits: 8-bit and 24-bit pictures average single bytes (three per
+// pixel for 24), 16-bit pictures average whole little-endian words.
+struct ByteSamples {
+    using T = uint8_t;
+    static uint32_t get(const uint8_t *row, size_t i) { return row[i]; }
+    static void put(uint8_t *row, size_t i, uint32_t v) { row[i] = static_cast<uint8_t>(v); }
+};
+struct WordSamples {
+    using T = uint16_t;
+    static uint32_t get(const uint8_t *row, size_t i) { return load16(row + 2 * i); }
+    static void put(uint8_t *row, size_t i, uint32_t v) { store16(row + 2 * i, v); }
+};
+
+// Doubles one source row horizontally: even columns copy X0, odd columns
+// average X0 and X0 + 1 (held at the last pixel), per sample of C channels.
+template <class S, int32_t C> void widen_row(const uint8_t *in, int32_t w, uint32_t *out) {
+    for (int32_t x = 0; x < w; ++x) {
+        const int32_t x1 = x + 1 < w ? x + 1 : w - 1;
+        for (int32_t c = 0; c < C; ++c) {
+            const uint32_t a = S::get(in, static_cast<size_t>(x) * C + c);
+            const uint32_t b = S::get(in, static_cast<size_t>(x1) * C + c);
+            out[static_cast<size_t>(2 * x) * C + c] = a;
+            out[static_cast<size_t>(2 * x + 1) * C + c] = (a + b + 1) >> 1;
+        }
+    }
+}
+
+template <class S, int32_t C> bool zoom_in(const PXImage *src, PXImage *dst) {
+    const int32_t w = src->width, h = src->height;
+    const size_t n = static_cast<size_t>(2 * static_cast<int64_t>(w)) * C;
+    Buffer<uint32_t> rows = alloc_buffer<uint32_t>(2 * n);
+    if (!rows) return false;
+    uint32_t *top = rows.get(), *bottom = top + n;
+    const size_t srcRow = static_cast<size_t>(w) * C;
+    widen_row<S, C>(src->data, w, top);
+    for (int32_t a = 0; a < h; ++a) {
+        const int32_t b = a + 1 < h ? a + 1 : a;
+        widen_row<S, C>(src->data + static_cast<size_t>(b) * srcRow * sizeof(typename S::T), w, bottom);
+        uint8_t *even = dst->data + static_cast<size_t>(2 * a) * n * sizeof(typename S::T);
+        uint8_t *odd = even + n * sizeof(typename S::T);
+        for (size_t i = 0; i < n; ++i) {
+            S::put(even, i, top[i]);
+            S::put(odd, i, (top[i] + bottom[i] + 1) >> 1);
+        }
+        std::swap(top, bottom);
+    }
+    return true;
+}
+
+template <int32_t B> void zoom_out(const PXImage *src, PXImage *dst) {
+    const int32_t w = src->width;
+    const size_t srcRow = static_cast<size_t>(w) * B, dstRow = static_cast<size_t>(dst->width) * B;
+    for (int32_t y = 0; y < dst->height; ++y) {
+        const uint8_t *in = src->data + static_cast<size_t>(2 * y) * srcRow;
+        uint8_t *out = dst->data + static_cast<size_t>(y) * dstRow;
+        for (int32_t x = 0; x < dst->width; ++x) {
+            const int64_t sx = std::min<int64_t>(2 * int64_t{x}, w - 1);
+            std::memcpy(out + static_cast<size_t>(x) * B, in + static_cast<size_t>(sx) * B, B);
+        }
+    }
+}
+
+bool zoom_input_ok(const PXImage *src) {
+    return px_usable(src) && (src->bitcount == 8 || src->bitcount == 16 || src->bitcount == 24);
+}
+
+// Rectangle zoom: byte b of the source, gathered from row `startRow`, column
+// x on, w' bytes a row for as many rows as the source has, in a plane that
+// the interpolation reads as source width x source height. Positions outside
+// the source block, and plane bytes the gather does not reach, read as 0.
+void gather_plane(const PXImage *src, int64_t startRow, int64_t x, int64_t gatherWidth, int32_t b, uint8_t *plane) {
+    const int64_t sw = src->width, sh = src->height, pixels = sw * sh;
+    const int64_t size = sw * sh, filled = std::min(size, gatherWidth * sh);
+    for (int64_t i = 0; i < filled; ++i) {
+        const int64_t r = i / gatherWidth, k = i % gatherWidth;
+        const int64_t p = (startRow + r) * sw + x + k;
+        plane[i] = p >= 0 && p < pixels ? src->data[p * 4 + b] : 0;
+    }
+    std::memset(plane + filled, 0, static_cast<size_t>(size - filled));
+}
+
+} // namespace
+
+extern "C" {
+
+PXImage *PXImage_ZoomIn(const PXImage *src) {
+    if (!zoom_input_ok(src)) return nullptr;
+    PXImage *out = px_new(2 * int64_t{src->width}, 2 * int64_t{src->height}, src->bitcount);
+    if (out == nullptr) return nullptr;
+    bool ok;
+    switch (src->bitcount) {
+    case 8: ok = zoom_in<ByteSamples, 1>(src, out); break;
+    case 16: ok = zoom_in<WordSamples, 1>(src, out); break;
+    default: ok = zoom_in<ByteSamples, 3>(src, out); break;
+    }
+    if (!ok) {
+        PXImage_Free(out);
+        return nullptr;
+    }
+    return out;
+}
+
+PXImage *PXImage_ZoomOut(const PXImage *src) {
+    if (!zoom_input_ok(src)) return nullptr;
+    PXImage *out = px_new((src->width / 2 + 7) / 8 * 8, src->height / 2, src->bitcount);
+    if (out == nullptr) return nullptr;
+    switch (src->bitcount) {
+    case 8: zoom_out<1>(src, out); break;
+    case 16: zoom_out<2>(src, out); break;
+    default: zoom_out<3>(src, out); break;
+    }
+    return out;
+}
+
+int32_t PXImage_ROI_Zoom(const PXImage *src, PXImage *dst, const PXRect *rect, double scale, int32_t x, int32_t y) {
+    if (dst == nullptr || src == nullptr || rect == nullptr || x < 0 || y < 0) return 0;
+    const int64_t rectWidth = int64_t{rect->right} - rect->left, rectHeight = int64_t{rect->top} - rect->bottom;
+    if (rectWidth <= 0 || rectHeight <= 0 || src->bitcount != 32 || dst->bitcount != 32) return 0;
+    if (!(std::fabs(scale) >= 1e-13) || !px_usable(src) || !px_usable(dst)) return 0;
+    const double gw = static_cast<double>(rectWidth) / scale + 0.5;
+    const double gh = static_cast<double>(rectHeight) / scale + 0.5;
+    const double row0 = static_cast<double>(y) / scale + 0.5;
+    if (!(gw >= 1.0 && gw < 2147483648.0 && gh >= 1.0 && gh < 2147483648.0)) return 0;
+    if (!(row0 > -2147483649.0 && row0 < 2147483648.0)) return 0;
+    const auto gatherWidth = static_cast<int64_t>(gw), gatherHeight = static_cast<int64_t>(gh);
+    const auto startRow = static_cast<int64_t>(row0);
+    if (checked_size(static_cast<uint64_t>(gatherWidth), static_cast<uint64_t>(gatherHeight)) == 0) return 0;
+    const size_t outSize = checked_size(static_cast<uint64_t>(rectWidth), static_cast<uint64_t>(rectHeight));
+    const size_t planeSize = static_cast<size_t>(src->width) * static_cast<size_t>(src->height);
+    Buffer<uint8_t> plane = alloc_buffer<uint8_t>(planeSize);
+    Buffer<uint8_t> out = alloc_buffer<uint8_t>(outSize);
+    if (!plane || !out) return 0;
+    const auto rw = static_cast<int32_t>(rectWidth), rh = static_cast<int32_t>(rectHeight);
+    const float ry = static_cast<float>(src->height) / static_cast<float>(rh);
+    const float rx = static_cast<float>(src->width) / static_cast<float>(rw);
+    const int64_t dw = dst->width, dstPixels = dw * dst->height;
+    for (int32_t b = 0; b < 4; ++b) {
+        gather_plane(src, startRow, x, gatherWidth, b, plane.get());
+        if (!interpolate_plane(plane.get(), src->width, src->height, 1, out.get(), rw, rh, 1, ry, rx)) return 0;
+        // Rows of the target run on into the next row past the row end, as
+        // in the packed block; pixels past the block end are not written.
+        for (int64_t r = 0; r < rh; ++r)
+            for (int64_t c = 0; c < rw; ++c) {
+                const int64_t p = (y + r) * dw + x + c;
+                if (p >= dstPixels) break;
+                dst->data[p * 4 + b] = out[static_cast<size_t>(r * rw + c)];
+            }
+    }
+    return 1;
+}
+
+} // extern "C"
