@@ -42,13 +42,9 @@ struct WaveProfile {
         const int32_t w = table_sin(static_cast<int32_t>(d * 360u) >> 5);
         const uint32_t span = static_cast<uint32_t>(maxd - static_cast<int32_t>(d));
         const int32_t num = static_cast<int32_t>(static_cast<uint32_t>(w) * static_cast<uint32_t>(amplitude) * span);
-        int32_t q;
-        if (divisor == 0)
-            q = 0; // only reachable with a centre far outside the picture
-        else if (divisor == -1)
-            q = static_cast<int32_t>(0u - static_cast<uint32_t>(num));
-        else
-            q = num / divisor;
+        // The divisor is a multiple of 32 (never -1, so the quotient fits); it is
+        // 0 only for a centre far outside the picture, which gives no displacement.
+        const int32_t q = divisor != 0 ? num / divisor : 0;
         return static_cast<int16_t>(static_cast<uint16_t>(static_cast<uint32_t>(q)));
     }
 };
@@ -72,6 +68,7 @@ bool fill_tabulated(int16_t *map, size_t stride, int32_t width, int32_t height, 
                     const WaveProfile &p) {
     const int64_t mx = std::max<int64_t>(std::abs(static_cast<int64_t>(cx)), std::abs(int64_t{width} - 1 - cx));
     const int64_t my = std::max<int64_t>(std::abs(static_cast<int64_t>(cy)), std::abs(int64_t{height} - 1 - cy));
+    if (mx > 65535 || my > 65535) return false;
     const uint64_t far2 = static_cast<uint64_t>(mx * mx) + static_cast<uint64_t>(my * my);
     if (far2 > UINT32_MAX) return false;
     const uint32_t dmax = isqrt_round(static_cast<uint32_t>(far2));
