@@ -12,11 +12,12 @@ using namespace pxtest;
 
 TEST(WeightedCentroid, RoundsTruncatesAndVanishes) {
     const int32_t pts[] = {1, 2, 5, 6, -3, -4};
-    const double w[] = {1, 3, 2, 9e-7};
+    const double w[] = {1, 3, 2, 9e-7, NAN};
     auto at = [](PXPoint p) { return std::pair{p.x, p.y}; };
     EXPECT_EQ(at(WeightedCentroid(pts, w, 2)), std::pair(4, 5));           // 4.0 + 0.5 and 5.0 + 0.5
     EXPECT_EQ(at(WeightedCentroid(pts + 4, w + 2, 1)), std::pair(-2, -3)); // -2.5, -3.5 toward zero
     EXPECT_EQ(at(WeightedCentroid(pts, w + 3, 1)), std::pair(0, 0));       // weights below 1e-6
+    EXPECT_EQ(at(WeightedCentroid(pts, w + 4, 1)), std::pair(0, 0));
 }
 
 TEST(FreeForm, HoleFillingReachAndOrder) {
