@@ -47,32 +47,46 @@ struct Warp {
     int32_t w, h;
     const ControlPoint *pts;
     int32_t n;
-    double *weight; // per pair, for the current pixel
-    int64_t *dy2;   // per pair, squared vertical distance to the current row
-    uint8_t *mask;  // w x h flags
+    double *weights; // n rows of w: the weights of the current image row, pair by pair
+    uint8_t *mask;   // w x h flags
 };
+
+// Inverse-square weights of image row y for one control source point (px, py),
+// as 1 / exp(log(d^2)); 0 on the point itself. d^2 is symmetric about the
+// point's column, so weights computed left of it are reused on the right.
+void row_weights(double *wr, int32_t w, int32_t y, int32_t px, int32_t py) {
+    const int64_t dy = int64_t{y} - py, dy2 = dy * dy;
+    auto weight = [&](int32_t x) {
+        const int64_t dx = int64_t{x} - px, d2 = dx * dx + dy2;
+        return d2 == 0 ? 0.0 : 1.0 / std::exp(std::log(static_cast<double>(d2)));
+    };
+    const int32_t mirrored = static_cast<int32_t>(std::min<int64_t>(w, int64_t{2} * px + 1));
+    int32_t x = 0;
+    for (; x <= px; ++x)
+        wr[x] = weight(x);
+    for (; x < mirrored; ++x)
+        wr[x] = wr[2 * px - x];
+    for (; x < w; ++x)
+        wr[x] = weight(x);
+}
 
 // Maps every source pixel that is not a control source point to its new
 // place; a later pixel landing on the same place overwrites an earlier one.
 // The last column and row are never written.
 template <class S, class D> void forward_map(const Warp &k) {
     const ControlPoint *pts = k.pts;
+    const size_t w = static_cast<size_t>(k.w);
     for (int32_t y = 0; y < k.h; ++y) {
-        for (int32_t i = 0; i < k.n; ++i) {
-            const int64_t dy = int64_t{y} - pts[i].py;
-            k.dy2[i] = dy * dy;
-        }
+        for (int32_t i = 0; i < k.n; ++i)
+            row_weights(k.weights + i * w, k.w, y, pts[i].px, pts[i].py);
         const uint8_t *m = k.mask + static_cast<size_t>(y) * k.w;
         const typename S::CRow in = S::crow(k.src, y);
         for (int32_t x = 0; x < k.w; ++x) {
             if (m[x] & kSourcePoint) continue;
-            // Inverse-square weights, as 1 / exp(log(d^2)). The pixel differs
-            // from every control source point here, so d^2 >= 1.
+            const double *wx = k.weights + x;
             double s = 0.0, spx = 0.0, spy = 0.0, sqx = 0.0, sqy = 0.0;
             for (int32_t i = 0; i < k.n; ++i) {
-                const int64_t dx = int64_t{x} - pts[i].px;
-                const double wi = 1.0 / std::exp(std::log(static_cast<double>(dx * dx + k.dy2[i])));
-                k.weight[i] = wi;
+                const double wi = wx[i * w];
                 s += wi;
                 spx += wi * pts[i].px;
                 spy += wi * pts[i].py;
@@ -86,9 +100,10 @@ template <class S, class D> void forward_map(const Warp &k) {
                 const int64_t phx = int64_t{pts[i].px} - p.x, phy = int64_t{pts[i].py} - p.y;
                 const double qhx = static_cast<double>(int64_t{pts[i].qx} - q.x);
                 const double qhy = static_cast<double>(int64_t{pts[i].qy} - q.y);
-                const double wa = k.weight[i] * static_cast<double>(phx * dx + phy * dy);
-                const double wb = k.weight[i] * static_cast<double>(phy * dx - phx * dy);
-                const double wc = k.weight[i] * static_cast<double>(phx * dy - phy * dx);
+                const double wi = wx[i * w];
+                const double wa = wi * static_cast<double>(phx * dx + phy * dy);
+                const double wb = wi * static_cast<double>(phy * dx - phx * dy);
+                const double wc = wi * static_cast<double>(phx * dy - phy * dx);
                 fx += qhx * wa + qhy * wb;
                 fy += qhx * wc + qhy * wa;
             }
@@ -257,17 +272,16 @@ int32_t DeformationFunc(Image *src, Image *dst, const DeformationPair *pairs, in
     for (int32_t i = 0; i < count; ++i)
         n += inside(pairs[i], w, h);
     Buffer<ControlPoint> pts = alloc_buffer<ControlPoint>(static_cast<size_t>(n));
-    Buffer<double> weight = alloc_buffer<double>(static_cast<size_t>(n));
-    Buffer<int64_t> dy2 = alloc_buffer<int64_t>(static_cast<size_t>(n));
+    Buffer<double> weights = alloc_buffer<double>(checked_size(static_cast<uint64_t>(n), static_cast<uint64_t>(w)));
     Buffer<uint8_t> mask = alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h)));
-    if (!mask || (n > 0 && (!pts || !weight || !dy2))) return 0;
+    if (!mask || (n > 0 && (!pts || !weights))) return 0;
     for (int32_t i = 0, j = 0; i < count; ++i) {
         const DeformationPair &p = pairs[i];
         if (!inside(p, w, h)) continue;
         pts[j++] = {static_cast<int32_t>(p.srcX), static_cast<int32_t>(p.srcY), static_cast<int32_t>(p.dstX),
                     static_cast<int32_t>(p.dstY)};
     }
-    const Warp k{src, dst, w, h, pts.get(), n, weight.get(), dy2.get(), mask.get()};
+    const Warp k{src, dst, w, h, pts.get(), n, weights.get(), mask.get()};
     with_formats(src, dst, [&](auto s, auto d) { warp<decltype(s), decltype(d)>(k); });
     fill_warp_holes(dst, mask.get());
     return 1;

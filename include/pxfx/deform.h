@@ -91,7 +91,9 @@ PXFX_API int32_t DeformationImage(Image *src, const DeformationPair *pairs, uint
 /* The warp itself, from src into dst of the same size, with hole filling. 1, or
  * 0 with dst untouched when either record lacks pixels, their sizes differ,
  * count is negative, pairs is null with a positive count, or the working memory
- * (width x height bytes plus 32 bytes per used pair) cannot be had.
+ * (width x height bytes, plus 16 + 8 x width bytes per used pair, each block
+ * at most 2^31 - 1 bytes) cannot be had. Bit counts may differ: colours are
+ * then converted as GetPixelColor / SetPixelColor do.
  *  - A pair with any coordinate whose truncation falls outside the picture
  *    (NaN and infinities included) is skipped entirely: it marks, copies and
  *    weighs nothing. With no pair left (count 0 too) every pixel maps to (0, 0).
