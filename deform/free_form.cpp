@@ -51,25 +51,6 @@ struct Warp {
     uint8_t *mask;   // w x h flags
 };
 
-// Inverse-square weights of image row y for one control source point (px, py),
-// as 1 / exp(log(d^2)); 0 on the point itself. d^2 is symmetric about the
-// point's column, so weights computed left of it are reused on the right.
-void row_weights(double *wr, int32_t w, int32_t y, int32_t px, int32_t py) {
-    const int64_t dy = int64_t{y} - py, dy2 = dy * dy;
-    auto weight = [&](int32_t x) {
-        const int64_t dx = int64_t{x} - px, d2 = dx * dx + dy2;
-        return d2 == 0 ? 0.0 : 1.0 / std::exp(std::log(static_cast<double>(d2)));
-    };
-    const int32_t mirrored = static_cast<int32_t>(std::min<int64_t>(w, int64_t{2} * px + 1));
-    int32_t x = 0;
-    for (; x <= px; ++x)
-        wr[x] = weight(x);
-    for (; x < mirrored; ++x)
-        wr[x] = wr[2 * px - x];
-    for (; x < w; ++x)
-        wr[x] = weight(x);
-}
-
 // Maps every source pixel that is not a control source point to its new
 // place; a later pixel landing on the same place overwrites an earlier one.
 // The last column and row are never written.
@@ -78,7 +59,7 @@ template <class S, class D> void forward_map(const Warp &k) {
     const size_t w = static_cast<size_t>(k.w);
     for (int32_t y = 0; y < k.h; ++y) {
         for (int32_t i = 0; i < k.n; ++i)
-            row_weights(k.weights + i * w, k.w, y, pts[i].px, pts[i].py);
+            warp_row_weights(k.weights + i * w, k.w, y, pts[i].px, pts[i].py);
         const uint8_t *m = k.mask + static_cast<size_t>(y) * k.w;
         const typename S::CRow in = S::crow(k.src, y);
         for (int32_t x = 0; x < k.w; ++x) {
@@ -242,6 +223,24 @@ template <class S, class D> void warp(const Warp &k) {
 } // namespace
 
 namespace pxfx {
+
+// d^2 is symmetric about the point's column: weights computed left of it are
+// reused on the right.
+void warp_row_weights(double *wr, int32_t w, int32_t y, int32_t px, int32_t py) {
+    const int64_t dy = int64_t{y} - py, dy2 = dy * dy;
+    auto weight = [&](int32_t x) {
+        const int64_t dx = int64_t{x} - px, d2 = dx * dx + dy2;
+        return d2 == 0 ? 0.0 : 1.0 / std::exp(std::log(static_cast<double>(d2)));
+    };
+    const int32_t mirrored = static_cast<int32_t>(std::min<int64_t>(w, int64_t{2} * px + 1));
+    int32_t x = 0;
+    for (; x < w && x <= px; ++x)
+        wr[x] = weight(x);
+    for (; x < mirrored; ++x)
+        wr[x] = wr[int64_t{2} * px - x];
+    for (; x < w; ++x)
+        wr[x] = weight(x);
+}
 
 void fill_warp_holes(Image *dst, uint8_t *mask) {
     with_format(dst->bitCount, [&](auto f) { Holes<decltype(f)>{dst, mask, dst->width, dst->height}.run(); });
