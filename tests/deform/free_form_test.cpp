@@ -71,20 +71,14 @@ TEST(FreeForm, OnePairIdentityTranslationAndIgnoredPairs) {
     // One pair: every pixel lands on the target, which keeps the last pixel
     // mapped (the source point is not mapped, the last column is never
     // written); without pairs every pixel lands on (0, 0).
-    const struct {
-        DeformationPair pair;
-        uint32_t count;
-        int qx, qy, sx, sy;
-    } cases[] = {{{3.7, 4.2, 10.9, 6}, 1, 10, 6, 19, 14},
-                 {{19.5, 14.2, 10, 6}, 1, 10, 6, 18, 14},
-                 {{3, 4, 19, 6}, 1, 19, 6, 3, 4},
-                 {{3, 4, 19, 6}, 0, 0, 0, 19, 14}};
-    for (auto c : cases) {
-        ASSERT_EQ(DeformationImage(src.get(), &c.pair, c.count, &dst), 1);
+    const DeformationPair one[] = {{3.7, 4.2, 10.9, 6}, {19.5, 14.2, 10, 6}, {3, 4, 19, 6}, {3, 4, 19, 6}};
+    const int want[][5] = {{1, 10, 6, 19, 14}, {1, 10, 6, 18, 14}, {1, 19, 6, 3, 4}, {0, 0, 0, 19, 14}};
+    for (int i = 0; i < 4; ++i) { // count, place written, source pixel found there
+        const auto [n, qx, qy, sx, sy] = want[i];
+        ASSERT_EQ(DeformationImage(src.get(), &one[i], uint32_t(n), &dst), 1);
         for (int y = 0; y < 15; ++y)
             for (int x = 0; x < 20; ++x)
-                EXPECT_EQ(GetPixelColor(dst.get(), x, y),
-                          x == c.qx && y == c.qy ? GetPixelColor(src.get(), c.sx, c.sy) : 0u);
+                EXPECT_EQ(GetPixelColor(dst.get(), x, y), x == qx && y == qy ? GetPixelColor(src.get(), sx, sy) : 0u);
     }
     // Identity pairs, then the same shifted by (3, 2): the picture moves along,
     // on a white background, never into the last row and column.
