@@ -1,0 +1,81 @@
+// Polar transforms against a straightforward accessor version, and the
+// mirrored identity, the outside colour and the bathroom ribs.
+#include <gtest/gtest.h>
+
+#include <cmath>
+
+#include "support/test_images.hpp"
+
+using namespace pxtest;
+
+namespace {
+
+Owned reference_circle(const Image *src, int mode, int radius, float factor) {
+    const int w = src->width, h = src->height, cx = w / 2, cy = h / 2;
+    const int R = radius != 0 ? radius : int(std::sqrt(double(float(cx * cx + cy * cy))));
+    Owned out = make(w, h, int(src->bitCount));
+    for (int y = 0; y < h; ++y)
+        for (int x = 0; x < w; ++x) {
+            const int dx = cx - x, dy = cy - y;
+            const double r = std::sqrt(double(float(dx * dx + dy * dy))), t = std::atan2(dy, dx);
+            int sx = -1, sy = -1;
+            if (r < R && mode >= 4) {
+                sx = x + x % 32 - 16, sy = y;
+            } else if (r < R && mode == 3) {
+                sx = int(std::fabs(t * w / 6.2831852)), sy = int(std::fabs(r * h / R));
+            } else if (r < R) {
+                const double rr = mode == 1 ? std::sqrt(r * R) : mode == 2 ? r : r * r / R;
+                const double tt = mode == 2 ? t + r / (factor == 0.0f ? 1.0 : factor) : t;
+                sx = cx + int(rr * std::cos(tt)), sy = cy - int(rr * std::sin(tt));
+            }
+            SetPixelColor(out.get(), x, y, GetPixelColor(src, sx, sy));
+        }
+    return out;
+}
+
+} // namespace
+
+TEST(Polar, MatchesAccessorVersion) {
+    const int sizes[][2] = {{1, 1}, {1, 7}, {7, 1}, {2, 2}, {5, 4}, {33, 20}, {64, 47}};
+    uint32_t (*entries[])(Image *, Image **) = {Punch_Transform, Pinch_Transform, Swirl_Transform, Cylinder_Transform,
+                                                Bathroom_Transform};
+    // Mode, radius and factor of CircleTransform; a negative mode behaves as the punch.
+    const float cases[][3] = {{9, 0, 1},  {-3, 0, 1},  {2, 0, 0},   {2, 7, -3.5f}, {0, 500, 1}, {1, 500, 1}, {3, 9, 1},
+                              {4, -5, 1}, {0, 0, 100}, {1, 0, 100}, {2, 0, 100},   {3, 0, 100}, {4, 0, 1}};
+    uint32_t seed = 1;
+    for (int bc : kBitCounts)
+        for (auto [w, h] : sizes)
+            for (int i = 0; i < 13; ++i) {
+                const auto [mode, radius, factor] = cases[i];
+                Owned src = random_image(w, h, bc, seed++);
+                Slot dst; // the last five cases are the named entry points
+                const uint32_t ok = i < 8 ? CircleTransform(src.get(), &dst, int(mode), int(radius), factor)
+                                          : entries[i - 8](src.get(), &dst);
+                ASSERT_EQ(ok, 1u);
+                const Owned want = reference_circle(src.get(), std::max(0, int(mode)), int(radius), factor);
+                EXPECT_EQ(diff(dst.get(), want.get()), "") << w << "x" << h << "@" << bc << " mode " << mode;
+            }
+}
+
+TEST(Polar, MirroredIdentityRibsAndOutsideColour) {
+    Owned src = make(100, 31, 32); // pixel (x, y) holds x in blue and y in green
+    for (int y = 0; y < 31; ++y)
+        for (int x = 0; x < 100; ++x)
+            SetPixelColor(src.get(), x, y, 0xFF000000u | uint32_t(y) << 8 | uint32_t(x));
+    Slot dst;
+    // A swirl with a vanishing twist maps (x, y) onto (2 cx - x, y), exactly on
+    // the centre row and column and up to rounding elsewhere; outside, pixel (0, 0).
+    ASSERT_EQ(CircleTransform(src.get(), &dst, 2, 40, 1e30f), 1u);
+    for (int y = 0; y < 31; ++y)
+        for (int x = 0; x < 100; ++x) {
+            const uint32_t c = GetPixelColor(dst.get(), x, y), in = std::hypot(50 - x, 15 - y) < 40;
+            EXPECT_NEAR(int(c & 255), in * (100 - x), x == 50 || y == 15 ? 0 : 1) << x << "," << y;
+            EXPECT_NEAR(int(c >> 8 & 255), in * y, x == 50 || y == 15 ? 0 : 1) << x << "," << y;
+        }
+    ASSERT_EQ(CircleTransform(src.get(), &dst, 4, 1000, 1), 1u);
+    for (auto [x, sx] : {std::pair{0, 0}, {15, 14}, {16, 16}, {31, 46}, {32, 16}, {63, 78}, {99, 86}})
+        EXPECT_EQ(GetPixelColor(dst.get(), x, 1), GetPixelColor(src.get(), sx, 1)) << x;
+    for (float f : {NAN, INFINITY, 1e-45f}) // odd factors convert without overflow
+        EXPECT_EQ(CircleTransform(src.get(), &dst, 2, INT32_MAX, f), 1u);
+    EXPECT_EQ(Bathroom_Transform(nullptr, &dst) + Punch_Transform(src.get(), nullptr), 0u);
+}
