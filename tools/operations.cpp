@@ -10,6 +10,8 @@ namespace {
 std::vector<Operation> build_table() {
     std::vector<Operation> t;
     add_effects(t);
+    add_deform(t);
+    add_toolkit(t);
     return t;
 }
 

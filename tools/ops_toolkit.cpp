@@ -1,0 +1,281 @@
+// Table entries of the packed-image toolkit.
+#include <algorithm>
+
+#include "operation_groups.hpp"
+#include "operation_kit.hpp"
+
+namespace pxop {
+
+using kit::packed_in_place;
+using kit::packed_new;
+
+namespace {
+
+constexpr uint32_t kPacked = kGray8 | kWord16 | kBgr24; // formats most toolkit operations take
+
+// A rectangle from percentages of the picture (bottom-up: top is the larger row).
+PXRect rect_of(const PXImage *p, const Args &a, size_t first) {
+    auto px = [&](size_t k, int32_t n) { return static_cast<int32_t>(a.values[first + k] * (n - 1) / 100.0); };
+    return {px(0, p->width), px(1, p->height), px(2, p->width), px(3, p->height)};
+}
+
+// A frame picture with a dark window where the photo shows through.
+PXImage *make_frame() {
+    auto *f = static_cast<PXImage *>(PX_malloc(sizeof(PXImage)));
+    if (f == nullptr) return nullptr;
+    f->width = 758;
+    f->height = 604;
+    f->bitcount = 24;
+    f->data = static_cast<uint8_t *>(PX_malloc(static_cast<size_t>(f->width) * f->height * 3));
+    if (f->data == nullptr) {
+        PX_free(f);
+        return nullptr;
+    }
+    for (int32_t y = 0; y < f->height; ++y)
+        for (int32_t x = 0; x < f->width; ++x) {
+            uint8_t *p = f->data + (static_cast<size_t>(y) * f->width + x) * 3;
+            const int32_t dx = x < 60 ? 60 - x : (x > 697 ? x - 697 : 0);
+            const int32_t dy = y < 70 ? 70 - y : (y > 543 ? y - 543 : 0);
+            const bool window = dx * dx + dy * dy < 400;
+            p[0] = window ? 0 : static_cast<uint8_t>(150 + (x + y) % 60);
+            p[1] = window ? 0 : 120;
+            p[2] = window ? 0 : 90;
+        }
+    return f;
+}
+
+const std::vector<Param> kRectParams = {{"left", false, 0, 100, 15, "percent of the width"},
+                                        {"top", false, 0, 100, 85, "percent of the height (the larger row)"},
+                                        {"right", false, 0, 100, 70, "percent of the width"},
+                                        {"bottom", false, 0, 100, 20, "percent of the height (the smaller row)"}};
+
+} // namespace
+
+void add_toolkit(std::vector<Operation> &t) {
+    t.push_back({"resize",
+                 "PXImage_Resize",
+                 "Toolkit geometry",
+                 "Bilinear resize (16-bit input gives 24-bit)",
+                 {{"width", false, 5, 400, 150, "percent of the width"},
+                  {"height", false, 5, 400, 150, "percent of the height"}},
+                 kPacked,
+                 [](const Image *in, const Args &a) {
+                     const int32_t w = std::max(1, static_cast<int32_t>(in->width * a.values[0] / 100));
+                     const int32_t h = std::max(1, static_cast<int32_t>(in->height * a.values[1] / 100));
+                     return packed_new(in, [&](const PXImage *p) { return PXImage_Resize(p, w, h); });
+                 },
+                 false});
+    t.push_back({"interpolate",
+                 "DualLinearIntepol_KWB",
+                 "Toolkit geometry",
+                 "Plane interpolation by one scale",
+                 {{"scale", false, 0.25, 4, 1.5, "source coordinate = destination coordinate / scale"}},
+                 kGray8,
+                 [](const Image *in, const Args &a) {
+                     const int32_t w = std::max(1, static_cast<int32_t>(in->width * a.values[0]));
+                     const int32_t h = std::max(1, static_cast<int32_t>(in->height * a.values[0]));
+                     PXImage *src = kit::to_packed(in);
+                     PXImage dst = {w, h, 8, static_cast<uint8_t *>(PX_malloc(static_cast<size_t>(w) * h))};
+                     Image *out = nullptr;
+                     if (src != nullptr && dst.data != nullptr &&
+                         DualLinearIntepol_KWB(src->data, in->width, in->height, dst.data, w, h, a.f(0)) == 1)
+                         out = kit::from_packed(&dst);
+                     PX_free(dst.data);
+                     PXImage_Free(src);
+                     return out;
+                 },
+                 false});
+    t.push_back({"crop", "PXImage_Crop", "Toolkit geometry", "Copy of a rectangle, width rounded up to 8", kRectParams,
+                 kPacked,
+                 [](const Image *in, const Args &a) {
+                     return packed_new(in, [&](const PXImage *p) {
+                         const PXRect r = rect_of(p, a, 0);
+                         return PXImage_Crop(p, &r);
+                     });
+                 },
+                 false});
+    t.push_back({"rotate90",
+                 "PXImage_Rotate90",
+                 "Toolkit geometry",
+                 "Quarter turn",
+                 {},
+                 kPacked,
+                 [](const Image *in, const Args &) { return packed_new(in, PXImage_Rotate90); },
+                 false});
+    t.push_back({"rotate180",
+                 "PXImage_Rotate180",
+                 "Toolkit geometry",
+                 "Half turn",
+                 {},
+                 kPacked,
+                 [](const Image *in, const Args &) { return packed_new(in, PXImage_Rotate180); }});
+    t.push_back({"rotate270",
+                 "PXImage_Rotate270",
+                 "Toolkit geometry",
+                 "Three-quarter turn",
+                 {},
+                 kPacked,
+                 [](const Image *in, const Args &) { return packed_new(in, PXImage_Rotate270); },
+                 false});
+    t.push_back({"zoom-in",
+                 "PXImage_ZoomIn",
+                 "Toolkit geometry",
+                 "2x enlargement",
+                 {},
+                 kPacked,
+                 [](const Image *in, const Args &) { return packed_new(in, PXImage_ZoomIn); },
+                 false});
+    t.push_back({"zoom-out",
+                 "PXImage_ZoomOut",
+                 "Toolkit geometry",
+                 "2x reduction",
+                 {},
+                 kPacked,
+                 [](const Image *in, const Args &) { return packed_new(in, PXImage_ZoomOut); },
+                 false});
+    t.push_back({"roi-zoom",
+                 "PXImage_ROI_Zoom",
+                 "Toolkit geometry",
+                 "Scales a rectangle into the picture",
+                 {{"left", false, 0, 100, 10, "percent of the width"},
+                  {"top", false, 0, 100, 60, "percent of the height (the larger row)"},
+                  {"right", false, 0, 100, 60, "percent of the width"},
+                  {"bottom", false, 0, 100, 10, "percent of the height (the smaller row)"},
+                  {"scale", false, 0.1, 10, 0.5, "scale factor"}},
+                 kBgra32,
+                 [](const Image *in, const Args &a) {
+                     PXImage *src = kit::to_packed(in);
+                     Image *out = packed_in_place(in, [&](PXImage *dst) {
+                         const PXRect r = rect_of(dst, a, 0);
+                         return src != nullptr && PXImage_ROI_Zoom(src, dst, &r, a.values[4], r.left, r.bottom) == 1;
+                     });
+                     PXImage_Free(src);
+                     return out;
+                 }});
+    t.push_back({"auto-exposure",
+                 "PXImage_AutoExposure",
+                 "Toolkit tone",
+                 "Percentile stretch with a 0.4 power curve",
+                 {},
+                 kPacked,
+                 [](const Image *in, const Args &) {
+                     return packed_in_place(in, [](PXImage *p) { return PXImage_AutoExposure(p), true; });
+                 }});
+    t.push_back({"auto-exposure-fixed",
+                 "PXImage_AutoExposure_1",
+                 "Toolkit tone",
+                 "Fixed 0.4 power curve",
+                 {},
+                 kPacked,
+                 [](const Image *in, const Args &) {
+                     return packed_in_place(in, [](PXImage *p) { return PXImage_AutoExposure_1(p), true; });
+                 }});
+    t.push_back({"white-balance",
+                 "PXImage_AutoWhiteBalance",
+                 "Toolkit tone",
+                 "White balance against a picked point",
+                 {{"x", false, 0, 100, 50, "percent of the width"}, {"y", false, 0, 100, 50, "percent of the height"}},
+                 kGray8 | kBgr24,
+                 [](const Image *in, const Args &a) {
+                     const PXPoint pt = {kit::at(in, a.values[0], true), kit::at(in, a.values[1], false)};
+                     return packed_in_place(in, [&](PXImage *p) { return PXImage_AutoWhiteBalance(p, &pt) == 1; });
+                 }});
+    t.push_back({"invert",
+                 "PXImage_BlueEnhancement",
+                 "Toolkit tone",
+                 "Inverts 24-bit pictures",
+                 {},
+                 kPacked,
+                 [](const Image *in, const Args &) {
+                     return packed_in_place(in, [](PXImage *p) { return PXImage_BlueEnhancement(p) == 1; });
+                 }});
+    t.push_back({"green-gray",
+                 "PXImage_GreenChannel",
+                 "Toolkit tone",
+                 "Green copied into every channel",
+                 {},
+                 kColour,
+                 [](const Image *in, const Args &) {
+                     return packed_in_place(in, [](PXImage *p) { return PXImage_GreenChannel(p) == 1; });
+                 }});
+    t.push_back({"px-sharpen",
+                 "PXImage_Sharpen",
+                 "Toolkit filters",
+                 "Sharpening, kernel chosen by strength",
+                 {{"strength", true, 1, 100, 30, "below 40 3x3, below 80 5x5, else 7x7"}},
+                 kPacked,
+                 [](const Image *in, const Args &a) {
+                     return packed_in_place(in, [&](PXImage *p) { return PXImage_Sharpen(p, a.i(0)) == 1; });
+                 }});
+    t.push_back({"px-smooth",
+                 "PXImage_Smooth",
+                 "Toolkit filters",
+                 "Mean or median smoothing by strength",
+                 {{"strength", true, 1, 100, 70, "below 60 mean, else median"}},
+                 kPacked,
+                 [](const Image *in, const Args &a) {
+                     return packed_in_place(in, [&](PXImage *p) { return PXImage_Smooth(p, a.i(0)) == 1; });
+                 }});
+    t.push_back({"edges",
+                 "PXImage_EdgeDetection",
+                 "Toolkit filters",
+                 "3 x 3 edge kernel",
+                 {},
+                 kPacked,
+                 [](const Image *in, const Args &) {
+                     return packed_in_place(in, [](PXImage *p) { return PXImage_EdgeDetection(p) == 1; });
+                 }});
+    t.push_back({"binarize",
+                 "PXImage_GrayToBinarization",
+                 "Toolkit filters",
+                 "Otsu binarisation",
+                 {},
+                 kPacked,
+                 [](const Image *in, const Args &) {
+                     return packed_in_place(in, [](PXImage *p) { return PXImage_GrayToBinarization(p) == 1; });
+                 }});
+    t.push_back({"frame",
+                 "PXImage_Effect_Clip",
+                 "Toolkit filters",
+                 "The photo shown through a frame's window",
+                 {},
+                 kGray8 | kBgr24,
+                 [](const Image *in, const Args &) {
+                     PXImage *frame = make_frame();
+                     Image *out = packed_new(in, [&](const PXImage *p) { return PXImage_Effect_Clip(p, frame); });
+                     PXImage_Free(frame);
+                     return out;
+                 },
+                 false});
+    t.push_back({"paint",
+                 "PXImage_Effect_Paint",
+                 "Toolkit filters",
+                 "Two-tone paint effect",
+                 {},
+                 kGray8 | kBgr24,
+                 [](const Image *in, const Args &) {
+                     return packed_in_place(in, [](PXImage *p) { return PXImage_Effect_Paint(p), true; });
+                 }});
+    t.push_back({"paint-gray-plane",
+                 "EffectPaint_GrayRowData",
+                 "Toolkit filters",
+                 "Gray-plane contrast stretch",
+                 {},
+                 kGray8,
+                 [](const Image *in, const Args &) {
+                     return packed_in_place(
+                         in, [](PXImage *p) { return EffectPaint_GrayRowData(p->data, p->width, p->height), true; });
+                 }});
+    t.push_back({"paint-blue-plane",
+                 "EffectPaint_BlueRowData",
+                 "Toolkit filters",
+                 "Blue-plane contrast stretch",
+                 {},
+                 kGray8,
+                 [](const Image *in, const Args &) {
+                     return packed_in_place(
+                         in, [](PXImage *p) { return EffectPaint_BlueRowData(p->data, p->width, p->height), true; });
+                 }});
+}
+
+} // namespace pxop
