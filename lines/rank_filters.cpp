@@ -1,9 +1,11 @@
 // Rank filters on 8-bit planes (cross-shaped and 5 x 5 medians) and the
 // vertical edge marker.
 //
-// Both medians keep one histogram per column and slide it down one row per
-// output row. Each histogram has a coarse companion of 16 bins of 16 levels,
-// so a rank is found with at most 16 coarse and 16 fine steps.
+// Both medians keep one 256-level histogram per column and slide it down one
+// row per output row. The rank is tracked rather than searched: the level
+// found for the previous window is kept with the number of samples below it,
+// and after each update it walks only as far as the window's values moved,
+// which on camera pictures is a few levels.
 #include <pxfx/lines.h>
 
 #include <cstring>
@@ -17,119 +19,125 @@ using namespace pxfx;
 
 namespace {
 
-constexpr size_t kFine = 256, kCoarse = 16;
+constexpr size_t kLevels = 256;
 
-// Fine and coarse counts of one window. Counts stay below 256 (at most 25).
-struct HistRef {
-    uint8_t *fine;
-    uint8_t *coarse;
-    void add(uint8_t v) const {
-        ++fine[v];
-        ++coarse[v >> 4];
-    }
-    void remove(uint8_t v) const {
-        --fine[v];
-        --coarse[v >> 4];
+// The smallest level whose running count exceeds `rank`, kept with the number
+// of samples below it. count(l) gives the samples at level l; the window
+// always holds more than `rank` samples.
+struct RankTracker {
+    int32_t level;
+    int32_t below;
+    void removed(uint8_t v) { below -= v < level; }
+    void added(uint8_t v) { below += v < level; }
+    template <class Count> int32_t settle(int32_t rank, Count count) {
+        while (below > rank)
+            below -= count(--level);
+        while (below + count(level) <= rank)
+            below += count(level++);
+        return level;
     }
 };
 
-// One histogram per column of a range, in one block.
-struct ColumnHists {
-    Buffer<uint8_t> block;
-    size_t cols = 0;
-    bool alloc(size_t n) {
-        cols = n;
-        block = alloc_zeroed<uint8_t>(checked_size(n, kFine + kCoarse));
-        return static_cast<bool>(block);
-    }
-    HistRef at(size_t i) const {
-        uint8_t *base = block.get() + i * (kFine + kCoarse);
-        return {base, base + kFine};
-    }
-};
-
-// Smallest level at which the running count of a + b exceeds rank; the
-// windows always hold more than rank samples.
-int32_t rank_level(HistRef a, const uint8_t *bFine, const uint8_t *bCoarse, int32_t rank) {
-    int32_t acc = 0;
-    size_t bin = 0;
-    for (;; ++bin) {
-        const int32_t n = a.coarse[bin] + bCoarse[bin];
-        if (acc + n > rank) break;
-        acc += n;
-    }
-    size_t level = bin * 16;
-    for (;; ++level) {
-        acc += a.fine[level] + bFine[level];
-        if (acc > rank) return static_cast<int32_t>(level);
-    }
+// Counts per column of a range, in one block. Counts stay below 256.
+Buffer<uint8_t> column_histograms(int32_t cols) {
+    return alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(cols), kLevels));
 }
 
 // Rows 3 .. h - 4, columns 7 .. w - 9: the 10th smallest of the column's five
 // pixels of rows y - 2 .. y + 2 and the fourteen other pixels of row y in
-// columns x - 7 .. x + 7.
+// columns x - 7 .. x + 7. The rank is tracked along the row.
 bool cross_median(const Image *img, Image *res) {
     const int32_t w = img->width, h = img->height;
     const int32_t x0 = 7, x1 = w - 9;
     if (x1 < x0) return true;
-    ColumnHists cols;
-    if (!cols.alloc(static_cast<size_t>(x1 - x0 + 1))) return false;
-    uint8_t rowFine[kFine], rowCoarse[kCoarse];
-    const HistRef rowHist{rowFine, rowCoarse};
+    Buffer<uint8_t> block = column_histograms(x1 - x0 + 1);
+    if (!block) return false;
+    uint8_t *const hists = block.get();
     for (int32_t y = 0; y < 5; ++y) {
         const uint8_t *r = row_ptr(img, y);
         for (int32_t x = x0; x <= x1; ++x)
-            cols.at(static_cast<size_t>(x - x0)).add(r[x]);
+            ++hists[static_cast<size_t>(x - x0) * kLevels + r[x]];
     }
+    uint8_t rowHist[kLevels];
     for (int32_t y = 3; y <= h - 4; ++y) {
-        const uint8_t *gone = row_ptr(img, y - 3), *come = row_ptr(img, y + 2), *r = row_ptr(img, y);
-        uint8_t *out = row_ptr(res, y);
-        std::memset(rowFine, 0, sizeof rowFine);
-        std::memset(rowCoarse, 0, sizeof rowCoarse);
-        for (int32_t x = x0 - 7; x < x0 + 7; ++x)
-            rowHist.add(r[x]);
+        const uint8_t *rows[5];
+        for (int32_t d = 0; d < 5; ++d)
+            rows[d] = row_ptr(img, y - 2 + d);
+        const uint8_t *gone = row_ptr(img, y - 3), *r = rows[2];
         for (int32_t x = x0; x <= x1; ++x) {
-            const HistRef col = cols.at(static_cast<size_t>(x - x0));
-            col.remove(gone[x]);
-            col.add(come[x]);
-            rowHist.add(r[x + 7]);
-            if (x > x0) rowHist.remove(r[x - 8]);
-            // The centre is in the column already.
-            rowHist.remove(r[x]);
-            out[x] = static_cast<uint8_t>(rank_level(col, rowFine, rowCoarse, 9));
-            rowHist.add(r[x]);
+            uint8_t *col = hists + static_cast<size_t>(x - x0) * kLevels;
+            --col[gone[x]];
+            ++col[rows[4][x]];
+        }
+        std::memset(rowHist, 0, sizeof rowHist);
+        for (int32_t x = x0 - 7; x <= x0 + 7; ++x)
+            ++rowHist[r[x]];
+        RankTracker t{0, 0};
+        uint8_t *out = row_ptr(res, y);
+        for (int32_t x = x0; x <= x1; ++x) {
+            if (x > x0) {
+                // Window x - 7 .. x + 7 from x - 8 .. x + 6; the old centre
+                // comes back and the new one leaves; the column changes.
+                t.removed(r[x - 8]);
+                t.added(r[x + 7]);
+                --rowHist[r[x - 8]];
+                ++rowHist[r[x + 7]];
+                t.added(r[x - 1]);
+                t.removed(r[x]);
+                for (int32_t d = 0; d < 5; ++d) {
+                    t.removed(rows[d][x - 1]);
+                    t.added(rows[d][x]);
+                }
+            } else {
+                t.removed(r[x]);
+                for (int32_t d = 0; d < 5; ++d)
+                    t.added(rows[d][x]);
+                for (int32_t d = -7; d <= 7; ++d)
+                    t.added(r[x + d]);
+            }
+            const uint8_t *col = hists + static_cast<size_t>(x - x0) * kLevels;
+            const int32_t centre = r[x];
+            out[x] = static_cast<uint8_t>(
+                t.settle(9, [&](int32_t l) { return col[l] + rowHist[l] - static_cast<int32_t>(l == centre); }));
         }
     }
     return true;
 }
 
 // Rows 3 .. h - 4, columns 2 .. w - 5: the 13th smallest of the 5 x 5 block
-// around the pixel.
+// around the pixel. Each column's block histogram carries its own rank down
+// the picture.
 bool box_median(const Image *img, Image *res) {
     const int32_t w = img->width, h = img->height;
     const int32_t x0 = 2, x1 = w - 5;
     if (x1 < x0) return true;
-    ColumnHists cols;
-    if (!cols.alloc(static_cast<size_t>(x1 - x0 + 1))) return false;
-    static const uint8_t kEmpty[kFine] = {};
+    const int32_t cols = x1 - x0 + 1;
+    Buffer<uint8_t> block = column_histograms(cols);
+    Buffer<RankTracker> trackers = alloc_buffer<RankTracker>(static_cast<size_t>(cols));
+    if (!block || !trackers) return false;
+    uint8_t *const hists = block.get();
+    RankTracker *const track = trackers.get();
+    for (int32_t i = 0; i < cols; ++i)
+        track[i] = RankTracker{0, 0};
     for (int32_t y = 0; y < 5; ++y) {
         const uint8_t *r = row_ptr(img, y);
-        for (int32_t x = x0; x <= x1; ++x) {
-            const HistRef col = cols.at(static_cast<size_t>(x - x0));
+        for (int32_t x = x0; x <= x1; ++x)
             for (int32_t d = -2; d <= 2; ++d)
-                col.add(r[x + d]);
-        }
+                ++hists[static_cast<size_t>(x - x0) * kLevels + r[x + d]];
     }
     for (int32_t y = 3; y <= h - 4; ++y) {
         const uint8_t *gone = row_ptr(img, y - 3), *come = row_ptr(img, y + 2);
         uint8_t *out = row_ptr(res, y);
         for (int32_t x = x0; x <= x1; ++x) {
-            const HistRef col = cols.at(static_cast<size_t>(x - x0));
+            uint8_t *col = hists + static_cast<size_t>(x - x0) * kLevels;
+            RankTracker &t = track[x - x0];
             for (int32_t d = -2; d <= 2; ++d) {
-                col.remove(gone[x + d]);
-                col.add(come[x + d]);
+                --col[gone[x + d]];
+                t.removed(gone[x + d]);
+                ++col[come[x + d]];
+                t.added(come[x + d]);
             }
-            out[x] = static_cast<uint8_t>(rank_level(col, kEmpty, kEmpty, 12));
+            out[x] = static_cast<uint8_t>(t.settle(12, [col](int32_t l) { return static_cast<int32_t>(col[l]); }));
         }
     }
     return true;
