@@ -22,38 +22,55 @@ namespace pxfx::lines {
 
 void band_threshold(const Image *src, Image *dst) {
     const int32_t w = src->width, h = src->height;
-    uint32_t hist[256] = {};
-    uint8_t map[256];
+    // Four interleaved partial histograms keep runs of equal levels from
+    // serialising on one counter.
+    uint32_t part[4][256] = {};
+    uint32_t hist[256];
     int32_t bandStart = 0;
     for (int32_t y = 0; y < h; ++y) {
         const uint8_t *row = row_ptr(src, y);
-        for (int32_t x = 0; x < w; ++x)
-            ++hist[row[x]];
+        int32_t x = 0;
+        for (; x + 4 <= w; x += 4) {
+            ++part[0][row[x]];
+            ++part[1][row[x + 1]];
+            ++part[2][row[x + 2]];
+            ++part[3][row[x + 3]];
+        }
+        for (; x < w; ++x)
+            ++part[0][row[x]];
         if (y - bandStart != kBandRows - 1 && y != h - 1) continue;
-        const int32_t t = GetMaxHtoThrod2(hist, 0);
         for (int32_t v = 0; v < 256; ++v)
-            map[v] = v <= t ? 1 : 255;
+            hist[v] = part[0][v] + part[1][v] + part[2][v] + part[3][v];
+        const int32_t t = GetMaxHtoThrod2(hist, 0);
         for (int32_t r = bandStart; r <= y; ++r) {
             const uint8_t *in = row_ptr(src, r);
             uint8_t *out = row_ptr(dst, r);
-            for (int32_t x = 0; x < w; ++x)
-                out[x] = map[in[x]];
+            for (int32_t i = 0; i < w; ++i)
+                out[i] = in[i] <= t ? 1 : 255;
         }
-        std::memset(hist, 0, sizeof hist);
+        std::memset(part, 0, sizeof part);
         bandStart = y + 1;
     }
 }
 
-// Scanning left to right in place gives the same result as judging every
-// pixel on the original row: a pixel is only cleared when its right
-// neighbour is not 1, so the next pixel never sees a changed left neighbour
-// that matters.
+// Judging a chunk of pixels on its values before any of them is cleared gives
+// the same result as a strict left-to-right scan: a pixel is only cleared
+// when its right neighbour is not 1, and that neighbour then stays as it is
+// whatever its left neighbour has become.
 void remove_isolated_dots(Image *img) {
+    constexpr int32_t kChunk = 64;
     const int32_t w = img->width;
+    uint8_t judged[kChunk];
     for (int32_t y = 0; y < img->height; ++y) {
         uint8_t *row = row_ptr(img, y);
-        for (int32_t x = 1; x < w - 1; ++x)
-            if (row[x] == 1 && row[x - 1] != 1 && row[x + 1] != 1) row[x] = 255;
+        for (int32_t x = 1; x < w - 1; x += kChunk) {
+            const int32_t n = w - 1 - x < kChunk ? w - 1 - x : kChunk;
+            for (int32_t i = 0; i < n; ++i) {
+                const uint8_t *p = row + x + i;
+                judged[i] = (p[0] == 1) & (p[-1] != 1) & (p[1] != 1) ? 255 : p[0];
+            }
+            std::memcpy(row + x, judged, static_cast<size_t>(n));
+        }
     }
 }
 

@@ -31,21 +31,18 @@ void label_calm_rows(int32_t *a, const int32_t *b, const int32_t *c, int32_t n, 
 // Rows of a band: 0 where the row belongs to no long enough run, else
 // label * 50 - 24 + pixel raised to 255 and kept to its low byte.
 void mark_rows(Image *img, const int32_t *a, const int32_t *c, int32_t rows, int32_t cols) {
-    uint8_t codes[kLabels + 1][256];
-    for (int32_t l = 0; l <= kLabels; ++l)
-        for (int32_t p = 0; p < 256; ++p) {
-            const int32_t v = l * 50 - 24 + p;
-            codes[l][p] = static_cast<uint8_t>(v < 255 ? 255 : v);
-        }
     for (int32_t y = 0; y < rows; ++y) {
         uint8_t *row = row_ptr(img, y);
         if (c[y] == 0) {
             std::memset(row, 0, static_cast<size_t>(cols));
             continue;
         }
-        const uint8_t *code = codes[a[y]];
-        for (int32_t x = 0; x < cols; ++x)
-            row[x] = code[row[x]];
+        // Labels are 0..5, so the sum stays within 0..481.
+        const int32_t base = a[y] * 50 - 24;
+        for (int32_t x = 0; x < cols; ++x) {
+            const int32_t v = base + row[x];
+            row[x] = static_cast<uint8_t>(v < 255 ? 255 : v);
+        }
     }
 }
 

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <climits>
+#include <cstdlib>
 #include <cstring>
 
 #include "core/internal/image_check.hpp"
@@ -103,11 +104,27 @@ void detect_boundary(const Image *img, int32_t *line) {
 void straighten(const Image *img, const int32_t *line, Image *res) {
     const int32_t w = img->width, h = img->height;
     const int64_t rows = std::min(static_cast<int64_t>(h) - line[0], static_cast<int64_t>(h) - line[w - 1]);
+    // A nearly level line changes its value rarely: columns sharing a value
+    // are then copied as pieces of their source row.
+    const int64_t changes = std::abs(static_cast<int64_t>(line[w - 1]) - line[0]);
+    const bool pieces = changes * 64 <= w;
     for (int64_t r = 0; r < rows; ++r) {
         uint8_t *out = row_ptr(res, static_cast<int32_t>(r));
-        for (int32_t c = 0; c < w; ++c) {
-            const int64_t sr = line[c] + r;
-            out[c] = row_ptr(img, static_cast<int32_t>(sr < 0 ? 0 : sr))[c];
+        if (pieces) {
+            for (int32_t c = 0; c < w;) {
+                int32_t e = c + 1;
+                while (e < w && line[e] == line[c])
+                    ++e;
+                const int64_t sr = line[c] + r;
+                std::memcpy(out + c, row_ptr(img, static_cast<int32_t>(sr < 0 ? 0 : sr)) + c,
+                            static_cast<size_t>(e - c));
+                c = e;
+            }
+        } else {
+            for (int32_t c = 0; c < w; ++c) {
+                const int64_t sr = line[c] + r;
+                out[c] = row_ptr(img, static_cast<int32_t>(sr < 0 ? 0 : sr))[c];
+            }
         }
     }
 }

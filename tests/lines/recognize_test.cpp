@@ -2,6 +2,7 @@
 // and the vertical resampler against its formula.
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <vector>
 
 #include "lines/lines_internal.hpp"
@@ -11,12 +12,12 @@ using namespace pxtest;
 
 namespace {
 
-// Dark (20) above the boundary row 30 + x / 8, bright (230) from it down.
-Owned tilted(int32_t w, int32_t h) {
+// Dark (20) above the boundary row top + x / run, bright (230) from it down.
+Owned tilted(int32_t w, int32_t h, int32_t run = 8, int32_t top = 30) {
     Owned im = make(w, h, 8);
     for (int32_t y = 0; y < h; ++y)
         for (int32_t x = 0; x < w; ++x)
-            im->bits[y * im->pitch + x] = y < 30 + x / 8 ? 20 : 230;
+            im->bits[y * im->pitch + x] = y < top + x / run ? 20 : 230;
     return im;
 }
 
@@ -40,6 +41,25 @@ TEST(Straighten, TiltedBoundaryBecomesTheTopRow) {
             else
                 ASSERT_EQ(v, r < 46 ? 230 : 255) << r << "," << c;
         }
+}
+
+TEST(Straighten, MatchesClampedReadsForSteepAndLevelLines) {
+    const int32_t cases[][4] = {{200, 100, 8, 30}, {700, 60, 200, 20}, {200, 150, 2, -10}};
+    for (auto [w, h, run, top] : cases) {
+        Owned im = tilted(w, h, run, top);
+        std::vector<int32_t> line(static_cast<size_t>(w));
+        pxfx::lines::detect_boundary(im.get(), line.data());
+        if (top < 0) {
+            EXPECT_LT(line[0], 0); // the clamped rows are reached
+        }
+        Owned got = make(w, h, 8), want = make(w, h, 8);
+        pxfx::lines::straighten(im.get(), line.data(), got.get());
+        const int32_t rows = std::min(h - line[0], h - line[w - 1]);
+        for (int32_t r = 0; r < rows; ++r)
+            for (int32_t c = 0; c < w; ++c)
+                SetPixelIndex(want.get(), c, r, GetPixelIndex(im.get(), c, line[c] + r));
+        EXPECT_EQ(diff(got.get(), want.get()), "") << w << "x" << h;
+    }
 }
 
 TEST(Straighten, EdgeAtColumn65ShiftsTheLineToTheLastSearchedRow) {
