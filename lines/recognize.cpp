@@ -51,7 +51,7 @@ namespace pxfx::lines {
 
 // Every intermediate value is bounded by the picture: with width >= 121,
 // |(c + 1 - 66) (r2 - r1)| < width * height < 2^31 and |line[c] - r1| is at
-// most 56 |r2 - r1|, so the rows fit 32 bits; products are formed in 64 bits
+// most 65 |r2 - r1| < 65 * 2^31 / 121, so the rows fit 32 bits; products are formed in 64 bits
 // all the same, and the level sum of the refinement is exact.
 void detect_boundary(const Image *img, int32_t *line) {
     const int32_t w = img->width, h = img->height;

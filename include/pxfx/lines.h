@@ -42,10 +42,12 @@ PXFX_API int32_t BinImg(Image *img, Image **out);
  * unchanged, when its scratch memory cannot be had. */
 PXFX_API int32_t DetectLines(Image *img);
 /* Otsu threshold 60..255 of a 256-bin histogram, 255 when the spread is small.
- * total 0 means the sum of the counts. Sums, running counts and level x count
- * products are 32-bit values (wrapping for counts beyond 2^31); a mark the
- * running count never reaches counts as level 256. A null histogram or a
- * total below 1 gives 255. */
+ * total 0 means the sum of the counts. The sum and the running count are
+ * 32-bit values and level x count products are formed modulo 2^32, as plain
+ * 32-bit arithmetic gives (this matters only past 2^31 samples, or past
+ * 2^32 / 255 at one level); a mark the running count never reaches counts as
+ * level 256. A null histogram, or a total (given or summed) of 0 or less,
+ * gives 255. */
 PXFX_API int32_t GetMaxHtoThrod2(const uint32_t hist[256], int32_t total);
 /* Longest run of equal labels (with its deliberate quirks); first/last may be null.
  * The first label's value is the first run's start index; a value outside
