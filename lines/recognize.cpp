@@ -104,27 +104,34 @@ void detect_boundary(const Image *img, int32_t *line) {
 void straighten(const Image *img, const int32_t *line, Image *res) {
     const int32_t w = img->width, h = img->height;
     const int64_t rows = std::min(static_cast<int64_t>(h) - line[0], static_cast<int64_t>(h) - line[w - 1]);
+    auto source = [&](int32_t c, int64_t r) {
+        const int64_t sr = line[c] + r;
+        return row_ptr(img, static_cast<int32_t>(sr < 0 ? 0 : sr));
+    };
     // A nearly level line changes its value rarely: columns sharing a value
-    // are then copied as pieces of their source row.
-    const int64_t changes = std::abs(static_cast<int64_t>(line[w - 1]) - line[0]);
-    const bool pieces = changes * 64 <= w;
-    for (int64_t r = 0; r < rows; ++r) {
-        uint8_t *out = row_ptr(res, static_cast<int32_t>(r));
-        if (pieces) {
+    // are copied as pieces of their source row.
+    if (std::abs(static_cast<int64_t>(line[w - 1]) - line[0]) * 64 <= w) {
+        for (int64_t r = 0; r < rows; ++r) {
+            uint8_t *out = row_ptr(res, static_cast<int32_t>(r));
             for (int32_t c = 0; c < w;) {
                 int32_t e = c + 1;
                 while (e < w && line[e] == line[c])
                     ++e;
-                const int64_t sr = line[c] + r;
-                std::memcpy(out + c, row_ptr(img, static_cast<int32_t>(sr < 0 ? 0 : sr)) + c,
-                            static_cast<size_t>(e - c));
+                std::memcpy(out + c, source(c, r) + c, static_cast<size_t>(e - c));
                 c = e;
             }
-        } else {
-            for (int32_t c = 0; c < w; ++c) {
-                const int64_t sr = line[c] + r;
-                out[c] = row_ptr(img, static_cast<int32_t>(sr < 0 ? 0 : sr))[c];
-            }
+        }
+        return;
+    }
+    // A steeper line reads many source rows per output row: going down the
+    // picture in strips of 64 columns keeps those rows in cache.
+    constexpr int32_t kStrip = 64;
+    for (int32_t c0 = 0; c0 < w; c0 += kStrip) {
+        const int32_t c1 = std::min(c0 + kStrip, w);
+        for (int64_t r = 0; r < rows; ++r) {
+            uint8_t *out = row_ptr(res, static_cast<int32_t>(r));
+            for (int32_t c = c0; c < c1; ++c)
+                out[c] = source(c, r)[c];
         }
     }
 }
