@@ -32,7 +32,7 @@ void check_page(std::initializer_list<int32_t> lineRows, const std::vector<int32
 
 } // namespace
 
-TEST(DetectLines, MarksBandsBetweenLinesWithCyclingCodes) {
+TEST(DetectLines, MarksLineBandsOnSyntheticPagesAndSurvivesTinyOnes) {
     // Line rows and their neighbours become 0; the row after a short run of
     // busy rows never starts a band; codes go 25, 75, 125, 175, 225, 25.
     check_page({20, 40, 60, 80, 100}, {0,  18, 25,  19, 21, 0, 22, 38, 75,  39, 41,  0, 42,  58,  125, 59,  61,  0,
@@ -46,9 +46,7 @@ TEST(DetectLines, MarksBandsBetweenLinesWithCyclingCodes) {
     check_page({20, 40, 60, 80, 100}, {0,  8,  25,  9,  21, 0, 22, 38, 125, 39, 41,  0, 42,  58,  175, 59,  61,  0,
                                        62, 78, 225, 79, 81, 0, 82, 98, 25,  99, 101, 0, 102, 117, 75,  118, 118, 0},
                true);
-}
-
-TEST(DetectLines, TinyAndWrongPlanesAreSafe) {
+    // Tiny and wrong planes.
     for (auto [w, h] : {std::pair{1, 1}, {3, 2}, {12, 3}, {11, 40}, {40, 2}})
         EXPECT_EQ(DetectLines(random_image(w, h, 8, 5).get()), 1) << w << "x" << h;
     EXPECT_EQ(DetectLines(make(20, 20, 24).get()), 0);

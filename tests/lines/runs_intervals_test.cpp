@@ -39,7 +39,6 @@ TEST(CheckMaxSame, RunsStartAtTheFirstLabelValue) {
     // A first value that is no index starts at index 0.
     EXPECT_EQ(longest({7, 7, 7, 1, 1}), (Ints{2, 0, 3}));
     EXPECT_EQ(longest({-3, -3, -3, 0}), (Ints{2, 0, 3}));
-    EXPECT_EQ(longest({7}), (Ints{0, -9, -9}));
     int32_t first = -9;
     EXPECT_EQ(CheckMaxSame(Ints{1, 1, 1}.data(), 3, &first, nullptr), 1);
     EXPECT_EQ(first, -9);
