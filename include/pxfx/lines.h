@@ -7,6 +7,10 @@
  * null the result replaces the input's pixels; with *out null the new image is
  * handed over (caller frees it); otherwise it is copied into *out.
  * Interval lists are arrays of (start, end) pairs of int32_t, 2 values each.
+ * Every image function here refuses (0, or null) a null image, an image
+ * without pixels or with bad geometry, and any bit count other than 8 (except
+ * RGB_Reverse), and fails with 0 (null) when memory runs out; working memory
+ * is released on every path.
  */
 #ifndef PXFX_LINES_H
 #define PXFX_LINES_H
@@ -58,7 +62,11 @@ PXFX_API int32_t CheckMaxSame(const int32_t *labels, int32_t n, int32_t *first, 
  * Lengths and gaps are exact for any values. Null list or n < 1 give 0. */
 PXFX_API int32_t CombineMinSpace(int32_t *intervals, int32_t n, int32_t minGap);
 /* Finds the interval of a sorted list overlapping [*start, *end]; 1 when it covers half.
- * Overlaps and lengths are exact for any values. Null start or end: 0, nothing
+ * An interval reaching past *end from at or before it is taken at once (1);
+ * otherwise the one beyond *end with the largest overlap (the nearest, as the
+ * overlaps there are negative) is reported, 1 when that overlap is at least
+ * half the query. An interval starting at *end and ending by it stops the
+ * walk. Overlaps and lengths are exact for any values. Null start or end: 0, nothing
  * written; a null list or n < 1: *start = *end = 0, result 0. */
 PXFX_API int32_t CheckLapOver(const int32_t *intervals, int32_t n, int32_t *start, int32_t *end);
 /* Vertical edge marker at distance 2 rows. 1 or 0. Pixels it does not visit
