@@ -7,6 +7,10 @@
  * null the result replaces the input's pixels; with *out null the new image is
  * handed over (caller frees it); otherwise it is copied into *out.
  * Interval lists are arrays of (start, end) pairs of int32_t, 2 values each.
+ * Every image function here refuses (0, or null) a null image, an image
+ * without pixels or with bad geometry, and any bit count other than 8 (except
+ * RGB_Reverse), and fails with 0 (null) when memory runs out; working memory
+ * is released on every path.
  */
 #ifndef PXFX_LINES_H
 #define PXFX_LINES_H
@@ -17,31 +21,68 @@
 extern "C" {
 #endif
 
-/* Straightens the plane along its detected boundary and band-binarises it. 1 or 0. */
+/* Straightens the plane along its detected boundary and band-binarises it. 1 or 0.
+ * Planes narrower than 121 or lower than 13 pixels are refused (0): the sample
+ * strips read columns 50..79 and width - 70 .. width - 41 from row 10 on, and
+ * the boundary line needs a column between 65 and width - 55. Rows that the
+ * boundary refinement would read below the picture read as its last row; a
+ * straightened column whose source row lies above the picture reads row 0.
+ * A record in *out without pixels is left as it is (1 is still returned). */
 PXFX_API int32_t RecognizeYUV(Image *img, Image **out);
 /* RecognizeYUV when img is not null. */
 PXFX_API void ImgDecode(Image *img, Image **out);
-/* Vertical linear resampling by factor (2..49), then RecognizeYUV on it; new image or null. */
+/* Vertical linear resampling by factor (2..49), then RecognizeYUV on it; new image or null.
+ * The last row, which lies exactly on the last source row, is a copy of it.
+ * When RecognizeYUV refuses the resampled plane it is returned as it is. */
 PXFX_API Image *MyResample2(Image *img, int32_t factor);
-/* Band thresholding in bands of 37 rows, dot removal and line marking. 1 or 0. */
+/* Band thresholding in bands of 37 rows, dot removal and line marking. 1 or 0.
+ * With out not null the slot's image is released and replaced by a new plane
+ * that receives the work (the input when that allocation fails); a slot that
+ * already holds img works in place instead. Returns DetectLines' result, so 0
+ * also when its scratch memory cannot be had. */
 PXFX_API int32_t BinImg(Image *img, Image **out);
-/* Marks line bands of a binarised plane with band codes, in place. 1 or 0. */
+/* Marks line bands of a binarised plane with band codes, in place. 1 or 0.
+ * A plane of one row has nothing to mark (1). Returns 0, leaving the plane
+ * unchanged, when its scratch memory cannot be had. */
 PXFX_API int32_t DetectLines(Image *img);
-/* Otsu threshold 60..255 of a 256-bin histogram, 255 when the spread is small. */
+/* Otsu threshold 60..255 of a 256-bin histogram, 255 when the spread is small.
+ * total 0 means the sum of the counts. The sum and the running count are
+ * 32-bit values and level x count products are formed modulo 2^32, as plain
+ * 32-bit arithmetic gives (this matters only past 2^31 samples, or past
+ * 2^32 / 255 at one level); a mark the running count never reaches counts as
+ * level 256. A null histogram, or a total (given or summed) of 0 or less,
+ * gives 255. */
 PXFX_API int32_t GetMaxHtoThrod2(const uint32_t hist[256], int32_t total);
-/* Longest run of equal labels (with its deliberate quirks); first/last may be null. */
+/* Longest run of equal labels (with its deliberate quirks); first/last may be null.
+ * The first label's value is the first run's start index; a value outside
+ * 0..n-1 starts it at index 0. first/last are written only when both are
+ * given. Null labels or n < 2 give 0. */
 PXFX_API int32_t CheckMaxSame(const int32_t *labels, int32_t n, int32_t *first, int32_t *last);
-/* Merges intervals closer than minGap and drops short ones in place; returns the count kept. */
+/* Merges intervals closer than minGap and drops short ones in place; returns the count kept.
+ * Lengths and gaps are exact for any values. Null list or n < 1 give 0. */
 PXFX_API int32_t CombineMinSpace(int32_t *intervals, int32_t n, int32_t minGap);
-/* Finds the interval of a sorted list overlapping [*start, *end]; 1 when it covers half. */
+/* Finds the interval of a sorted list overlapping [*start, *end]; 1 when it covers half.
+ * An interval reaching past *end from at or before it is taken at once (1);
+ * otherwise the one beyond *end with the largest overlap (the nearest, as the
+ * overlaps there are negative) is reported, 1 when that overlap is at least
+ * half the query. An interval starting at *end and ending by it stops the
+ * walk. Overlaps and lengths are exact for any values. Null start or end: 0, nothing
+ * written; a null list or n < 1: *start = *end = 0, result 0. */
 PXFX_API int32_t CheckLapOver(const int32_t *intervals, int32_t n, int32_t *start, int32_t *end);
-/* Vertical edge marker at distance 2 rows. 1 or 0. */
+/* Vertical edge marker at distance 2 rows. 1 or 0. Pixels it does not visit
+ * (first and last column, last two rows) are 255. */
 PXFX_API int32_t MyEdge(Image *img, Image **out);
-/* Cross-shaped median (5 vertical, 15 horizontal). 1 or 0. */
+/* Cross-shaped median (5 vertical, 15 horizontal) of rows 3 .. height - 4 and
+ * columns 7 .. width - 9; other pixels of the result are 255. 1 or 0. Planes
+ * lower than 5 rows are refused (0); narrower than 16 columns they yield an
+ * all-255 result (1). */
 PXFX_API int32_t MyFliter(Image *img, Image **out);
-/* 5 x 5 median. 1 or 0. */
+/* 5 x 5 median of rows 3 .. height - 4 and columns 2 .. width - 5; other
+ * pixels are 255. 1 or 0. Planes lower than 5 rows are refused (0); narrower
+ * than 7 columns they yield an all-255 result (1). */
 PXFX_API int32_t MyFliter1(Image *img, Image **out);
-/* Swaps bytes 0 and 2 of every 24- or 32-bit pixel. 1, or 0 for no pixels. */
+/* Swaps bytes 0 and 2 of every 24- or 32-bit pixel; other bit counts stay as
+ * they are. 1, or 0 for no pixels (or bad geometry). */
 PXFX_API int32_t RGB_Reverse(Image *img);
 /* Empty entry point kept for compatibility. */
 PXFX_API void ImgLineDecode(void);

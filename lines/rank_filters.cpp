@@ -1,0 +1,177 @@
+// Rank filters on 8-bit planes (cross-shaped and 5 x 5 medians) and the
+// vertical edge marker.
+//
+// Both medians keep one 256-level histogram per column and slide it down one
+// row per output row. The rank is tracked rather than searched: the level
+// found for the previous window is kept with the number of samples below it,
+// and after each update it walks only as far as the window's values moved,
+// which on camera pictures is a few levels.
+#include <pxfx/lines.h>
+
+#include <cstring>
+
+#include "core/internal/image_check.hpp"
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+#include "lines/lines_internal.hpp"
+
+using namespace pxfx;
+
+namespace {
+
+constexpr size_t kLevels = 256;
+
+// The smallest level whose running count exceeds `rank`, kept with the number
+// of samples below it. count(l) gives the samples at level l; the window
+// always holds more than `rank` samples.
+struct RankTracker {
+    int32_t level;
+    int32_t below;
+    void removed(uint8_t v) { below -= v < level; }
+    void added(uint8_t v) { below += v < level; }
+    template <class Count> int32_t settle(int32_t rank, Count count) {
+        while (below > rank)
+            below -= count(--level);
+        while (below + count(level) <= rank)
+            below += count(level++);
+        return level;
+    }
+};
+
+// Counts per column of a range, in one block. Counts stay below 256.
+Buffer<uint8_t> column_histograms(int32_t cols) {
+    return alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(cols), kLevels));
+}
+
+// Rows 3 .. h - 4, columns 7 .. w - 9: the 10th smallest of the column's five
+// pixels of rows y - 2 .. y + 2 and the fourteen other pixels of row y in
+// columns x - 7 .. x + 7. The rank is tracked along the row.
+bool cross_median(const Image *img, Image *res) {
+    const int32_t w = img->width, h = img->height;
+    const int32_t x0 = 7, x1 = w - 9;
+    if (x1 < x0) return true;
+    Buffer<uint8_t> block = column_histograms(x1 - x0 + 1);
+    if (!block) return false;
+    uint8_t *const hists = block.get();
+    for (int32_t y = 0; y < 5; ++y) {
+        const uint8_t *r = row_ptr(img, y);
+        for (int32_t x = x0; x <= x1; ++x)
+            ++hists[static_cast<size_t>(x - x0) * kLevels + r[x]];
+    }
+    uint8_t rowHist[kLevels];
+    for (int32_t y = 3; y <= h - 4; ++y) {
+        const uint8_t *rows[5];
+        for (int32_t d = 0; d < 5; ++d)
+            rows[d] = row_ptr(img, y - 2 + d);
+        const uint8_t *gone = row_ptr(img, y - 3), *r = rows[2];
+        for (int32_t x = x0; x <= x1; ++x) {
+            uint8_t *col = hists + static_cast<size_t>(x - x0) * kLevels;
+            --col[gone[x]];
+            ++col[rows[4][x]];
+        }
+        std::memset(rowHist, 0, sizeof rowHist);
+        for (int32_t x = x0 - 7; x <= x0 + 7; ++x)
+            ++rowHist[r[x]];
+        RankTracker t{0, 0};
+        uint8_t *out = row_ptr(res, y);
+        for (int32_t x = x0; x <= x1; ++x) {
+            if (x > x0) {
+                // Window x - 7 .. x + 7 from x - 8 .. x + 6; the old centre
+                // comes back and the new one leaves; the column changes.
+                t.removed(r[x - 8]);
+                t.added(r[x + 7]);
+                --rowHist[r[x - 8]];
+                ++rowHist[r[x + 7]];
+                t.added(r[x - 1]);
+                t.removed(r[x]);
+                for (int32_t d = 0; d < 5; ++d) {
+                    t.removed(rows[d][x - 1]);
+                    t.added(rows[d][x]);
+                }
+            } else {
+                t.removed(r[x]);
+                for (int32_t d = 0; d < 5; ++d)
+                    t.added(rows[d][x]);
+                for (int32_t d = -7; d <= 7; ++d)
+                    t.added(r[x + d]);
+            }
+            const uint8_t *col = hists + static_cast<size_t>(x - x0) * kLevels;
+            const int32_t centre = r[x];
+            out[x] = static_cast<uint8_t>(
+                t.settle(9, [&](int32_t l) { return col[l] + rowHist[l] - static_cast<int32_t>(l == centre); }));
+        }
+    }
+    return true;
+}
+
+// Rows 3 .. h - 4, columns 2 .. w - 5: the 13th smallest of the 5 x 5 block
+// around the pixel. Each column's block histogram carries its own rank down
+// the picture.
+bool box_median(const Image *img, Image *res) {
+    const int32_t w = img->width, h = img->height;
+    const int32_t x0 = 2, x1 = w - 5;
+    if (x1 < x0) return true;
+    const int32_t cols = x1 - x0 + 1;
+    Buffer<uint8_t> block = column_histograms(cols);
+    Buffer<RankTracker> trackers = alloc_buffer<RankTracker>(static_cast<size_t>(cols));
+    if (!block || !trackers) return false;
+    uint8_t *const hists = block.get();
+    RankTracker *const track = trackers.get();
+    for (int32_t i = 0; i < cols; ++i)
+        track[i] = RankTracker{0, 0};
+    for (int32_t y = 0; y < 5; ++y) {
+        const uint8_t *r = row_ptr(img, y);
+        for (int32_t x = x0; x <= x1; ++x)
+            for (int32_t d = -2; d <= 2; ++d)
+                ++hists[static_cast<size_t>(x - x0) * kLevels + r[x + d]];
+    }
+    for (int32_t y = 3; y <= h - 4; ++y) {
+        const uint8_t *gone = row_ptr(img, y - 3), *come = row_ptr(img, y + 2);
+        uint8_t *out = row_ptr(res, y);
+        for (int32_t x = x0; x <= x1; ++x) {
+            uint8_t *col = hists + static_cast<size_t>(x - x0) * kLevels;
+            RankTracker &t = track[x - x0];
+            for (int32_t d = -2; d <= 2; ++d) {
+                --col[gone[x + d]];
+                t.removed(gone[x + d]);
+                ++col[come[x + d]];
+                t.added(come[x + d]);
+            }
+            out[x] = static_cast<uint8_t>(t.settle(12, [col](int32_t l) { return static_cast<int32_t>(col[l]); }));
+        }
+    }
+    return true;
+}
+
+template <class Filter> int32_t run_median(Image *img, Image **out, Filter filter) {
+    if (!is_plane(img) || img->height < 5) return 0;
+    ImagePtr res = make_image(img->width, img->height, 8);
+    if (!res || !filter(img, res.get())) return 0;
+    return lines::deliver(img, out, std::move(res));
+}
+
+} // namespace
+
+extern "C" {
+
+int32_t MyEdge(Image *img, Image **out) {
+    if (!is_plane(img)) return 0;
+    ImagePtr res = make_image(img->width, img->height, 8);
+    if (!res) return 0;
+    const int32_t w = img->width;
+    for (int32_t y = 0; y + 2 < img->height; ++y) {
+        const uint8_t *ra = row_ptr(img, y), *rb = row_ptr(img, y + 2);
+        uint8_t *o = row_ptr(res.get(), y);
+        for (int32_t x = 1; x < w - 1; ++x) {
+            const int32_t a = ra[x], b = rb[x];
+            o[x] = a > b + 9 ? 0 : (b > a + 9 ? 255 : static_cast<uint8_t>(a));
+        }
+    }
+    return lines::deliver(img, out, std::move(res));
+}
+
+int32_t MyFliter(Image *img, Image **out) { return run_median(img, out, cross_median); }
+
+int32_t MyFliter1(Image *img, Image **out) { return run_median(img, out, box_median); }
+
+} // extern "C"

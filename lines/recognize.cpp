@@ -1,0 +1,195 @@
+// Straightening of a luma plane along its detected boundary, the vertical
+// resampler that feeds it, and the entry points around them.
+#include <pxfx/lines.h>
+
+#include <algorithm>
+#include <climits>
+#include <cstdlib>
+#include <cstring>
+
+#include "core/internal/image_check.hpp"
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+#include "lines/lines_internal.hpp"
+
+using namespace pxfx;
+
+namespace {
+
+constexpr int32_t kStripWidth = 30;
+constexpr int32_t kFirstRow = 10;
+constexpr int32_t kMinDark = 15;
+// The boundary line passes through the strip centres, columns 65 and
+// width - 55.
+constexpr int32_t kLeftStrip = 50, kLeftCentre = 65;
+constexpr int32_t kRightStripFromEnd = 70, kRightCentreFromEnd = 55;
+
+// First row from kFirstRow on where fewer than kMinDark pixels of the strip
+// are darker than t; height - 2 when every row is dark enough.
+int32_t boundary_row(const Image *img, int32_t x0, int32_t t) {
+    const int32_t h = img->height;
+    for (int32_t y = kFirstRow; y < h - 2; ++y) {
+        const uint8_t *r = row_ptr(img, y) + x0;
+        int32_t dark = 0;
+        for (int32_t i = 0; i < kStripWidth; ++i)
+            dark += r[i] < t;
+        if (dark < kMinDark) return y;
+    }
+    return h - 2;
+}
+
+int64_t row_sum(const uint8_t *r, int32_t x0, int32_t x1) {
+    int64_t s = 0;
+    for (int32_t x = x0; x < x1; ++x)
+        s += r[x];
+    return s;
+}
+
+} // namespace
+
+namespace pxfx::lines {
+
+// Every intermediate value is bounded by the picture: with width >= 121,
+// |(c + 1 - 66) (r2 - r1)| < width * height < 2^31 and |line[c] - r1| is at
+// most 65 |r2 - r1| < 65 * 2^31 / 121, so the rows fit 32 bits; products are formed in 64 bits
+// all the same, and the level sum of the refinement is exact.
+void detect_boundary(const Image *img, int32_t *line) {
+    const int32_t w = img->width, h = img->height;
+    const int32_t right = w - kRightStripFromEnd;
+    uint32_t histL[256] = {}, histR[256] = {};
+    for (int32_t y = kFirstRow; y <= h - 3; ++y) {
+        const uint8_t *r = row_ptr(img, y);
+        for (int32_t i = 0; i < kStripWidth; ++i) {
+            ++histL[r[kLeftStrip + i]];
+            ++histR[r[right + i]];
+        }
+    }
+    const int32_t r1 = boundary_row(img, kLeftStrip, GetMaxHtoThrod2(histL, 0));
+    const int32_t r2 = boundary_row(img, right, GetMaxHtoThrod2(histR, 0));
+
+    const int32_t mid = w - kRightCentreFromEnd;
+    const int64_t d = r2 - r1, span = mid - kLeftCentre;
+    for (int32_t c = 0; c < w; ++c)
+        line[c] = static_cast<int32_t>(r1 + (static_cast<int64_t>(c + 1) * d - (kLeftCentre + 1) * d) / span);
+
+    // Mean level around the boundary; rows below the picture read as its last
+    // row.
+    const int32_t top = std::max(std::min(r1, r2) - 8, 0), bottom = std::max(r1, r2);
+    int64_t sum = 0;
+    for (int32_t y = top; y <= bottom + 7; ++y)
+        sum += row_sum(row_ptr(img, std::min(y, h - 1)), kLeftCentre, mid);
+    const int64_t mean = sum / ((static_cast<int64_t>(bottom) + 8 - top) * span);
+
+    // The edge test looks at the same pixel pair, rows top and top + 1 of
+    // column 65, for every column and row it walks: when the pair is an
+    // upward edge every column's edge is the last row walked, bottom + 6,
+    // otherwise no column has one. (top <= height - 10, so top + 1 exists.)
+    const uint8_t above = row_ptr(img, top)[kLeftCentre], below = row_ptr(img, top + 1)[kLeftCentre];
+    if (!(above < mean && below >= mean)) return;
+    const int64_t edge = static_cast<int64_t>(bottom) + 6;
+    int64_t off = 0;
+    for (int32_t x = kLeftCentre; x < mid; ++x)
+        off += edge - line[x];
+    const int32_t shift = static_cast<int32_t>((off + span / 2) / span);
+    if (shift != 0)
+        for (int32_t c = 0; c < w; ++c)
+            line[c] += shift;
+}
+
+// line[] is monotone in c (a truncated linear function plus a constant), so
+// its largest value is at one end and every source row line[c] + r of the
+// rows copied lies below the last row. Column 65 holds r1 >= 0, so at most
+// `height` rows are copied. Only ends extrapolated above the picture can ask
+// for a negative row; those read row 0.
+void straighten(const Image *img, const int32_t *line, Image *res) {
+    const int32_t w = img->width, h = img->height;
+    const int64_t rows = std::min(static_cast<int64_t>(h) - line[0], static_cast<int64_t>(h) - line[w - 1]);
+    auto source = [&](int32_t c, int64_t r) {
+        const int64_t sr = line[c] + r;
+        return row_ptr(img, static_cast<int32_t>(sr < 0 ? 0 : sr));
+    };
+    // A nearly level line changes its value rarely: columns sharing a value
+    // are copied as pieces of their source row.
+    if (std::abs(static_cast<int64_t>(line[w - 1]) - line[0]) * 64 <= w) {
+        for (int64_t r = 0; r < rows; ++r) {
+            uint8_t *out = row_ptr(res, static_cast<int32_t>(r));
+            for (int32_t c = 0; c < w;) {
+                int32_t e = c + 1;
+                while (e < w && line[e] == line[c])
+                    ++e;
+                std::memcpy(out + c, source(c, r) + c, static_cast<size_t>(e - c));
+                c = e;
+            }
+        }
+        return;
+    }
+    // A steeper line reads many source rows per output row: going down the
+    // picture in strips of 64 columns keeps those rows in cache.
+    constexpr int32_t kStrip = 64;
+    for (int32_t c0 = 0; c0 < w; c0 += kStrip) {
+        const int32_t c1 = std::min(c0 + kStrip, w);
+        for (int64_t r = 0; r < rows; ++r) {
+            uint8_t *out = row_ptr(res, static_cast<int32_t>(r));
+            for (int32_t c = c0; c < c1; ++c)
+                out[c] = source(c, r)[c];
+        }
+    }
+}
+
+} // namespace pxfx::lines
+
+extern "C" {
+
+int32_t RecognizeYUV(Image *img, Image **out) {
+    if (!is_plane(img)) return 0;
+    if (img->width < lines::kMinRecognizeWidth || img->height < lines::kMinRecognizeHeight) return 0;
+    ImagePtr res = make_image(img->width, img->height, 8);
+    if (!res) return 0;
+    std::memset(res->bits, 0, block_bytes(res.get()));
+    Buffer<int32_t> line = alloc_buffer<int32_t>(static_cast<size_t>(img->width));
+    if (!line) return 0;
+    lines::detect_boundary(img, line.get());
+    lines::straighten(img, line.get(), res.get());
+    line.reset();
+    BinImg(res.get(), nullptr);
+    return lines::deliver(img, out, std::move(res));
+}
+
+void ImgDecode(Image *img, Image **out) {
+    if (img != nullptr) RecognizeYUV(img, out);
+}
+
+// new(y f + k) = (img(y) (f - k) + img(y + 1) k + (f + 1) / 2) / f. The
+// division is a multiplication by m = 2^23 / f + 1 and a shift: for numerators
+// n <= 255 f + 25 the error n (m - 2^23 / f) / 2^23 stays below 0.002, less
+// than the 1 / f that separates n / f from the next integer, and n m < 2^32.
+Image *MyResample2(Image *img, int32_t factor) {
+    if (factor < 2 || factor > 49 || !is_plane(img)) return nullptr;
+    const int32_t w = img->width, h = img->height;
+    const int64_t newHeight = static_cast<int64_t>(factor) * (h - 1) + 1;
+    if (newHeight > INT32_MAX) return nullptr;
+    Image *res = malloc_Image(w, static_cast<int32_t>(newHeight), 8);
+    if (res == nullptr) return nullptr;
+    const uint32_t f = static_cast<uint32_t>(factor), round = (f + 1) >> 1, m = (1u << 23) / f + 1;
+    for (int32_t y = 0; y < h - 1; ++y) {
+        const uint8_t *a = row_ptr(img, y), *b = row_ptr(img, y + 1);
+        for (uint32_t k = 0; k < f; ++k) {
+            uint8_t *o = row_ptr(res, static_cast<int32_t>(static_cast<uint32_t>(y) * f + k));
+            const uint32_t wa = f - k;
+            for (int32_t x = 0; x < w; ++x)
+                o[x] = static_cast<uint8_t>(((a[x] * wa + b[x] * k + round) * m) >> 23);
+        }
+    }
+    // The last row lies exactly on the last source row.
+    std::memcpy(row_ptr(res, res->height - 1), row_ptr(img, h - 1), static_cast<size_t>(w));
+    RecognizeYUV(res, nullptr);
+    return res;
+}
+
+void ImgLineDecode(void) {}
+
+void CheckAvailableBlock(void) {}
+
+void RebuildImg(void) {}
+
+} // extern "C"

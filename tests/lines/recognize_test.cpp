@@ -1,0 +1,87 @@
+// Straightening along tilted boundaries, RecognizeYUV's limits and delivery,
+// and the vertical resampler against its formula.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <vector>
+
+#include "lines/lines_internal.hpp"
+#include "support/test_images.hpp"
+
+using namespace pxtest;
+
+namespace {
+
+// Dark (20) above the boundary row top + x / run, bright (230) from it down.
+Owned tilted(int32_t w, int32_t h, int32_t run = 8, int32_t top = 30) {
+    Owned im = make(w, h, 8);
+    for (int32_t y = 0; y < h; ++y)
+        for (int32_t x = 0; x < w; ++x)
+            im->bits[y * im->pitch + x] = y < top + x / run ? 20 : 230;
+    return im;
+}
+
+std::vector<int32_t> boundary(const Image *im) {
+    std::vector<int32_t> line(static_cast<size_t>(im->width));
+    pxfx::lines::detect_boundary(im, line.data());
+    return line;
+}
+
+} // namespace
+
+TEST(Straighten, FollowsTheStripBoundariesAndReadsClamped) {
+    // Boundary rows 38 at column 65 and 48 at column 145. When rows 30 (top)
+    // and 31 of column 65 form an edge, the line moves by the mean distance
+    // from row 48 + 6 to it over columns 65..144, 11.5.
+    Owned im = tilted(200, 100);
+    for (int32_t shift : {0, 12}) {
+        const std::vector<int32_t> line = boundary(im.get());
+        for (int32_t c = 0; c < 200; ++c)
+            ASSERT_EQ(line[c], 38 + shift + (c - 65) / 8) << c;
+        im->bits[31 * im->pitch + 65] = 230;
+    }
+    // Steep, nearly level, and reaching above the picture at the left end.
+    const int32_t cases[][4] = {{200, 100, 8, 30}, {700, 60, 200, 20}, {200, 150, 2, -10}};
+    for (auto [w, h, run, top] : cases) {
+        Owned im = tilted(w, h, run, top), got = make(w, h, 8), want = make(w, h, 8);
+        const std::vector<int32_t> l = boundary(im.get());
+        pxfx::lines::straighten(im.get(), l.data(), got.get());
+        for (int32_t r = 0; r < std::min(h - l[0], h - l[w - 1]); ++r)
+            for (int32_t c = 0; c < w; ++c)
+                SetPixelIndex(want.get(), c, r, GetPixelIndex(im.get(), c, l[c] + r));
+        EXPECT_EQ(diff(got.get(), want.get()), "") << w << "x" << h;
+        EXPECT_EQ(top < 0, l[0] < 0);
+    }
+}
+
+TEST(RecognizeYUV, RefusesPlanesSmallerThanItsStripsAndDelivers) {
+    EXPECT_EQ(RecognizeYUV(tilted(120, 100).get(), nullptr), 0);
+    EXPECT_EQ(RecognizeYUV(tilted(200, 12).get(), nullptr), 0);
+    EXPECT_EQ(RecognizeYUV(make(200, 100, 24).get(), nullptr), 0);
+    for (auto [w, h] : {std::pair{121, 13}, {131, 40}, {200, 100}}) {
+        Owned im = random_image(w, h, 8, static_cast<uint32_t>(w)), inPlace = clone(im.get());
+        ASSERT_EQ(RecognizeYUV(inPlace.get(), nullptr), 1);
+        Slot given; // an image in the slot receives a copy
+        given.image = malloc_Image(w, h, 8);
+        ImgDecode(im.get(), &given);
+        EXPECT_EQ(diff(given.get(), inPlace.get()), "");
+    }
+}
+
+TEST(MyResample2, InterpolatesRowsWithRounding) {
+    // Narrower than RecognizeYUV accepts, so the result is the resampling.
+    Owned src = random_image(17, 4, 8, 3);
+    for (int32_t f = 2; f <= 49; ++f) {
+        Owned got(MyResample2(src.get(), f));
+        ASSERT_EQ(got->height, 3 * f + 1);
+        for (int32_t y = 0; y < got->height; ++y)
+            for (int32_t x = 0; x < 17; ++x) {
+                const int32_t a = GetPixelIndex(src.get(), x, y / f), b = GetPixelIndex(src.get(), x, y / f + 1);
+                const int32_t k = y % f;
+                ASSERT_EQ(GetPixelIndex(got.get(), x, y), (a * (f - k) + b * k + (f + 1) / 2) / f) << f << "," << y;
+            }
+    }
+    EXPECT_EQ(MyResample2(src.get(), 1), nullptr);
+    EXPECT_EQ(MyResample2(src.get(), 50), nullptr);
+    EXPECT_EQ(MyResample2(make(4, 4, 24).get(), 2), nullptr);
+}
