@@ -10,5 +10,6 @@ namespace pxop {
 void add_effects(std::vector<Operation> &table);
 void add_deform(std::vector<Operation> &table);
 void add_toolkit(std::vector<Operation> &table);
+void add_lines(std::vector<Operation> &table);
 
 } // namespace pxop

@@ -12,6 +12,7 @@ std::vector<Operation> build_table() {
     add_effects(t);
     add_deform(t);
     add_toolkit(t);
+    add_lines(t);
     return t;
 }
 

@@ -55,7 +55,7 @@ Owned scene(int32_t w, int32_t h) {
 std::map<std::string, std::string> compute() {
     std::map<std::string, Owned> inputs;
     inputs["random"] = random_image(29, 19, 32, 2024);
-    inputs["scene"] = scene(48, 36);
+    inputs["scene"] = scene(150, 100);
     inputs["portrait"] = load_fixture("portrait-128.bmp");
     std::map<std::string, std::string> hashes;
     for (const pxop::Operation &op : pxop::operations()) {

@@ -24,8 +24,8 @@ class Cli : public ::testing::Test {
         ASSERT_NE(mkdtemp(tmpl), nullptr);
         dir = tmpl;
         std::string error;
-        Owned colour = random_image(37, 23, 24, 1);
-        Owned alpha = random_image(21, 17, 32, 2);
+        Owned colour = random_image(160, 90, 24, 1);
+        Owned alpha = random_image(131, 47, 32, 2);
         ASSERT_TRUE(pxio::write_image((dir / "colour.png").string(), colour.get(), &error)) << error;
         ASSERT_TRUE(pxio::write_image((dir / "alpha.png").string(), alpha.get(), &error)) << error;
         ASSERT_TRUE(pxio::write_image((dir / "colour.bmp").string(), colour.get(), &error)) << error;
@@ -63,7 +63,7 @@ TEST_F(Cli, FormatsAndBatches) {
     std::string error;
     Owned jpg(pxio::read_image(p("a.jpg"), &error)), bmp(pxio::read_image(p("a.bmp"), &error));
     ASSERT_TRUE(jpg && bmp);
-    EXPECT_EQ(jpg->width, 37);
+    EXPECT_EQ(jpg->width, 160);
     // BMP output stands upright: it reads back as the PNG path's result.
     EXPECT_EQ(run("apply sketch " + p("colour.png") + " " + p("a.png")), 0);
     Owned png(pxio::read_image(p("a.png"), &error));
