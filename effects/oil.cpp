@@ -20,45 +20,47 @@ constexpr uint32_t intensity_class(uint32_t c) {
     return (306 * red_of(c) + 601 * green_of(c) + 117 * blue_of(c)) >> 15;
 }
 
-// Pixel count and red, green, blue sums per class. `S` holds the sums of one
-// window exactly: 32 bits while (2r + 1)^2 * 255 fits, 64 bits beyond.
+// Pixel count and red, green, blue sums per class, as one array of four
+// groups. `S` holds the sums of one window exactly: 32 bits while
+// (2r + 1)^2 * 255 fits, 64 bits beyond.
 template <class S> struct Hist {
-    S n[kClasses], r[kClasses], g[kClasses], b[kClasses];
+    static constexpr int kN = 0, kR = kClasses, kG = 2 * kClasses, kB = 3 * kClasses, kSize = 4 * kClasses;
+    S v[kSize];
 
     void add(uint32_t c) {
         const uint32_t k = intensity_class(c);
-        n[k] += 1;
-        r[k] += red_of(c);
-        g[k] += green_of(c);
-        b[k] += blue_of(c);
+        v[kN + k] += 1;
+        v[kR + k] += red_of(c);
+        v[kG + k] += green_of(c);
+        v[kB + k] += blue_of(c);
     }
     void remove(uint32_t c) {
         const uint32_t k = intensity_class(c);
-        n[k] -= 1;
-        r[k] -= red_of(c);
-        g[k] -= green_of(c);
-        b[k] -= blue_of(c);
+        v[kN + k] -= 1;
+        v[kR + k] -= red_of(c);
+        v[kG + k] -= green_of(c);
+        v[kB + k] -= blue_of(c);
     }
     void plus(const Hist &add) {
-        S *d = n;
-        const S *a = add.n;
-        for (int i = 0; i < 4 * kClasses; ++i)
-            d[i] += a[i];
+        for (int i = 0; i < kSize; ++i)
+            v[i] += add.v[i];
     }
     // this += add - sub, entry by entry (the differences wrap back exactly).
     void slide(const Hist &add, const Hist &sub) {
-        S *d = n;
-        const S *a = add.n, *s = sub.n;
-        for (int i = 0; i < 4 * kClasses; ++i)
-            d[i] += a[i] - s[i];
+        S d[kSize];
+        for (int i = 0; i < kSize; ++i)
+            d[i] = add.v[i] - sub.v[i];
+        for (int i = 0; i < kSize; ++i)
+            v[i] += d[i];
     }
     // Mean colour of the most populated class, the lowest class on a tie.
     uint32_t dominant(uint32_t alpha) const {
         int best = 0;
         for (int k = 1; k < kClasses; ++k)
-            if (n[k] > n[best]) best = k;
-        return pack(static_cast<uint32_t>(b[best] / n[best]), static_cast<uint32_t>(g[best] / n[best]),
-                    static_cast<uint32_t>(r[best] / n[best]), alpha);
+            if (v[kN + k] > v[kN + best]) best = k;
+        const S n = v[kN + best];
+        return pack(static_cast<uint32_t>(v[kB + best] / n), static_cast<uint32_t>(v[kG + best] / n),
+                    static_cast<uint32_t>(v[kR + best] / n), alpha);
     }
 };
 

@@ -2,6 +2,8 @@
 // restoration (tinted gray), line rows, and the bare result preparation.
 #include <pxfx/effects.h>
 
+#include <cstring>
+
 #include "core/internal/math.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
@@ -22,11 +24,16 @@ template <class F> void negative(const Image *src, Image *dst) {
             for (int32_t i = 0; i < 3 * w; ++i)
                 out[i] = static_cast<uint8_t>(~in[i]);
         } else if constexpr (F::kBitCount == 32) {
+            // One word per pixel, XORed with a mask whose alpha byte is 0
+            // (built from bytes, so it fits either byte order).
+            const uint8_t maskBytes[4] = {0xFF, 0xFF, 0xFF, 0};
+            uint32_t mask;
+            std::memcpy(&mask, maskBytes, 4);
             for (int32_t x = 0; x < w; ++x) {
-                out[4 * x] = static_cast<uint8_t>(~in[4 * x]);
-                out[4 * x + 1] = static_cast<uint8_t>(~in[4 * x + 1]);
-                out[4 * x + 2] = static_cast<uint8_t>(~in[4 * x + 2]);
-                out[4 * x + 3] = in[4 * x + 3];
+                uint32_t v;
+                std::memcpy(&v, in + 4 * x, 4);
+                v ^= mask;
+                std::memcpy(out + 4 * x, &v, 4);
             }
         } else {
             for (int32_t x = 0; x < w; ++x)
