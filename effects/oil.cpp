@@ -122,6 +122,22 @@ template <class F> bool oil_with_sums(const Image *src, Image *dst, int32_t r) {
     return true;
 }
 
+// Channel planes of one call, released on every path.
+struct Planes {
+    Image *hue = nullptr, *saturation = nullptr, *lightness = nullptr, *alpha = nullptr;
+    Planes() = default;
+    Planes(const Planes &) = delete;
+    Planes &operator=(const Planes &) = delete;
+    ~Planes() {
+        free_Image(&hue, 0);
+        free_Image(&saturation, 0);
+        free_Image(&lightness, 0);
+        free_Image(&alpha, 0);
+    }
+};
+
+constexpr int32_t kHslMode = 1;
+
 } // namespace
 
 extern "C" {
@@ -132,6 +148,17 @@ uint32_t imOil(Image *src, Image **dst, int32_t r) {
     if (out == nullptr) return 0;
     if (2 * static_cast<int64_t>(r) >= src->width || 2 * static_cast<int64_t>(r) >= src->height) return 0;
     return with_format(src->bitCount, [&](auto f) { return oil_with_sums<decltype(f)>(src, out, r); }) ? 1 : 0;
+}
+
+uint32_t imOil_1(Image *src, Image **dst) {
+    if (!has_pixels(src) || (src->bitCount != 24 && src->bitCount != 32) || dst == nullptr) return 0;
+    Planes p;
+    const bool alpha = src->bitCount == 32;
+    if (!Split(src, &p.hue, &p.saturation, &p.lightness, alpha ? &p.alpha : nullptr, kHslMode)) return 0;
+    ColorCompress(p.hue, 3);
+    ColorCompress(p.lightness, 12);
+    *dst = Combine(p.hue, p.saturation, p.lightness, p.alpha, kHslMode);
+    return 1;
 }
 
 int32_t ColorCompress(Image *plane, int32_t levels) {

@@ -201,3 +201,50 @@ TEST(ColorCompress, GroupsMapToTheirMostFrequentMember) {
     ASSERT_EQ(ColorCompress(plane.get(), 1000), 1); // groups of one value
     EXPECT_EQ(GetPixelIndex(plane.get(), 0, 0), 85);
 }
+
+namespace {
+
+// Groups of ceil(256 / levels) values map to their most frequent member.
+void ref_compress(Image *plane, int levels) {
+    const int g = (256 + levels - 1) / levels;
+    int count[256] = {};
+    for (int y = 0; y < plane->height; ++y)
+        for (int x = 0; x < plane->width; ++x)
+            ++count[GetPixelIndex(plane, x, y)];
+    int map[256];
+    for (int v = 0; v < 256; ++v) {
+        const int first = v - v % g;
+        int rep = first;
+        for (int u = first; u < std::min(first + g, 256); ++u)
+            if (count[u] > count[rep]) rep = u;
+        map[v] = rep;
+    }
+    for (int y = 0; y < plane->height; ++y)
+        for (int x = 0; x < plane->width; ++x)
+            SetPixelIndex(plane, x, y, map[GetPixelIndex(plane, x, y)]);
+}
+
+} // namespace
+
+TEST(Oil1, QuantisedHueAndLightnessPlanes) {
+    uint32_t seed = 70;
+    for (int32_t bc : {24, 32})
+        for (auto [w, h] : kAwkwardSizes) {
+            Owned src = random_image(w, h, bc, seed++);
+            Slot dst;
+            ASSERT_EQ(imOil_1(src.get(), &dst), 1u);
+            Slot p1, p2, p3, pa;
+            ASSERT_EQ(Split(src.get(), &p1, &p2, &p3, bc == 32 ? &pa : nullptr, 1), 1);
+            ref_compress(p1.get(), 3);
+            ref_compress(p3.get(), 12);
+            Owned expect(Combine(p1.get(), p2.get(), p3.get(), pa.get(), 1));
+            EXPECT_EQ(diff(dst.get(), expect.get()), "") << w << "x" << h << "@" << bc;
+        }
+    Owned gray = random_image(4, 4, 8, 1), words = random_image(4, 4, 16, 1), rgb = random_image(4, 4, 24, 1);
+    Slot dst;
+    EXPECT_EQ(imOil_1(gray.get(), &dst), 0u);
+    EXPECT_EQ(imOil_1(words.get(), &dst), 0u);
+    EXPECT_EQ(imOil_1(nullptr, &dst), 0u);
+    EXPECT_EQ(imOil_1(rgb.get(), nullptr), 0u);
+    EXPECT_EQ(dst.get(), nullptr);
+}
