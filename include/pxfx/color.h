@@ -114,11 +114,23 @@ PXFX_API int32_t PX_IMG_Emboss1(const Image *src, Image **out);
 
 /* ---- Fast box smoothing ------------------------------------------------------- */
 
-/* In-place size x size box mean plus offset, clamped, edges repeated; alpha is
- * smoothed too. 1 when processed, 0 when refused. */
+/* In-place box mean: every channel of pixel (x, y) becomes the mean (sum
+ * divided by size * size, truncated) of the size x size box from
+ * (x - size/2, y - size/2), edges repeated, plus offset, clamped to 0..255.
+ * 8-, 24- and 32-bit images; the alpha of 32-bit images is smoothed and offset
+ * too. A 16-bit image (or any other bit count of 8 or more) is not smoothed:
+ * it receives the untouched white working image, as the filter always did,
+ * and the call returns 1. Sums are exact at every size (no 32-bit wrap).
+ * Returns 1 when processed, 0 (image unchanged) when the image is null, has
+ * no pixels or fewer than 8 bits, size is 0, negative or above 2^20, or the
+ * working image cannot be made. */
 PXFX_API int32_t Filter_fast(Image *image, int32_t size, int32_t offset);
-/* Box smoothing by a 0-100 strength (box size strength / 10) into *out, or in
- * place when out is null. 1 or 0. */
+/* Box smoothing by a strength: size min(strength, 100) / 10, nothing for a
+ * strength of 3 or less (a plain copy). With out null src itself is smoothed;
+ * else src is copied into *out (created when null; an existing image is used
+ * whatever its size and bit count) and *out smoothed. Returns 1, or 0 when
+ * src has no pixels, *out holds a record without pixels, or *out cannot be
+ * made. */
 PXFX_API int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength);
 
 #ifdef __cplusplus
