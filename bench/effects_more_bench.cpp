@@ -49,5 +49,6 @@ BENCHMARK(BM_Memcpy)->ArgNames({"bits"})->Arg(24)->Arg(32)->Unit(benchmark::kMil
 BENCHMARK(BM_Negative)->ArgNames({"bits"})->Arg(24)->Arg(32)->Unit(benchmark::kMillisecond);
 BENCHMARK(BM_ClassicalPhotograph)->ArgNames({"bits"})->Arg(24)->Arg(32)->Unit(benchmark::kMillisecond);
 BENCHMARK(BM_AlterMode5)->ArgNames({"bits"})->Arg(24)->Arg(32)->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_Lambency)->ArgNames({"bits"})->Arg(24)->Arg(32)->Unit(benchmark::kMillisecond);
 BENCHMARK(BM_Mosaic8)->ArgNames({"bits"})->Arg(24)->Arg(32)->Unit(benchmark::kMillisecond);
 BENCHMARK(BM_Oil4)->ArgNames({"bits"})->Arg(24)->Arg(32)->Unit(benchmark::kMillisecond);

@@ -2,6 +2,7 @@
 #include <gtest/gtest.h>
 
 #include <cstring>
+#include <vector>
 
 #include "effect_check.hpp"
 
@@ -93,4 +94,54 @@ TEST(Ballance, ZeroContrastCopiesTheBlockBytes) {
     ASSERT_EQ(PX_IMG_Ballance(src.get(), &dst, 0), 1u);
     EXPECT_EQ(std::memcmp(dst->bits, src->bits, src->pitch * 3), 0); // padding included
     EXPECT_EQ(PX_IMG_Ballance(nullptr, &dst, 0), 0u);
+}
+
+namespace {
+
+// The glow as a chain of whole images: blur, halve, raise contrast, then a
+// screen blend written pixel by pixel.
+Owned ref_lambency(const Image *src) {
+    const int32_t k[9] = {1, 2, 1, 2, 4, 2, 1, 2, 1};
+    Owned t1 = make(src->width, src->height, static_cast<int32_t>(src->bitCount));
+    Filter(const_cast<Image *>(src), k, 3, 16, 0, nullptr, t1.get(), 0);
+    Slot t2, t3;
+    PX_IMG_Light_Alter(t1.get(), &t2, 50, 4);
+    PX_IMG_Ballance(t2.get(), &t3, 5);
+    return per_pixel(src, [&](uint32_t a, int x, int y) {
+        const uint32_t b = GetPixelColor(t3.get(), x, y);
+        uint32_t out = a & 0xFF000000u;
+        for (int s : {0, 8, 16})
+            out |= uint32_t(std::min(chan(a, s) + chan(b, s) - ((chan(a, s) * chan(b, s)) >> 8), 255)) << s;
+        return out;
+    });
+}
+
+} // namespace
+
+TEST(Lambency, MatchesTheImageChain) {
+    expect_like_reference(PX_IMG_Lambency, ref_lambency, 1);
+    // A hand-made 4-bit record: the working images and a new result are 8-bit.
+    std::vector<uint8_t> nibbles(4 * 5);
+    for (size_t i = 0; i < nibbles.size(); ++i)
+        nibbles[i] = uint8_t(i * 37 + 11);
+    Image packed{7, 5, 4, nibbles.data(), 4, 0};
+    Slot dst;
+    ASSERT_EQ(PX_IMG_Lambency(&packed, &dst), 1u);
+    Owned expect = ref_lambency(&packed);
+    EXPECT_EQ(dst->bitCount, 8u);
+    EXPECT_EQ(diff(dst.get(), expect.get()), "");
+}
+
+TEST(Lambency, BlackStaysBlackAndWhiteStaysWhite) {
+    Slot dst;
+    for (int32_t bc : {24, 32}) {
+        Owned black = filled(6, 5, bc, 0x80000000u), white = filled(6, 5, bc, 0xFFFFFFFFu);
+        ASSERT_EQ(PX_IMG_Lambency(black.get(), &dst), 1u);
+        EXPECT_EQ(diff(dst.get(), black.get()), "");
+        ASSERT_EQ(PX_IMG_Lambency(white.get(), &dst), 1u);
+        EXPECT_EQ(diff(dst.get(), white.get()), "");
+    }
+    Owned src = random_image(4, 4, 24, 2);
+    EXPECT_EQ(PX_IMG_Lambency(src.get(), nullptr), 0u);
+    EXPECT_EQ(PX_IMG_Lambency(nullptr, &dst), 0u);
 }
