@@ -41,3 +41,31 @@ template <class Effect, class Reference> void expect_like_reference(Effect effec
 }
 
 } // namespace pxtest
+
+namespace pxtest {
+
+// A point-wise effect must give, in every format, what its 32-bit pass gives
+// for the colours that format reads.
+template <class Effect> void expect_format_consistent(Effect effect, uint32_t seed) {
+    expect_like_reference(
+        effect,
+        [&](const Image *src) {
+            return per_pixel(src, [&](uint32_t c, int, int) {
+                Owned one = filled(1, 1, 32, c);
+                Slot out;
+                effect(one.get(), &out);
+                return GetPixelColor(out.get(), 0, 0);
+            });
+        },
+        seed);
+}
+
+// Checks effect(pixel) on a 2 x 2 picture of one 32-bit colour.
+template <class Effect> void expect_pixel(Effect effect, uint32_t in, uint32_t out) {
+    Owned src = filled(2, 2, 32, in);
+    Slot dst;
+    ASSERT_EQ(effect(src.get(), &dst), 1u);
+    EXPECT_EQ(GetPixelColor(dst.get(), 1, 1), out) << std::hex << in;
+}
+
+} // namespace pxtest
