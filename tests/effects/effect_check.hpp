@@ -40,10 +40,6 @@ template <class Effect, class Reference> void expect_like_reference(Effect effec
         }
 }
 
-} // namespace pxtest
-
-namespace pxtest {
-
 // A point-wise effect must give, in every format, what its 32-bit pass gives
 // for the colours that format reads.
 template <class Effect> void expect_format_consistent(Effect effect, uint32_t seed) {

@@ -2,51 +2,50 @@
 #include <gtest/gtest.h>
 
 #include <cstring>
+#include <functional>
 #include <vector>
 
 #include "effect_check.hpp"
 
 using namespace pxtest;
 
-TEST(LightAlter, ScalesTheSelectedChannels) {
-    const struct {
-        uint32_t percent, channel, out;
-    } cases[] = {
-        {50, 0, rgba(10, 200, 15, 77)},  {200, 1, rgba(10, 255, 30, 77)},
-        {37, 2, rgba(3, 200, 30, 77)},   {150, 7, rgba(15, 255, 45, 77)},
-        {100, 2, rgba(10, 200, 30, 77)}, {0xFFFFFFFFu, 1, rgba(10, 255, 30, 77)}, // no 32-bit wrap
+TEST(LightAndContrast, HandComputedPixelsInEveryFormat) {
+    using Run = std::function<uint32_t(Image *, Image **)>;
+    const auto light = [](uint32_t p, uint32_t ch) {
+        return Run([=](Image *s, Image **d) { return PX_IMG_Light_Alter(s, d, p, ch); });
     };
-    for (const auto &c : cases) {
-        const auto effect = [&](Image *s, Image **d) { return PX_IMG_Light_Alter(s, d, c.percent, c.channel); };
-        expect_pixel(effect, rgba(10, 200, 30, 77), c.out);
-        expect_format_consistent(effect, c.percent);
-    }
-    Owned src = random_image(3, 2, 32, 5);
-    Slot dst;
-    ASSERT_EQ(PX_IMG_Light_Alter(src.get(), &dst, 0, 1), 1u); // every byte cleared
-    EXPECT_EQ(std::vector<uint8_t>(dst->bits, dst->bits + dst->pitch * 2), std::vector<uint8_t>(dst->pitch * 2));
-    EXPECT_EQ(PX_IMG_Light_Alter(nullptr, &dst, 50, 1), 0u);
-}
-
-TEST(Ballance, ContrastTable) {
+    const auto contrast = [](int32_t c) { return Run([=](Image *s, Image **d) { return PX_IMG_Ballance(s, d, c); }); };
+    const uint32_t in = rgba(10, 200, 30, 77);
     const struct {
-        int32_t contrast;
+        Run effect;
         uint32_t in, out;
     } cases[] = {
-        {5, rgba(0, 255, 128, 1), rgba(0, 255, 128, 1)},
-        {5, rgba(188, 100, 228, 1), rgba(190, 98, 232, 1)}, // 60 * 1.05f = 62.9999962 + 128.0 in double
-        {-100, rgba(3, 200, 255, 1), rgba(128, 128, 128, 1)},
-        {INT32_MAX, rgba(0, 128, 255, 1), rgba(0, 128, 255, 1)}, // contrast + 100 does not overflow
-        {INT32_MIN, rgba(0, 128, 255, 1), rgba(255, 128, 0, 1)},
+        {light(50, 0), in, rgba(10, 200, 15, 77)},
+        {light(200, 1), in, rgba(10, 255, 30, 77)},
+        {light(37, 2), in, rgba(3, 200, 30, 77)},
+        {light(150, 7), in, rgba(15, 255, 45, 77)},
+        {light(100, 2), in, in},
+        {light(0xFFFFFFFFu, 1), in, rgba(10, 255, 30, 77)}, // no wrap
+        {contrast(5), rgba(0, 255, 128, 1), rgba(0, 255, 128, 1)},
+        {contrast(5), rgba(188, 100, 228, 1), rgba(190, 98, 232, 1)}, // 60 * 1.05f = 62.9999962, + 128.0 in double
+        {contrast(-100), rgba(3, 200, 255, 1), rgba(128, 128, 128, 1)},
+        {contrast(INT32_MAX), rgba(0, 128, 255, 1), rgba(0, 128, 255, 1)}, // contrast + 100 does not overflow
+        {contrast(INT32_MIN), rgba(0, 128, 255, 1), rgba(255, 128, 0, 1)},
     };
-    for (const auto &c : cases)
-        expect_pixel([&](Image *s, Image **d) { return PX_IMG_Ballance(s, d, c.contrast); }, c.in, c.out);
-    expect_format_consistent([](Image *s, Image **d) { return PX_IMG_Ballance(s, d, 5); }, 3);
+    for (const auto &c : cases) {
+        expect_pixel(c.effect, c.in, c.out);
+        expect_format_consistent(c.effect, c.out);
+    }
+}
+
+TEST(LightAndContrast, BlockCopiesAndClears) {
     Owned src = random_image(5, 3, 24, 8);
     Slot dst;
     ASSERT_EQ(PX_IMG_Ballance(src.get(), &dst, 0), 1u); // block bytes, padding included
     EXPECT_EQ(std::memcmp(dst->bits, src->bits, src->pitch * 3), 0);
-    EXPECT_EQ(PX_IMG_Ballance(nullptr, &dst, 0), 0u);
+    ASSERT_EQ(PX_IMG_Light_Alter(src.get(), &dst, 0, 1), 1u); // every byte cleared
+    EXPECT_EQ(std::vector<uint8_t>(dst->bits, dst->bits + dst->pitch * 3), std::vector<uint8_t>(dst->pitch * 3));
+    EXPECT_EQ(PX_IMG_Ballance(nullptr, &dst, 0) + PX_IMG_Light_Alter(nullptr, &dst, 50, 1), 0u);
 }
 
 // The glow as the chain of whole images: blur, halve, raise contrast, then a
