@@ -96,9 +96,10 @@ TEST(Oil, MatchesWindowRescanAndCopiesTheBorder) {
                 Slot dst;
                 const bool fits = 2 * r < w && 2 * r < h;
                 ASSERT_EQ(imOil(src.get(), &dst, r), fits ? 1u : 0u);
-                if (fits)
+                if (fits) {
                     EXPECT_EQ(diff(dst.get(), ref_oil(src.get(), r).get()), "")
                         << w << "x" << h << "@" << bc << " r" << r;
+                }
             }
     Owned src = random_image(6, 9, 24, 4);
     Slot dst;
