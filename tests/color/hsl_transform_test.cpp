@@ -74,6 +74,7 @@ TEST(Transform, EqualsThePlaneRoute) {
                 // An existing image of another size and format is kept and filled.
                 Owned other = random_image(4, 6, bc == 32 ? 24 : 32, seed++);
                 Owned wantOther = plane_route(src.get(), other.get(), amount, component);
+                free_Image(&out.image, 0);
                 Image *kept = out.image = other.release();
                 ASSERT_EQ(PX_IMG_Transform(src.get(), &out, amount, component), 1);
                 EXPECT_EQ(out.get(), kept);
