@@ -64,12 +64,22 @@ PXFX_API Image *Combine(const Image *plane1, const Image *plane2, const Image *p
 
 /* ---- Hue, lightness and saturation ---------------------------------------- */
 
-/* Shifts an 8-bit hue plane by (amount * 255 - 25500) / 100, wrapping by 255. 1 or 0. */
+/* Shifts every value of an 8-bit hue plane by (amount * 255 - 25500) / 100
+ * (amount 100: none, 0: -255, 200: +255), wrapping by 255 past either end.
+ * The step is computed exactly for any amount. 1, or 0 when plane is null,
+ * has no pixels or is not 8-bit. */
 PXFX_API int32_t BaseTran_Hue(Image *plane, int32_t amount);
-/* Shifts an 8-bit saturation or lightness plane by the same step, clamped. 1 or 0. */
+/* Shifts an 8-bit saturation or lightness plane by the same step, clamped to
+ * 0..255. 1 or 0 as BaseTran_Hue. */
 PXFX_API int32_t BaseTran_LS(Image *plane, int32_t amount);
 /* Shifts hue (component 0), saturation (1) or lightness (2) of a picture by a
- * slider amount (100 = unchanged) through HSL planes into *out. 1 or 0. */
+ * slider amount (100 = unchanged; other components change nothing) through
+ * HSL, into *out: a 32-bit picture with the source's alpha. An image already
+ * in *out receives it through PX_Img_Copy (keeping its size and bit count);
+ * with *out null a 32-bit source gets the 32-bit picture itself and other
+ * sources a new image of their own bit count. Returns 1, or 0 when src or out
+ * is null, src has no pixels, *out holds a record without pixels, or memory
+ * runs out (*out is then unchanged). */
 PXFX_API int32_t PX_IMG_Transform(const Image *src, Image **out, int32_t amount, int32_t component);
 
 /* ---- Kernel convolution ------------------------------------------------------ */

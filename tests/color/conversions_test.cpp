@@ -3,6 +3,7 @@
 // against straightforward accessor versions.
 #include <gtest/gtest.h>
 
+#include "color/colorspace.hpp"
 #include "support/test_images.hpp"
 
 using namespace pxtest;
@@ -32,8 +33,10 @@ void reference_split(const Image *src, int mode, Owned planes[4]) {
         for (int x = 0; x < src->width; ++x) {
             uint32_t c = GetPixelColor(src, x, y);
             if (mode >= 1 && mode <= 4) c = kForward[mode](c);
+            const int32_t bytes[4] = {int32_t((c >> 16) & 255), int32_t((c >> 8) & 255), int32_t(c & 255),
+                                      int32_t(c >> 24)};
             for (int i = 0; i < 4; ++i)
-                SetPixelIndex(planes[i].get(), x, y, int32_t((c >> (16 - 8 * i)) & 255) | int32_t(c >> 24) * (i == 3));
+                SetPixelIndex(planes[i].get(), x, y, bytes[i]);
         }
 }
 
@@ -97,6 +100,12 @@ TEST(Conversions, RoundTripsAndClamping) {
     EXPECT_EQ(YUVtoRGB(0x0000FF00), 0x00002FE0u);
     EXPECT_EQ(YIQtoRGB(0x00FFFF00), 0x00FFFF00u);
     EXPECT_EQ(XYZtoRGB(0x00FF0000), 0x00FF000Eu);
+}
+
+TEST(Conversions, DivisionByReciprocalIsExact) {
+    for (int32_t d = 1; d <= 510; ++d)
+        for (int32_t n = -131071; n < 131072; n += (n > -600 && n < 600) ? 1 : 89)
+            ASSERT_EQ(pxfx::colour::div_small(n, d), n / d) << n << " / " << d;
 }
 
 TEST(Planes, SplitAndCombineMatchAccessorVersions) {
