@@ -23,8 +23,8 @@ template <class F> void mosaic(const Image *src, Image *dst, int64_t n) {
     const int32_t w = src->width, h = src->height;
     const int64_t half = n / 2;
     const size_t rowBytes = static_cast<size_t>(min_row_bytes(F::kBitCount, w));
-    for (int32_t y0 = 0; y0 < h; y0 = n < h - y0 ? static_cast<int32_t>(y0 + n) : h) {
-        const int32_t bandEnd = n < h - y0 ? static_cast<int32_t>(y0 + n) : h;
+    for (int32_t y0 = 0, bandEnd = 0; y0 < h; y0 = bandEnd) {
+        bandEnd = n < h - y0 ? static_cast<int32_t>(y0 + n) : h;
         const typename F::CRow sample = F::crow(src, block_sample(y0 + half, half, h));
         for (int32_t y = y0; y < bandEnd; ++y) {
             const typename F::Row out = F::row(dst, y);
