@@ -37,17 +37,16 @@ Owned ref_oil(const Image *src, int r) {
 } // namespace
 
 TEST(Mosaic, BlocksSampleTheirCentreOrHalfwayToTheEdge) {
-    for (int n : {1, 2, 3, 4, 7, 40})
-        expect_like_reference([n](Image *s, Image **d) { return PX_IMG_Mosaic(s, d, n); },
-                              [n](const Image *s) {
-                                  const int w = s->width, h = s->height, half = n / 2;
-                                  return per_pixel(s, [&](uint32_t, int x, int y) {
-                                      const int bx = x - x % n + half, by = y - y % n + half;
-                                      return GetPixelColor(s, bx < w ? bx : (w - half + bx) >> 1,
-                                                           by < h ? by : (by - half + h) >> 1);
-                                  });
-                              },
-                              10u * n);
+    for (int n : {1, 2, 3, 4, 7, 40}) {
+        const auto ref = [n](const Image *s) {
+            const int w = s->width, h = s->height, half = n / 2;
+            return per_pixel(s, [&](uint32_t, int x, int y) {
+                const int bx = x - x % n + half, by = y - y % n + half;
+                return GetPixelColor(s, bx < w ? bx : (w - half + bx) >> 1, by < h ? by : (by - half + h) >> 1);
+            });
+        };
+        expect_like_reference([n](Image *s, Image **d) { return PX_IMG_Mosaic(s, d, n); }, ref, 10u * n);
+    }
     Owned src = coordinates(10, 6);
     Slot dst;
     ASSERT_EQ(PX_IMG_Mosaic(src.get(), &dst, 4), 1u);
@@ -64,20 +63,14 @@ TEST(Mosaic, BlocksSampleTheirCentreOrHalfwayToTheEdge) {
 
 // A negative draw resets the horizontal jitter only.
 TEST(Aquarelle, SeededJitterAndItsSignRule) {
-    expect_like_reference(
-        [](Image *s, Image **d) {
-            srand48(5);
-            return PX_IMG_Aquarelle(s, d, 5);
-        },
-        [](const Image *s) {
-            srand48(5);
-            return per_pixel(s, [&](uint32_t, int x, int y) {
-                int a = PX_rand(5);
-                const int b = PX_rand(5);
-                return GetPixelColor(s, a < 0 || b < 0 ? x : x + a, y + b);
-            });
-        },
-        1);
+    const auto ref = [](const Image *s) {
+        srand48(5);
+        return per_pixel(s, [&](uint32_t, int x, int y) {
+            const int a = PX_rand(5), b = PX_rand(5); // in this order
+            return GetPixelColor(s, a < 0 || b < 0 ? x : x + a, y + b);
+        });
+    };
+    expect_like_reference([](Image *s, Image **d) { return srand48(5), PX_IMG_Aquarelle(s, d, 5); }, ref, 1);
     Owned src = coordinates(9, 7);
     Slot dst;
     ASSERT_EQ(PX_IMG_Aquarelle(src.get(), &dst, 1), 1u); // only zero draws
