@@ -103,6 +103,19 @@ TEST(Oil, MatchesWindowRescanAndCopiesTheBorder) {
     EXPECT_EQ(imOil(src.get(), &dst, INT32_MAX), 0u);
 }
 
+TEST(Oil, DominantClassMean) {
+    // Five dark pixels (class 0) outnumber four light ones around (1, 1).
+    Owned src = filled(3, 3, 32, rgba(250, 250, 250, 9));
+    const uint32_t dark[5] = {rgba(10, 0, 0, 1), rgba(20, 0, 0, 2), rgba(30, 0, 4, 3), rgba(0, 0, 0, 4),
+                              rgba(1, 0, 0, 5)};
+    for (int i = 0; i < 5; ++i)
+        SetPixelColor(src.get(), i % 3, i / 3, dark[i]);
+    Slot dst;
+    ASSERT_EQ(imOil(src.get(), &dst, 1), 1u);
+    EXPECT_EQ(GetPixelColor(dst.get(), 1, 1), rgba(12, 0, 0, 5)); // 61 / 5 and 4 / 5; own alpha
+    EXPECT_EQ(GetPixelColor(dst.get(), 2, 2), rgba(250, 250, 250, 9));
+}
+
 TEST(ColorCompress, GroupsMapToTheirMostFrequentMember) {
     Owned plane = make(12, 1, 8);
     const uint8_t values[12] = {0, 85, 85, 40, 86, 171, 171, 90, 172, 255, 200, 200};
