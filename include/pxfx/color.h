@@ -40,52 +40,107 @@ PXFX_API uint32_t XYZtoRGB(uint32_t colour);
 
 /* ---- Channel planes -------------------------------------------------------- */
 
-/* Splits src into three new 8-bit planes (first component, second, third) and
- * optionally an alpha plane, releasing images already in the slots. 1 or 0. */
+/* Splits src (any bit count the pixel readers handle) into three new 8-bit
+ * planes of its size (first component, second, third) and, when alphaPlane is
+ * not null, an alpha plane. Images already held in the slots are released;
+ * the new planes belong to the caller. If the alpha plane cannot be made,
+ * *alphaPlane is null and the call still succeeds. Returns 1, or 0 when src is
+ * null or has no pixels, when any of the three plane slots is null (a partial
+ * set is refused, nothing is touched), when two slots are the same pointer, or
+ * when a plane cannot be made (the three slots are then released and null).
+ * A slot may hold src itself: the old images are released after the split. */
 PXFX_API int32_t Split(const Image *src, Image **plane1, Image **plane2, Image **plane3, Image **alphaPlane,
                        int32_t mode);
-/* Joins three 8-bit planes (and an optional alpha plane) into a new 24-bit (32-bit
- * with alpha) image; null on failure. Caller owns the result. */
+/* Joins three planes (and an optional alpha plane) into a new image of
+ * plane1's size: 32-bit with an alpha plane, else 24-bit. plane2 and plane3
+ * must be at least as wide as plane1 and plane2 at least as high; a lower
+ * plane3 and an alpha plane of any size are read with edge clamping. Planes
+ * are read as GetPixelIndex does (a plane of more than 8 bits reads as 0).
+ * Returns null when a plane is null or has no pixels (the alpha plane too,
+ * when given), on the size rules above, or when memory runs out. Caller owns
+ * the result. */
 PXFX_API Image *Combine(const Image *plane1, const Image *plane2, const Image *plane3, const Image *alphaPlane,
                         int32_t mode);
 
 /* ---- Hue, lightness and saturation ---------------------------------------- */
 
-/* Shifts an 8-bit hue plane by (amount * 255 - 25500) / 100, wrapping by 255. 1 or 0. */
+/* Shifts every value of an 8-bit hue plane by (amount * 255 - 25500) / 100
+ * (amount 100: none, 0: -255, 200: +255), wrapping by 255 past either end.
+ * The step is computed exactly for any amount. 1, or 0 when plane is null,
+ * has no pixels or is not 8-bit. */
 PXFX_API int32_t BaseTran_Hue(Image *plane, int32_t amount);
-/* Shifts an 8-bit saturation or lightness plane by the same step, clamped. 1 or 0. */
+/* Shifts an 8-bit saturation or lightness plane by the same step, clamped to
+ * 0..255. 1 or 0 as BaseTran_Hue. */
 PXFX_API int32_t BaseTran_LS(Image *plane, int32_t amount);
 /* Shifts hue (component 0), saturation (1) or lightness (2) of a picture by a
- * slider amount (100 = unchanged) through HSL planes into *out. 1 or 0. */
+ * slider amount (100 = unchanged; other components change nothing) through
+ * HSL, into *out: a 32-bit picture with the source's alpha. An image already
+ * in *out receives it through PX_Img_Copy (keeping its size and bit count);
+ * with *out null a 32-bit source gets the 32-bit picture itself and other
+ * sources a new image of their own bit count. Returns 1, or 0 when src or out
+ * is null, src has no pixels, *out holds a record without pixels, or memory
+ * runs out (*out is then unchanged). */
 PXFX_API int32_t PX_IMG_Transform(const Image *src, Image **out, int32_t amount, int32_t component);
 
 /* ---- Kernel convolution ------------------------------------------------------ */
 
-/* Normalised Gaussian kernels: row r - 1 holds radius r (taps 0..2r), zero-padded. */
+/* Normalised Gaussian kernels: row r - 1 holds radius r (taps 0..2r, sigma
+ * r / 3, each row summing to 1), zero-padded. Not read by Filter. */
 PXFX_API extern const float matrixX[10][21];
 
-/* Convolves src with a size x size kernel, divides, offsets and clamps; into dst
- * (same size and bit count) or, with dst null, in place. An 8-bit mask selects
- * pixels of 8-bit images and limits the area of others; gray >= 1 writes gray.
- * 1, or 0 for no pixels or a failed allocation. */
+/* Convolves src with a size x size kernel (row-major; weight of the source
+ * pixel at (x + dx, y + dy) at [(dy + size/2) * size + dx + size/2]), sums in
+ * 32-bit integers (wrapping), divides by divisor (none for 0), adds offset and
+ * clamps to 0..255. Source reads repeat the edge pixels.
+ *  - Writes into dst (any size: its width x height is processed), or with dst
+ *    null into a working image that is then copied back into src and released
+ *    whole (record and pixels). A dst whose pixels overlap src's is filtered
+ *    from a snapshot of src, as if it were a separate image.
+ *  - An 8-bit mask limits the processed area to its width x height. For an
+ *    8-bit result the mask also selects: where its byte is 0 the source index
+ *    is copied; a mask of another bit count only selects, bytes outside its
+ *    rows counting as set. A mask without pixels is ignored.
+ *  - 8-bit results read the source as GetPixelIndex does, 24- and 32-bit ones
+ *    as GetPixelColor does; gray >= 1 writes (B + 2G + R) >> 2 to all three
+ *    channels. A 32-bit result takes the alpha of the bottom-right tap's pixel
+ *    (x + size - size/2 - 1, y + size - size/2 - 1, clamped), or keeps its own
+ *    alpha when size <= 0 (no taps: every channel is the clamped offset).
+ *  - Other result bit counts are not written (in place, a 16-bit src thus
+ *    turns white).
+ * Returns 1, or 0 when src or a given dst has no pixels, the kernel is null
+ * with size > 0, size * size exceeds 2^31 - 1, or memory runs out. */
 PXFX_API int32_t Filter(Image *src, const int32_t *kernel, int32_t size, int32_t divisor, int32_t offset,
                         const Image *mask, Image *dst, int32_t gray);
-/* 3 x 3 mean into *out (reused when it fits). Result of Filter, or 0. */
+/* 3 x 3 mean into *out (reused when its width, height and bit count match,
+ * else replaced). Result of Filter, or 0 for a null src or out, or a src
+ * without pixels. The three below follow the same rules. */
 PXFX_API int32_t PX_IMG_Blur(const Image *src, Image **out);
-/* 3 x 3 soften (centre weight 8, divisor 16) into *out. Result of Filter, or 0. */
+/* 3 x 3 soften (centre weight 8, divisor 16) into *out. */
 PXFX_API int32_t PX_IMG_Soften(const Image *src, Image **out);
-/* 3 x 3 sharpen (centre 15, divisor 7) into *out. Result of Filter, or 0. */
+/* 3 x 3 sharpen (centre 15, others -1, divisor 7) into *out. */
 PXFX_API int32_t PX_IMG_Sharpen(const Image *src, Image **out);
-/* Gray diagonal relief around 127 into *out. Result of Filter, or 0. */
+/* Gray diagonal relief 127 + (pixel (x-1, y+1) - pixel (x+1, y-1)) into *out. */
 PXFX_API int32_t PX_IMG_Emboss1(const Image *src, Image **out);
 
 /* ---- Fast box smoothing ------------------------------------------------------- */
 
-/* In-place size x size box mean plus offset, clamped, edges repeated; alpha is
- * smoothed too. 1 when processed, 0 when refused. */
+/* In-place box mean: every channel of pixel (x, y) becomes the mean (sum
+ * divided by size * size, truncated) of the size x size box from
+ * (x - size/2, y - size/2), edges repeated, plus offset, clamped to 0..255.
+ * 8-, 24- and 32-bit images; the alpha of 32-bit images is smoothed and offset
+ * too. A 16-bit image (or any other bit count of 8 or more) is not smoothed:
+ * it receives the untouched white working image, as the filter always did,
+ * and the call returns 1. Sums are exact at every size (no 32-bit wrap).
+ * Returns 1 when processed, 0 (image unchanged) when the image is null, has
+ * no pixels or fewer than 8 bits, size is 0, negative or above 2^20, or the
+ * working image cannot be made. */
 PXFX_API int32_t Filter_fast(Image *image, int32_t size, int32_t offset);
-/* Box smoothing by a 0-100 strength (box size strength / 10) into *out, or in
- * place when out is null. 1 or 0. */
+/* Box smoothing by a strength: size min(strength, 100) / 10, nothing for a
+ * strength of 3 or less (a plain copy). With out null src itself is smoothed;
+ * else src is copied into *out (created when null; an existing image is used
+ * whatever its size and bit count) and *out smoothed. Returns 1, or 0 when
+ * src has no pixels, *out holds a record without pixels, or *out cannot be
+ * made. */
 PXFX_API int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength);
 
 #ifdef __cplusplus

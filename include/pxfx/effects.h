@@ -45,49 +45,83 @@ PXFX_API int32_t temp_ex(const uint8_t *plane, int32_t width, int32_t height, co
 
 /* ---- Colour tones ---------------------------------------------------------------- */
 
-/* 255 - channel. 1 or 0. */
+/* 255 - channel; alpha kept. 1 or 0. */
 PXFX_API uint32_t PX_IMG_Negative(Image *src, Image **dst);
 /* Warmer: red up a quarter, green down by new red / 8, blue down a sixteenth. 1 or 0. */
 PXFX_API uint32_t PX_IMG_WARM_YELLOW(Image *src, Image **dst);
 /* Cooler: red down a quarter, green up by new red / 16, blue up a quarter. 1 or 0. */
 PXFX_API uint32_t PX_IMG_COLD_PUPRLE(Image *src, Image **dst);
-/* Old-photograph tone tables (red clamped, green and blue wrapped). 1 or 0. */
+/* Old-photograph tone tables: each channel plus its table entry, red clamped
+ * to 255, green and blue modulo 256; alpha kept. 1 or 0. */
 PXFX_API uint32_t PX_IMG_Classical_Photograph(Image *src, Image **dst);
 /* Gray tinted toward blue (mean + 20, mean, mean - 20). 1 or 0. */
 PXFX_API uint32_t PX_IMG_Repristination(Image *src, Image **dst);
 /* Rows darkened by 128 except every third row (2, 5, 8, ...). 1 or 0. */
 PXFX_API uint32_t PX_IMG_Line(Image *src, Image **dst);
-/* Only prepares the result image by the result-image rule; non-zero on success. */
+/* Only prepares the result image by the result-image rule; 1 on success, 0 on
+ * failure (null source or slot, no pixels, allocation failure). */
 PXFX_API uint32_t my(Image *src, Image **dst);
 
 /* ---- Light and soft glow ---------------------------------------------------------- */
 
-/* Scales red (channel 0), green (1), blue (2) or all three (other) by percent. 1 or 0. */
+/* Scales red (channel 0), green (1), blue (2) or all three (other) by percent:
+ * (percent * v) / 100 capped at 255, the product formed exactly (no 32-bit
+ * wrap for huge percentages). Percent 100 copies the source with PX_Img_Copy;
+ * percent 0 clears every byte of the result (alpha and padding included). 1 or 0. */
 PXFX_API uint32_t PX_IMG_Light_Alter(Image *src, Image **dst, uint32_t percent, uint32_t channel);
-/* Contrast about mid-gray by a percent through a 256-entry table. 1 or 0. */
+/* Contrast about mid-gray by a percent through a 256-entry table:
+ * trunc((v - 128) * f + 128.0) clamped, f = (contrast + 100) / 100 in single
+ * precision (contrast + 100 formed without overflow), the product single and
+ * the sum double precision. Contrast 0 copies the pixel block byte for byte
+ * (only as many bytes as both blocks hold). 1 or 0. */
 PXFX_API uint32_t PX_IMG_Ballance(Image *src, Image **dst, int32_t contrast);
-/* Soft glow: blurred, halved, contrast-raised copy screen-blended over the source. 1 or 0. */
+/* Soft glow: a 1-2-1 Gaussian blur of the source (Filter) taken to half
+ * brightness and +5 % contrast as PX_IMG_Light_Alter and PX_IMG_Ballance
+ * would, then screen-blended over the source; alpha is the source's. The
+ * halving and contrast steps are applied in the same pass as the blend (with
+ * the rounding of the intermediate format), so the only working image is the
+ * blurred one, released on every path. 1 or 0. */
 PXFX_API uint32_t PX_IMG_Lambency(Image *src, Image **dst);
 
 /* ---- Textures --------------------------------------------------------------------- */
 
-/* Square blocks of n pixels, each the colour of its centre. 1 or 0 (0 for n < 1). */
+/* Square blocks of n pixels, each the colour of its centre; partial blocks at
+ * the right and bottom sample halfway between the nominal centre and the
+ * edge. n < 1 gives 0 before anything is touched; any n >= 1 works (a block
+ * larger than the picture is one block). No working buffer. 1 or 0. */
 PXFX_API uint32_t PX_IMG_Mosaic(Image *src, Image **dst, int32_t n);
-/* Random jitter of up to range pixels from PX_rand. 1 or 0. */
+/* Random jitter: pixel (x, y) takes the colour at (x + a, y + b), clamped to
+ * the picture, with a = PX_rand(range) then b = PX_rand(range) drawn per pixel
+ * in that order and a set to 0 when either is negative. Any range works (0 and
+ * negative values included; offsets are added without overflow). 1 or 0. */
 PXFX_API uint32_t PX_IMG_Aquarelle(Image *src, Image **dst, int32_t range);
-/* Oil painting: mean colour of the dominant intensity class in a (2r+1)^2 window. 1 or 0. */
+/* Oil painting: mean colour of the dominant intensity class in a (2r+1)^2
+ * window; pixels closer than r to an edge are copied. Interior pixels keep the
+ * source pixel's alpha. r < 0 gives 0 before anything is touched; 2r >= width
+ * or height gives 0 with the prepared (unwritten) result left in the slot.
+ * Needs 32 sums per column of working memory (r > 0); if that cannot be had,
+ * 0 with the prepared result in the slot. 1 or 0. */
 PXFX_API uint32_t imOil(Image *src, Image **dst, int32_t r);
-/* Posterised oil look from quantised hue and lightness planes into a new image in
- * *dst (an image already there is not released: pass an empty slot). 1 or 0. */
+/* Posterised oil look: HSL planes with hue in 3 and lightness in 12 groups
+ * (ColorCompress), joined into a new 24-bit (32-bit with the source's alpha)
+ * image in *dst. An image already there is not released: pass an empty slot.
+ * 24- and 32-bit sources only; 0 for other sources, a null slot or a failed
+ * split; 1 otherwise, with *dst null if the joined image could not be made.
+ * The planes are released on every path. */
 PXFX_API uint32_t imOil_1(Image *src, Image **dst);
-/* Quantises an 8-bit plane in place to the most frequent value of each of
- * `levels` groups. 1 or 0. */
+/* Quantises an 8-bit plane in place: values fall in groups of ceil(256 / levels)
+ * and each maps to its group's most frequent value (the lowest on a tie).
+ * 0 for a plane that is null, without pixels or not 8-bit, and for levels < 1. */
 PXFX_API int32_t ColorCompress(Image *plane, int32_t levels);
 
 /* ---- Channel shift with curve tables -------------------------------------------- */
 
-/* Shifts red, green, blue by dR, dG, dB and, in modes 1-5 and the default mode,
- * passes them through curves blended from ZANTOFILTER / ZANTOFILTERBK. 1 or 0. */
+/* Shifts red, green, blue by dR, dG, dB and, in modes 1-5 and the default mode
+ * (any mode above 5), passes them through curves blended from ZANTOFILTER /
+ * ZANTOFILTERBK; alpha kept. Shifts are not clamped: beyond +-127 the curves
+ * leave 0..255 and keep their low 8 bits, and sums and products wrap modulo
+ * 2^32 as 32-bit arithmetic does (so INT_MAX added to a channel above 0 clamps
+ * to 0). 1 or 0. */
 PXFX_API uint32_t PX_IMG_Alter(Image *src, Image **dst, int32_t dR, int32_t dG, int32_t dB, uint32_t mode);
 
 #ifdef __cplusplus

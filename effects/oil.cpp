@@ -1,0 +1,192 @@
+// Oil painting: the mean colour of the dominant intensity class in a square
+// window (imOil), and the posterised variant from quantised hue and lightness
+// planes (imOil_1, ColorCompress).
+#include <pxfx/color.h>
+#include <pxfx/effects.h>
+
+#include "core/internal/image_check.hpp"
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+#include "core/internal/result.hpp"
+
+using namespace pxfx;
+
+namespace {
+
+// Intensity class (306 R + 601 G + 117 B) >> 15: eight levels, 0..7.
+constexpr int kClasses = 8;
+
+constexpr uint32_t intensity_class(uint32_t c) {
+    return (306 * red_of(c) + 601 * green_of(c) + 117 * blue_of(c)) >> 15;
+}
+
+// Pixel count and red, green, blue sums per class, as one array of four
+// groups. `S` holds the sums of one window exactly: 32 bits while
+// (2r + 1)^2 * 255 fits, 64 bits beyond.
+template <class S> struct Hist {
+    static constexpr int kN = 0, kR = kClasses, kG = 2 * kClasses, kB = 3 * kClasses, kSize = 4 * kClasses;
+    S v[kSize];
+
+    void add(uint32_t c) {
+        const uint32_t k = intensity_class(c);
+        v[kN + k] += 1;
+        v[kR + k] += red_of(c);
+        v[kG + k] += green_of(c);
+        v[kB + k] += blue_of(c);
+    }
+    void remove(uint32_t c) {
+        const uint32_t k = intensity_class(c);
+        v[kN + k] -= 1;
+        v[kR + k] -= red_of(c);
+        v[kG + k] -= green_of(c);
+        v[kB + k] -= blue_of(c);
+    }
+    void plus(const Hist &add) {
+        for (int i = 0; i < kSize; ++i)
+            v[i] += add.v[i];
+    }
+    // this += add - sub, entry by entry (the differences wrap back exactly).
+    void slide(const Hist &add, const Hist &sub) {
+        S d[kSize];
+        for (int i = 0; i < kSize; ++i)
+            d[i] = add.v[i] - sub.v[i];
+        for (int i = 0; i < kSize; ++i)
+            v[i] += d[i];
+    }
+    // Mean colour of the most populated class, the lowest class on a tie.
+    uint32_t dominant(uint32_t alpha) const {
+        int best = 0;
+        for (int k = 1; k < kClasses; ++k)
+            if (v[kN + k] > v[kN + best]) best = k;
+        const S n = v[kN + best];
+        return pack(static_cast<uint32_t>(v[kB + best] / n), static_cast<uint32_t>(v[kG + best] / n),
+                    static_cast<uint32_t>(v[kR + best] / n), alpha);
+    }
+};
+
+// Border pixels (closer than r to an edge) are copied; interior pixels take
+// the dominant class of their (2r + 1)^2 window. The window is the sum of
+// per-column histograms over rows y - r .. y + r; moving down a row updates
+// each column by one pixel out and one in, moving right adds one column and
+// subtracts another, so the cost per pixel does not depend on r.
+template <class F, class S> void oil(const Image *src, Image *dst, int32_t r, Hist<S> *cols) {
+    const int32_t w = src->width, h = src->height;
+    for (int32_t x = 0; x < w; ++x)
+        cols[x] = Hist<S>{};
+    for (int32_t y = 0; y < 2 * r; ++y) {
+        const typename F::CRow in = F::crow(src, y);
+        for (int32_t x = 0; x < w; ++x)
+            cols[x].add(F::load(in, x));
+    }
+    for (int32_t y = 0; y < h; ++y) {
+        const typename F::CRow in = F::crow(src, y);
+        const typename F::Row out = F::row(dst, y);
+        if (y < r || y >= h - r) {
+            for (int32_t x = 0; x < w; ++x)
+                F::store(out, x, F::load(in, x));
+            continue;
+        }
+        // Columns now cover rows y - r .. y + r.
+        const typename F::CRow enter = F::crow(src, y + r);
+        for (int32_t x = 0; x < w; ++x)
+            cols[x].add(F::load(enter, x));
+        for (int32_t x = 0; x < r; ++x)
+            F::store(out, x, F::load(in, x));
+        Hist<S> win{};
+        for (int32_t x = 0; x <= 2 * r; ++x)
+            win.plus(cols[x]);
+        F::store(out, r, win.dominant(alpha_of(F::load(in, r))));
+        for (int32_t x = r + 1; x < w - r; ++x) {
+            win.slide(cols[x + r], cols[x - r - 1]);
+            F::store(out, x, win.dominant(alpha_of(F::load(in, x))));
+        }
+        for (int32_t x = w - r; x < w; ++x)
+            F::store(out, x, F::load(in, x));
+        const typename F::CRow leave = F::crow(src, y - r);
+        for (int32_t x = 0; x < w; ++x)
+            cols[x].remove(F::load(leave, x));
+    }
+}
+
+template <class F> bool oil_with_sums(const Image *src, Image *dst, int32_t r) {
+    const uint64_t side = 2 * static_cast<uint64_t>(r) + 1;
+    if (side < 0x10000 && side * side * 255 <= 0xFFFFFFFFu) {
+        Buffer<Hist<uint32_t>> cols = alloc_buffer<Hist<uint32_t>>(static_cast<size_t>(src->width));
+        if (!cols) return false;
+        oil<F>(src, dst, r, cols.get());
+    } else {
+        Buffer<Hist<uint64_t>> cols = alloc_buffer<Hist<uint64_t>>(static_cast<size_t>(src->width));
+        if (!cols) return false;
+        oil<F>(src, dst, r, cols.get());
+    }
+    return true;
+}
+
+// Channel planes of one call, released on every path.
+struct Planes {
+    Image *hue = nullptr, *saturation = nullptr, *lightness = nullptr, *alpha = nullptr;
+    Planes() = default;
+    Planes(const Planes &) = delete;
+    Planes &operator=(const Planes &) = delete;
+    ~Planes() {
+        free_Image(&hue, 0);
+        free_Image(&saturation, 0);
+        free_Image(&lightness, 0);
+        free_Image(&alpha, 0);
+    }
+};
+
+constexpr int32_t kHslMode = 1;
+
+} // namespace
+
+extern "C" {
+
+uint32_t imOil(Image *src, Image **dst, int32_t r) {
+    if (r < 0) return 0;
+    Image *out = acquire_result(src, dst);
+    if (out == nullptr) return 0;
+    if (2 * static_cast<int64_t>(r) >= src->width || 2 * static_cast<int64_t>(r) >= src->height) return 0;
+    return with_format(src->bitCount, [&](auto f) { return oil_with_sums<decltype(f)>(src, out, r); }) ? 1 : 0;
+}
+
+uint32_t imOil_1(Image *src, Image **dst) {
+    if (!has_pixels(src) || (src->bitCount != 24 && src->bitCount != 32) || dst == nullptr) return 0;
+    Planes p;
+    const bool alpha = src->bitCount == 32;
+    if (!Split(src, &p.hue, &p.saturation, &p.lightness, alpha ? &p.alpha : nullptr, kHslMode)) return 0;
+    ColorCompress(p.hue, 3);
+    ColorCompress(p.lightness, 12);
+    *dst = Combine(p.hue, p.saturation, p.lightness, p.alpha, kHslMode);
+    return 1;
+}
+
+int32_t ColorCompress(Image *plane, int32_t levels) {
+    if (!is_plane(plane) || levels < 1) return 0;
+    const int32_t group = 256 / levels + (256 % levels != 0 ? 1 : 0);
+    uint32_t count[256] = {};
+    for (int32_t y = 0; y < plane->height; ++y) {
+        const uint8_t *row = row_ptr(plane, y);
+        for (int32_t x = 0; x < plane->width; ++x)
+            ++count[row[x]];
+    }
+    // Each group of `group` consecutive values maps to its most frequent
+    // member, the first one on a tie.
+    uint8_t map[256];
+    for (int32_t first = 0; first < 256; first += group) {
+        const int32_t end = first + group < 256 ? first + group : 256;
+        int32_t rep = first;
+        for (int32_t v = first + 1; v < end; ++v)
+            if (count[v] > count[rep]) rep = v;
+        for (int32_t v = first; v < end; ++v)
+            map[v] = static_cast<uint8_t>(rep);
+    }
+    for (int32_t y = 0; y < plane->height; ++y) {
+        uint8_t *row = row_ptr(plane, y);
+        for (int32_t x = 0; x < plane->width; ++x)
+            row[x] = map[row[x]];
+    }
+    return 1;
+}
+
+} // extern "C"

@@ -1,0 +1,116 @@
+// Colour-space conversions against golden hashes of an independent model
+// (conversions_golden.py) and named values; Split and Combine against
+// straightforward accessor versions.
+#include <gtest/gtest.h>
+
+#include "color/colorspace.hpp"
+#include "support/test_images.hpp"
+
+using namespace pxtest;
+
+namespace {
+
+using Conv = uint32_t (*)(uint32_t);
+const Conv kForward[] = {nullptr, RGBtoHSL, RGBtoYUV, RGBtoYIQ, RGBtoXYZ};
+const Conv kBackward[] = {nullptr, HSLtoRGB, YUVtoRGB, YIQtoRGB, XYZtoRGB};
+
+// Every third level of each byte, alpha varying: the grid of the model.
+uint32_t grid_hash(Conv fn) {
+    uint32_t h = 2166136261u, n = 0;
+    for (uint32_t p = 0; p < 256; p += 3)
+        for (uint32_t q = 0; q < 256; q += 3)
+            for (uint32_t s = 0; s < 256; s += 3, ++n)
+                h = (h ^ fn(p << 16 | q << 8 | s | ((n * 37) & 255) << 24)) * 16777619u;
+    return h;
+}
+
+void reference_split(const Image *src, int mode, Owned planes[4]) {
+    for (int i = 0; i < 4; ++i)
+        planes[i] = make(src->width, src->height, 8);
+    for (int y = 0; y < src->height; ++y)
+        for (int x = 0; x < src->width; ++x) {
+            uint32_t c = GetPixelColor(src, x, y);
+            if (mode >= 1 && mode <= 4) c = kForward[mode](c);
+            for (int i = 0; i < 4; ++i) // bytes 2, 1, 0, 3
+                SetPixelIndex(planes[i].get(), x, y, int32_t((c >> (i == 3 ? 24 : 16 - 8 * i)) & 255));
+        }
+}
+
+Owned reference_combine(const Image *p1, const Image *p2, const Image *p3, const Image *pa, int mode) {
+    Owned out = make(p1->width, p1->height, pa ? 32 : 24);
+    for (int y = 0; y < p1->height; ++y)
+        for (int x = 0; x < p1->width; ++x) {
+            uint32_t c = GetPixelIndex(p3, x, y) | GetPixelIndex(p2, x, y) << 8 | GetPixelIndex(p1, x, y) << 16 |
+                         (pa ? uint32_t(GetPixelIndex(pa, x, y)) << 24 : 0u);
+            SetPixelColor(out.get(), x, y, mode >= 1 && mode <= 4 ? kBackward[mode](c) : c);
+        }
+    return out;
+}
+
+} // namespace
+
+TEST(Conversions, MatchIndependentModel) {
+    const std::pair<Conv, uint32_t> golden[] = {
+        {RGBtoHSL, 0x4B6D48F4u}, {HSLtoRGB, 0x34B55525u}, {RGBtoYUV, 0xEF0D12C3u}, {YUVtoRGB, 0x3EBF2009u},
+        {RGBtoYIQ, 0x2800EF40u}, {YIQtoRGB, 0x4E2A4BF7u}, {RGBtoXYZ, 0x2566B022u}, {XYZtoRGB, 0x4A055337u}};
+    for (auto [fn, hash] : golden)
+        EXPECT_EQ(grid_hash(fn), hash);
+    for (int32_t d = 1; d <= 510; ++d)
+        for (int32_t n = -131071; n < 131072; n += (n > -600 && n < 600) ? 1 : 89)
+            ASSERT_EQ(pxfx::colour::div_small(n, d), n / d) << n << " / " << d;
+}
+
+TEST(Conversions, GraysAndHueToRGB) {
+    for (uint32_t v = 0; v < 256; ++v) { // achromatic hue 170, exact round trip
+        const uint32_t g = v * 0x010101u | 0x5A000000u;
+        EXPECT_EQ(RGBtoHSL(g), 0x5AAA0000u | v);
+        EXPECT_EQ(HSLtoRGB(RGBtoHSL(g)), g);
+    }
+    // Hues above 255 fold back by 255; a falling span and results wrap modulo 65536.
+    EXPECT_EQ(HueToRGB(10, 200, 256), HueToRGB(10, 200, 1));
+    EXPECT_EQ(HueToRGB(10, 200, 169), 10 + (190 * 6 + 126) / 255);
+    EXPECT_EQ(HueToRGB(200, 10, 41), uint16_t(200 - (190 * 246 - 126) / 255));
+    EXPECT_EQ(HueToRGB(0, 65535, 41), uint16_t((65535 * 246 + 126) / 255));
+}
+
+TEST(Planes, SplitAndCombineMatchAccessorVersions) {
+    const int32_t sizes[][2] = {{1, 1}, {1, 5}, {5, 1}, {3, 2}, {7, 9}};
+    uint32_t seed = 1;
+    for (int32_t bc : kBitCounts)
+        for (auto [w, h] : sizes)
+            for (int mode : {0, 1, 2, 3, 4, 7}) {
+                Owned src = random_image(w, h, bc, seed++), want[4];
+                Slot p[4];
+                ASSERT_EQ(Split(src.get(), &p[0], &p[1], &p[2], &p[3], mode), 1);
+                reference_split(src.get(), mode, want);
+                for (int i = 0; i < 4; ++i)
+                    EXPECT_EQ(diff(p[i].get(), want[i].get()), "") << bc << " " << mode << " plane " << i;
+                for (const Image *alpha : {p[3].get(), static_cast<Image *>(nullptr)}) {
+                    Owned got(Combine(p[0].get(), p[1].get(), p[2].get(), alpha, mode));
+                    Owned ref = reference_combine(p[0].get(), p[1].get(), p[2].get(), alpha, mode);
+                    EXPECT_EQ(diff(got.get(), ref.get()), "") << bc << " " << mode;
+                    if (mode == 7 && bc >= 24 && (alpha != nullptr) == (bc == 32)) {
+                        EXPECT_EQ(diff(got.get(), src.get()), ""); // plain planes give the picture back
+                    }
+                }
+            }
+}
+
+TEST(Planes, SizeRulesAndSlots) {
+    Owned p1 = random_image(6, 5, 8, 1), narrow = random_image(5, 5, 8, 2), low = random_image(6, 2, 8, 3);
+    Owned tiny = random_image(2, 2, 8, 4), wide = random_image(6, 5, 24, 5);
+    EXPECT_EQ(Combine(p1.get(), narrow.get(), p1.get(), nullptr, 0), nullptr);
+    EXPECT_EQ(Combine(p1.get(), low.get(), p1.get(), nullptr, 0), nullptr);
+    // A lower third plane and a small alpha plane repeat their edges; a 24-bit plane reads as 0.
+    Owned got(Combine(p1.get(), wide.get(), low.get(), tiny.get(), 1));
+    EXPECT_EQ(diff(got.get(), reference_combine(p1.get(), wide.get(), low.get(), tiny.get(), 1).get()), "");
+    Slot s1, s2, s3;
+    Image *stale = s1.image = s2.image = malloc_Image(1, 1, 8); // released once
+    EXPECT_EQ(Split(p1.get(), &s1, &s2, nullptr, nullptr, 1) + Split(p1.get(), &s1, &s1, &s3, nullptr, 1), 0);
+    EXPECT_EQ(s1.get(), stale); // refused calls touch nothing
+    // A slot holding the source: the source is split first, then released.
+    Owned want[4];
+    reference_split(s1.get(), 2, want);
+    ASSERT_EQ(Split(s1.get(), &s1, &s2, &s3, nullptr, 2), 1);
+    EXPECT_EQ(diff(s1.get(), want[0].get()), "");
+}

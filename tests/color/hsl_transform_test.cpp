@@ -1,0 +1,73 @@
+// Hue, saturation and lightness shifts: the plane maps, and the picture pass
+// against the plane route (Split, shift one plane, Combine, copy).
+#include <gtest/gtest.h>
+
+#include <climits>
+
+#include "support/test_images.hpp"
+
+using namespace pxtest;
+
+namespace {
+
+Owned plane_route(const Image *src, const Image *existing, int amount, int component) {
+    Slot h, s, l, a;
+    EXPECT_EQ(Split(src, &h, &s, &l, &a, 1), 1);
+    if (component == 0) BaseTran_Hue(h.get(), amount);
+    if (component == 1 || component == 2) BaseTran_LS(component == 1 ? s.get() : l.get(), amount);
+    Owned c(Combine(h.get(), s.get(), l.get(), a.get(), 1));
+    if (existing == nullptr && c->bitCount == src->bitCount) return c;
+    Owned out = existing ? clone(existing) : make(src->width, src->height, int32_t(src->bitCount));
+    PX_Img_Copy(out.get(), c.get());
+    return out;
+}
+
+} // namespace
+
+TEST(BaseTran, HueWrapsBy255AndLevelsClamp) {
+    struct Case {
+        int32_t (*fn)(Image *, int32_t);
+        int value, amount, want;
+    };
+    const Case cases[] = {
+        {BaseTran_Hue, 10, 200, 10},        {BaseTran_Hue, 254, 0, 254}, {BaseTran_Hue, 3, 99, 1},
+        {BaseTran_Hue, 7, 1000, 255},       {BaseTran_Hue, 0, 0, 0},     {BaseTran_LS, 100, INT32_MIN, 0},
+        {BaseTran_LS, 100, INT32_MAX, 255}, {BaseTran_LS, 100, 150, 227}};
+    for (const Case &c : cases) { // 265 - 255; -1 + 255; step -255 / 100 = -2; low byte of 2302 + 1; ...
+        Owned p = make(2, 1, 8);
+        p->bits[0] = uint8_t(c.value);
+        ASSERT_EQ(c.fn(p.get(), c.amount), 1);
+        EXPECT_EQ(p->bits[0], c.want) << c.value << " " << c.amount;
+        EXPECT_EQ(p->bits[2], 255); // only the first width bytes of a row
+    }
+    Owned rgb = random_image(3, 2, 24, 2), before = clone(rgb.get());
+    EXPECT_EQ(BaseTran_LS(rgb.get(), 0) + BaseTran_Hue(rgb.get(), 0) + BaseTran_Hue(nullptr, 0), 0);
+    EXPECT_EQ(diff(rgb.get(), before.get()), "");
+}
+
+TEST(Transform, EqualsThePlaneRoute) {
+    uint32_t seed = 10;
+    for (int32_t bc : kBitCounts)
+        for (int component : {0, 1, 2, 5})
+            for (int amount : {0, 37, 100, 163, 200}) {
+                Owned src = random_image(7, 5, bc, seed++);
+                Slot out;
+                ASSERT_EQ(PX_IMG_Transform(src.get(), &out, amount, component), 1);
+                ASSERT_EQ(diff(out.get(), plane_route(src.get(), nullptr, amount, component).get()), "")
+                    << bc << " c" << component << " a" << amount;
+            }
+    // An existing image of another size and format is kept and filled.
+    Owned src = random_image(6, 4, 32, 3), other = random_image(4, 6, 24, 4);
+    Owned want = plane_route(src.get(), other.get(), 150, 0);
+    Slot out;
+    Image *kept = out.image = other.release();
+    ASSERT_EQ(PX_IMG_Transform(src.get(), &out, 150, 0), 1);
+    EXPECT_EQ(out.get(), kept);
+    EXPECT_EQ(diff(out.get(), want.get()), "");
+    Image hollow = *src, *hp = &hollow;
+    hollow.bits = nullptr;
+    EXPECT_EQ(PX_IMG_Transform(nullptr, &out, 100, 0) + PX_IMG_Transform(src.get(), nullptr, 100, 0) +
+                  PX_IMG_Transform(&hollow, &out, 100, 0) + PX_IMG_Transform(src.get(), &hp, 100, 0),
+              0);
+    EXPECT_EQ(hp, &hollow);
+}

@@ -1,0 +1,67 @@
+// Shared checks for the effect tests: straightforward accessor versions are
+// run beside the library on random pictures of every format and awkward size.
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <cstdint>
+
+#include "support/test_images.hpp"
+
+namespace pxtest {
+
+struct Size {
+    int32_t w, h;
+};
+inline constexpr Size kAwkwardSizes[] = {{1, 1}, {1, 7}, {7, 1}, {2, 3}, {5, 5}, {6, 4}, {13, 9}, {33, 17}};
+
+constexpr int chan(uint32_t c, int shift) { return static_cast<int>((c >> shift) & 255); }
+constexpr uint32_t rgba(int b, int g, int r, int a) {
+    return uint32_t(b) | uint32_t(g) << 8 | uint32_t(r) << 16 | uint32_t(a) << 24;
+}
+
+// The picture that a per-pixel function makes of src, written pixel by pixel.
+template <class Fn> Owned per_pixel(const Image *src, Fn fn) {
+    Owned out = make(src->width, src->height, static_cast<int32_t>(src->bitCount));
+    for (int32_t y = 0; y < src->height; ++y)
+        for (int32_t x = 0; x < src->width; ++x)
+            SetPixelColor(out.get(), x, y, fn(GetPixelColor(src, x, y), x, y));
+    return out;
+}
+
+// effect(src, slot) must return 1 and leave in the slot what reference(src) makes.
+template <class Effect, class Reference> void expect_like_reference(Effect effect, Reference reference, uint32_t seed) {
+    for (int32_t bc : kBitCounts)
+        for (auto [w, h] : kAwkwardSizes) {
+            Owned src = random_image(w, h, bc, seed++);
+            Slot dst;
+            ASSERT_EQ(effect(src.get(), &dst), 1u) << w << "x" << h << "@" << bc;
+            EXPECT_EQ(diff(dst.get(), reference(src.get()).get()), "") << w << "x" << h << "@" << bc;
+        }
+}
+
+// A point-wise effect must give, in every format, what its 32-bit pass gives
+// for the colours that format reads.
+template <class Effect> void expect_format_consistent(Effect effect, uint32_t seed) {
+    expect_like_reference(
+        effect,
+        [&](const Image *src) {
+            return per_pixel(src, [&](uint32_t c, int, int) {
+                Owned one = filled(1, 1, 32, c);
+                Slot out;
+                effect(one.get(), &out);
+                return GetPixelColor(out.get(), 0, 0);
+            });
+        },
+        seed);
+}
+
+// Checks effect(pixel) on a 2 x 2 picture of one 32-bit colour.
+template <class Effect> void expect_pixel(Effect effect, uint32_t in, uint32_t out) {
+    Owned src = filled(2, 2, 32, in);
+    Slot dst;
+    ASSERT_EQ(effect(src.get(), &dst), 1u);
+    EXPECT_EQ(GetPixelColor(dst.get(), 1, 1), out) << std::hex << in;
+}
+
+} // namespace pxtest

@@ -1,0 +1,106 @@
+// Curve tables and the curve-table colour filters against per-sample maps
+// written straight from their rules.
+#include <gtest/gtest.h>
+
+#include <climits>
+#include <cmath>
+#include <functional>
+#include <vector>
+
+#include "support/test_images.hpp"
+
+using namespace pxtest;
+
+namespace {
+
+std::vector<int> drops(const uint8_t *t) {
+    std::vector<int> at;
+    for (int i = 1; i < 256; ++i)
+        if (t[i] < t[i - 1]) at.push_back(i);
+    return at;
+}
+
+// The level map an 8-bit filter applies, read off a picture of every level.
+std::vector<int> map_of(const std::function<int32_t(Image *)> &fn) {
+    Owned ramp = make(16, 16, 8);
+    for (int v = 0; v < 256; ++v)
+        ramp->bits[v / 16 * 16 + v % 16] = uint8_t(v);
+    EXPECT_EQ(fn(ramp.get()), 1);
+    return std::vector<int>(ramp->bits, ramp->bits + 256);
+}
+
+} // namespace
+
+TEST(CurveTables, ValuesAndNonMonotoneSpots) {
+    const std::pair<const uint8_t *, int64_t> tables[] = {
+        {ZANTOMOPI, 6047599}, {ZANTOFILTERBK, 4145935}, {ZANTOFILTER, 6930454}};
+    for (auto [t, want] : tables) {
+        int64_t sum = 0; // weighted, so that a moved entry shows
+        for (int i = 0; i < 256; ++i)
+            sum += int64_t(i + 1) * t[i];
+        EXPECT_EQ(sum, want);
+    }
+    EXPECT_TRUE(drops(ZANTOMOPI).empty());
+    EXPECT_EQ(drops(ZANTOFILTERBK), (std::vector<int>{35, 253, 254, 255}));
+    EXPECT_EQ(drops(ZANTOFILTER), (std::vector<int>{248, 249, 250, 254, 255}));
+    EXPECT_EQ(ZANTOFILTERBK[255] + ZANTOFILTER[253] + ZANTOMOPI[65], 228 + 255 + 87);
+}
+
+TEST(ColorFilter, LevelMaps) {
+    // colour (R in bits 0-7) -> shift; luminance 127 and 128 change nothing
+    const std::pair<uint32_t, int> shifts[] = {{0x000000, -44}, {0xFFFFFF, 47}, {0x0000FF, -17}, {0x00FF00, 8},
+                                               {0xFF0000, -33}, {0x7F7F7F, 0},  {0x808080, 0}};
+    for (auto [colour, delta] : shifts) {
+        std::vector<int> want(256);
+        for (int v = 0; v < 256; ++v)
+            want[v] = std::min(255, std::max(0, v + delta));
+        EXPECT_EQ(map_of([&](Image *i) { return ColorFilter(i, colour, nullptr); }), want) << colour;
+    }
+    for (int level : {0, 1, 60, 127, 129, 200, 255}) {
+        // A circle through both ends bowed by the strength; darkening inverts it.
+        const int a = (std::abs(level - 128) >> 1) + 128, r = int(std::sqrt(double(a * a / 2)));
+        const int s = 255 - r, k = (s * s + r * r - 512 * s) / 510, c = 255 - k;
+        const int d = std::abs(level - 128), e = 127 - d;
+        const uint8_t *curve = level > 128 ? ZANTOFILTER : ZANTOFILTERBK;
+        std::vector<int> t(256), inv(256, 0), blend(256);
+        for (int i = 0; i < 256; ++i) {
+            const double q = double(k * k + c * c - (i - c) * (i - c));
+            t[i] = std::min(255, std::max(0, q < 0 ? 0 : int(std::sqrt(q) - std::abs(k))));
+            blend[i] = ((e * i + d * curve[i] + 63) / 127) & 255;
+        }
+        for (int j = 0; j < 256 && level < 128; ++j)
+            inv[t[j]] = j;
+        for (int v = 255, last = 0; v >= 0 && level < 128; --v)
+            t[v] = last = inv[v] ? inv[v] : last;
+        EXPECT_EQ(map_of([&](Image *i) { return ColorFilter1(i, level); }), t) << level;
+        EXPECT_EQ(map_of([&](Image *i) { return ColorFilter_zanto(i, level); }), blend) << level;
+    }
+}
+
+TEST(ColorFilter, TintAndMasks) {
+    Owned mask = random_image(7, 11, 8, 99), gray = random_image(13, 9, 8, 1), rgb = random_image(13, 9, 24, 2);
+    Owned gray0 = clone(gray.get()), rgb0 = clone(rgb.get());
+    mask->bits[0] = 0;
+    ASSERT_EQ(ColorFilter(gray.get(), 0, mask.get()) + ColorFilter24(rgb.get(), 0xFF0080, mask.get()), 2);
+    for (int y = 0; y < 9; ++y)
+        for (int x = 0; x < 13; ++x) {
+            const bool sel = x < 7 && GetPixelIndex(mask.get(), x, y) != 0;
+            const int v = GetPixelIndex(gray0.get(), x, y);
+            EXPECT_EQ(GetPixelIndex(gray.get(), x, y), sel ? std::max(0, v - 44) : v);
+            const uint32_t c = GetPixelColor(rgb0.get(), x, y), target[3] = {0xFF, 0x00, 0x80};
+            for (int k = 0; k < 3; ++k) { // pixel bytes blue, green, red against colour bits 16-23, 8-15, 0-7
+                const uint32_t b = (c >> 8 * k) & 255;
+                EXPECT_EQ((GetPixelColor(rgb.get(), x, y) >> 8 * k) & 255, sel ? (210 * b + 45 * target[k]) / 255 : b);
+            }
+        }
+}
+
+TEST(ColorFilter, Refusals) {
+    Owned img = random_image(6, 6, 8, 70), before = clone(img.get()), rgb = random_image(6, 6, 24, 71);
+    for (int level : {128, -1, 256, INT32_MIN})
+        EXPECT_EQ(ColorFilter1(img.get(), level) + ColorFilter_zanto(img.get(), level), 0);
+    EXPECT_EQ(ColorFilter1(rgb.get(), 200) + ColorFilter_zanto(rgb.get(), 200) + ColorFilter_zanto(nullptr, 200), 0);
+    EXPECT_EQ(ColorFilter(rgb.get(), 0, nullptr) + ColorFilter(img.get(), 0, rgb.get()), 0);
+    EXPECT_EQ(ColorFilter24(img.get(), 0, nullptr) + ColorFilter24(rgb.get(), 0, rgb.get()), 0);
+    EXPECT_EQ(diff(img.get(), before.get()), "");
+}
