@@ -12,7 +12,6 @@
 #include <cstring>
 
 #include "core/internal/image_check.hpp"
-#include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
