@@ -60,12 +60,7 @@ TEST(Conversions, MatchIndependentModel) {
             ASSERT_EQ(pxfx::colour::div_small(n, d), n / d) << n << " / " << d;
 }
 
-TEST(Conversions, GraysAndHueToRGB) {
-    for (uint32_t v = 0; v < 256; ++v) { // achromatic hue 170, exact round trip
-        const uint32_t g = v * 0x010101u | 0x5A000000u;
-        EXPECT_EQ(RGBtoHSL(g), 0x5AAA0000u | v);
-        EXPECT_EQ(HSLtoRGB(RGBtoHSL(g)), g);
-    }
+TEST(Conversions, HueToRGB) {
     // Hues above 255 fold back by 255; a falling span and results wrap modulo 65536.
     EXPECT_EQ(HueToRGB(10, 200, 256), HueToRGB(10, 200, 1));
     EXPECT_EQ(HueToRGB(10, 200, 169), 10 + (190 * 6 + 126) / 255);

@@ -50,7 +50,9 @@ TEST(ColorFilter, LevelMaps) {
     // colour (R in bits 0-7) -> shift; luminance 127 and 128 change nothing
     const std::pair<uint32_t, int> shifts[] = {{0x000000, -44}, {0xFFFFFF, 47}, {0x0000FF, -17}, {0x00FF00, 8},
                                                {0xFF0000, -33}, {0x7F7F7F, 0},  {0x808080, 0}};
-    for (auto [colour, delta] : shifts) {
+    for (const auto &shift : shifts) {
+        const uint32_t colour = shift.first;
+        const int delta = shift.second;
         std::vector<int> want(256);
         for (int v = 0; v < 256; ++v)
             want[v] = std::min(255, std::max(0, v + delta));
