@@ -7,6 +7,7 @@
 
 namespace pxop {
 
+void add_color(std::vector<Operation> &table);
 void add_effects(std::vector<Operation> &table);
 void add_deform(std::vector<Operation> &table);
 void add_toolkit(std::vector<Operation> &table);

@@ -1,5 +1,7 @@
 #include "operations.hpp"
 
+#include <algorithm>
+
 #include "operation_groups.hpp"
 #include "operation_kit.hpp"
 
@@ -10,9 +12,16 @@ namespace {
 std::vector<Operation> build_table() {
     std::vector<Operation> t;
     add_effects(t);
+    add_color(t);
     add_deform(t);
     add_toolkit(t);
     add_lines(t);
+    // Keep each group together, groups in the order they first appear.
+    std::vector<std::string_view> groups;
+    for (const Operation &op : t)
+        if (std::find(groups.begin(), groups.end(), op.group) == groups.end()) groups.push_back(op.group);
+    auto rank = [&](const Operation &op) { return std::find(groups.begin(), groups.end(), op.group) - groups.begin(); };
+    std::stable_sort(t.begin(), t.end(), [&](const Operation &a, const Operation &b) { return rank(a) < rank(b); });
     return t;
 }
 

@@ -1,4 +1,4 @@
-// Table entries of the packed-image toolkit.
+// Table entries of the packed-image toolkit and the curve-table colour filters.
 #include <algorithm>
 
 #include "operation_groups.hpp"
@@ -6,6 +6,7 @@
 
 namespace pxop {
 
+using kit::in_place;
 using kit::packed_in_place;
 using kit::packed_new;
 
@@ -275,6 +276,44 @@ void add_toolkit(std::vector<Operation> &t) {
                  [](const Image *in, const Args &) {
                      return packed_in_place(
                          in, [](PXImage *p) { return EffectPaint_BlueRowData(p->data, p->width, p->height), true; });
+                 }});
+    t.push_back({"color-filter",
+                 "ColorFilter",
+                 "Curve filters",
+                 "Brightness shift by a colour's luminance",
+                 {{"red", true, 0, 255, 230, ""}, {"green", true, 0, 255, 200, ""}, {"blue", true, 0, 255, 150, ""}},
+                 kGray8,
+                 [](const Image *in, const Args &a) {
+                     const uint32_t c = uint32_t(a.i(0)) | uint32_t(a.i(1)) << 8 | uint32_t(a.i(2)) << 16;
+                     return in_place(in, [&](Image *p) { return ColorFilter(p, c, nullptr) == 1; });
+                 }});
+    t.push_back({"tint",
+                 "ColorFilter24",
+                 "Curve filters",
+                 "Tint 45/255 of the way toward a colour",
+                 {{"red", true, 0, 255, 255, ""}, {"green", true, 0, 255, 140, ""}, {"blue", true, 0, 255, 40, ""}},
+                 kBgr24,
+                 [](const Image *in, const Args &a) {
+                     const uint32_t c = uint32_t(a.i(0)) | uint32_t(a.i(1)) << 8 | uint32_t(a.i(2)) << 16;
+                     return in_place(in, [&](Image *p) { return ColorFilter24(p, c, nullptr) == 1; });
+                 }});
+    t.push_back({"arc-curve",
+                 "ColorFilter1",
+                 "Curve filters",
+                 "Circular-arc tone curve (128 neutral, refused)",
+                 {{"level", true, 0, 255, 190, "above 128 brightens, below darkens"}},
+                 kGray8,
+                 [](const Image *in, const Args &a) {
+                     return in_place(in, [&](Image *p) { return ColorFilter1(p, a.i(0)) == 1; });
+                 }});
+    t.push_back({"zanto",
+                 "ColorFilter_zanto",
+                 "Curve filters",
+                 "Signature brightening or darkening curve",
+                 {{"level", true, 0, 255, 200, "above 128 brightens, below darkens"}},
+                 kGray8,
+                 [](const Image *in, const Args &a) {
+                     return in_place(in, [&](Image *p) { return ColorFilter_zanto(p, a.i(0)) == 1; });
                  }});
 }
 
