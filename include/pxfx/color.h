@@ -40,12 +40,25 @@ PXFX_API uint32_t XYZtoRGB(uint32_t colour);
 
 /* ---- Channel planes -------------------------------------------------------- */
 
-/* Splits src into three new 8-bit planes (first component, second, third) and
- * optionally an alpha plane, releasing images already in the slots. 1 or 0. */
+/* Splits src (any bit count the pixel readers handle) into three new 8-bit
+ * planes of its size (first component, second, third) and, when alphaPlane is
+ * not null, an alpha plane. Images already held in the slots are released;
+ * the new planes belong to the caller. If the alpha plane cannot be made,
+ * *alphaPlane is null and the call still succeeds. Returns 1, or 0 when src is
+ * null or has no pixels, when any of the three plane slots is null (a partial
+ * set is refused, nothing is touched), when two slots are the same pointer, or
+ * when a plane cannot be made (the three slots are then released and null).
+ * A slot may hold src itself: the old images are released after the split. */
 PXFX_API int32_t Split(const Image *src, Image **plane1, Image **plane2, Image **plane3, Image **alphaPlane,
                        int32_t mode);
-/* Joins three 8-bit planes (and an optional alpha plane) into a new 24-bit (32-bit
- * with alpha) image; null on failure. Caller owns the result. */
+/* Joins three planes (and an optional alpha plane) into a new image of
+ * plane1's size: 32-bit with an alpha plane, else 24-bit. plane2 and plane3
+ * must be at least as wide as plane1 and plane2 at least as high; a lower
+ * plane3 and an alpha plane of any size are read with edge clamping. Planes
+ * are read as GetPixelIndex does (a plane of more than 8 bits reads as 0).
+ * Returns null when a plane is null or has no pixels (the alpha plane too,
+ * when given), on the size rules above, or when memory runs out. Caller owns
+ * the result. */
 PXFX_API Image *Combine(const Image *plane1, const Image *plane2, const Image *plane3, const Image *alphaPlane,
                         int32_t mode);
 

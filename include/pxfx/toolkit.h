@@ -106,21 +106,31 @@ PXFX_API int32_t EffectPaint_BlueRowData(uint8_t *plane, int32_t width, int32_t 
 
 /* ---- Curve-table colour filters ------------------------------------------------------- */
 
-/* Gentle lifting curve. */
+/* Gentle lifting curve (not used by the filters below). */
 PXFX_API extern const uint8_t ZANTOMOPI[256];
-/* Darkening curve of ColorFilter_zanto. */
+/* Darkening curve of ColorFilter_zanto; not monotone near its top end. */
 PXFX_API extern const uint8_t ZANTOFILTERBK[256];
-/* Brightening curve of ColorFilter_zanto. */
+/* Brightening curve of ColorFilter_zanto; not monotone near its top end. */
 PXFX_API extern const uint8_t ZANTOFILTER[256];
 
-/* Shifts an 8-bit image by the luminance of a colour (R bits 0-7, G 8-15, B 16-23),
- * optionally where an 8-bit mask is set. 1 or 0. */
+/* Shifts every sample of an 8-bit image by the luminance of a colour (R bits
+ * 0-7, G 8-15, B 16-23): -44..+47, nothing for luminance 127 or 128. With a
+ * mask only the top-left area common to both records is visited, and there
+ * only samples whose mask byte is non-zero change. 1, or 0 when img is not an
+ * 8-bit image with pixels or a mask is given that is not one either. */
 PXFX_API int32_t ColorFilter(Image *img, uint32_t colour, const Image *mask);
-/* Tints a 24-bit image 45/255 of the way toward a colour (R bits 0-7), optionally masked. 1 or 0. */
+/* Tints a 24-bit image 45/255 of the way toward a colour (R bits 0-7, G 8-15,
+ * B 16-23), optionally masked as ColorFilter. 1, or 0 when img is not a 24-bit
+ * image with pixels or a given mask is not an 8-bit image with pixels. */
 PXFX_API int32_t ColorFilter24(Image *img, uint32_t colour, const Image *mask);
-/* Circular-arc tone curve of an 8-bit image by level (128 neutral, refused). 1 or 0. */
+/* Circular-arc tone curve of an 8-bit image: level 129..255 brightens, 0..127
+ * darkens (the mirrored curve). 1, or 0 for level 128, a level outside 0..255
+ * or an image that is not 8-bit with pixels. */
 PXFX_API int32_t ColorFilter1(Image *img, int32_t level);
-/* Blend of identity and ZANTOFILTER (level > 128) or ZANTOFILTERBK (level < 128) on an 8-bit plane. 1 or 0. */
+/* Blend of identity and ZANTOFILTER (level 129..255) or ZANTOFILTERBK (level
+ * 0..127) by |level - 128| / 127, rounded, on every sample of an 8-bit plane.
+ * 1, or 0 for level 128, a level outside 0..255 or an image that is not 8-bit
+ * with pixels. */
 PXFX_API int32_t ColorFilter_zanto(Image *img, int32_t level);
 
 #ifdef __cplusplus

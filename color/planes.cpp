@@ -1,0 +1,137 @@
+// Channel planes: Split turns a picture into three 8-bit component planes (and
+// an alpha plane) of one colour space, Combine joins them back into RGB. Both
+// walk rows and run the conversion inline, specialised per format and mode.
+#include <pxfx/color.h>
+
+#include "color/colorspace.hpp"
+#include "core/internal/image_check.hpp"
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+
+using namespace pxfx;
+using namespace pxfx::colour;
+
+namespace {
+
+template <class F, Mode M, bool Alpha> void split_rows(const Image *src, Image *p1, Image *p2, Image *p3, Image *pa) {
+    const int32_t w = src->width;
+    for (int32_t y = 0; y < src->height; ++y) {
+        const typename F::CRow in = F::crow(src, y);
+        uint8_t *o1 = row_ptr(p1, y), *o2 = row_ptr(p2, y), *o3 = row_ptr(p3, y);
+        uint8_t *oa = Alpha ? row_ptr(pa, y) : nullptr;
+        for (int32_t x = 0; x < w; ++x) {
+            const uint32_t c = from_rgb<M>(F::load(in, x));
+            o1[x] = static_cast<uint8_t>(c >> 16);
+            o2[x] = static_cast<uint8_t>(c >> 8);
+            o3[x] = static_cast<uint8_t>(c);
+            if constexpr (Alpha) oa[x] = static_cast<uint8_t>(c >> 24);
+        }
+    }
+}
+
+// Releases the images held in the slots (each distinct image once) and
+// clears the slots.
+void release_slots(Image **const *slots, int n) {
+    for (int i = 0; i < n; ++i) {
+        Image *held = *slots[i];
+        if (held == nullptr) continue;
+        for (int j = i; j < n; ++j)
+            if (*slots[j] == held) *slots[j] = nullptr;
+        free_Image(&held, 0);
+    }
+}
+
+// Row source of a plane for Combine: the plane's own row when it is an 8-bit
+// record at least `width` wide, else the row read through GetPixelIndex
+// (clamped) into a scratch row.
+struct PlaneRows {
+    const Image *im;
+    bool direct;
+    uint8_t *scratch = nullptr;
+    PlaneRows(const Image *plane, int32_t width) : im(plane), direct(plane->bitCount == 8 && plane->width >= width) {}
+    const uint8_t *row(int32_t y, int32_t width) const {
+        if (direct) return row_ptr(im, y < im->height ? y : im->height - 1);
+        for (int32_t x = 0; x < width; ++x)
+            scratch[x] = GetPixelIndex(im, x, y);
+        return scratch;
+    }
+};
+
+template <Mode M, int Bpp>
+void combine_rows(Image *out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3, const PlaneRows *ra) {
+    const int32_t w = out->width;
+    for (int32_t y = 0; y < out->height; ++y) {
+        const uint8_t *c1 = r1.row(y, w), *c2 = r2.row(y, w), *c3 = r3.row(y, w);
+        const uint8_t *ca = Bpp == 4 ? ra->row(y, w) : nullptr;
+        uint8_t *o = row_ptr(out, y);
+        for (int32_t x = 0; x < w; ++x) {
+            const uint32_t a = Bpp == 4 ? ca[x] : 0;
+            const uint32_t c = to_rgb<M>(pack(c3[x], c2[x], c1[x], a));
+            o[Bpp * x] = static_cast<uint8_t>(c);
+            o[Bpp * x + 1] = static_cast<uint8_t>(c >> 8);
+            o[Bpp * x + 2] = static_cast<uint8_t>(c >> 16);
+            if constexpr (Bpp == 4) o[Bpp * x + 3] = static_cast<uint8_t>(c >> 24);
+        }
+    }
+}
+
+} // namespace
+
+extern "C" {
+
+int32_t Split(const Image *src, Image **plane1, Image **plane2, Image **plane3, Image **alphaPlane, int32_t mode) {
+    if (!has_pixels(src) || plane1 == nullptr || plane2 == nullptr || plane3 == nullptr) return 0;
+    if (plane1 == plane2 || plane1 == plane3 || plane2 == plane3) return 0;
+    if (alphaPlane != nullptr && (alphaPlane == plane1 || alphaPlane == plane2 || alphaPlane == plane3)) return 0;
+    const int32_t w = src->width, h = src->height;
+    ImagePtr p1 = make_image(w, h, 8), p2 = make_image(w, h, 8), p3 = make_image(w, h, 8);
+    Image **const planes[4] = {plane1, plane2, plane3, alphaPlane};
+    if (!p1 || !p2 || !p3) {
+        release_slots(planes, 3);
+        return 0;
+    }
+    ImagePtr pa = alphaPlane != nullptr ? make_image(w, h, 8) : ImagePtr();
+    with_format(src->bitCount, [&](auto f) {
+        with_mode(mode, [&](auto m) {
+            if (pa)
+                split_rows<decltype(f), decltype(m)::value, true>(src, p1.get(), p2.get(), p3.get(), pa.get());
+            else
+                split_rows<decltype(f), decltype(m)::value, false>(src, p1.get(), p2.get(), p3.get(), nullptr);
+        });
+    });
+    // The old images go only now: a slot may hold the source itself.
+    release_slots(planes, alphaPlane != nullptr ? 4 : 3);
+    *plane1 = p1.release();
+    *plane2 = p2.release();
+    *plane3 = p3.release();
+    if (alphaPlane != nullptr) *alphaPlane = pa.release();
+    return 1;
+}
+
+Image *Combine(const Image *plane1, const Image *plane2, const Image *plane3, const Image *alphaPlane, int32_t mode) {
+    if (!has_pixels(plane1) || !has_pixels(plane2) || !has_pixels(plane3)) return nullptr;
+    if (alphaPlane != nullptr && !has_pixels(alphaPlane)) return nullptr;
+    const int32_t w = plane1->width, h = plane1->height;
+    if (plane2->width < w || plane3->width < w || plane2->height < h) return nullptr;
+    PlaneRows r1(plane1, w), r2(plane2, w), r3(plane3, w);
+    PlaneRows ra(alphaPlane != nullptr ? alphaPlane : plane1, w);
+    PlaneRows *rows[4] = {&r1, &r2, &r3, alphaPlane != nullptr ? &ra : nullptr};
+    Buffer<uint8_t> scratch;
+    for (int i = 0; i < 4; ++i)
+        if (rows[i] != nullptr && !rows[i]->direct) {
+            if (!scratch) scratch = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(w), 4));
+            if (!scratch) return nullptr;
+            rows[i]->scratch = scratch.get() + static_cast<size_t>(i) * w;
+        }
+    Image *out = malloc_Image(w, h, alphaPlane != nullptr ? 32 : 24);
+    if (out == nullptr) return nullptr;
+    with_mode(mode, [&](auto m) {
+        if (alphaPlane != nullptr)
+            combine_rows<decltype(m)::value, 4>(out, r1, r2, r3, &ra);
+        else
+            combine_rows<decltype(m)::value, 3>(out, r1, r2, r3, nullptr);
+    });
+    return out;
+}
+
+} // extern "C"
