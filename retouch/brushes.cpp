@@ -1,7 +1,9 @@
 // Cached brushes: each keeps a prepared whole-picture image in a caller's
 // slot, so a stroke of many dabs prepares it once and then only pastes it
 // with the soft round paste.
+#include <pxfx/color.h>
 #include <pxfx/retouch.h>
+#include <pxfx/toolkit.h>
 
 #include <algorithm>
 #include <cstring>
@@ -10,6 +12,7 @@
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/result.hpp"
 #include "retouch/retouch_common.hpp"
 
 using namespace pxfx;
@@ -41,6 +44,53 @@ template <class FS, class FD> void shift_into(const Image *pic, Image *copy, int
     }
 }
 
+bool brushable(const Image *img) { return has_pixels(img) && (img->bitCount == 24 || img->bitCount == 32); }
+
+// Whether the slot holds a prepared image for the picture made with `tag`.
+bool cache_matches(Image **cache, const Image *picture, uint32_t tag) {
+    return cache != nullptr && *cache != nullptr && same_geometry(*cache, picture) && (*cache)->tag == tag;
+}
+
+// The picture with its red, green and blue planes passed through the zanto
+// curves of their levels; null when a plane cannot be made.
+Image *tinted_copy(const Image *picture, const PXTint &tint) {
+    constexpr int32_t kRgb = 0;
+    Image *red = nullptr, *green = nullptr, *blue = nullptr, *alpha = nullptr;
+    if (!Split(picture, &red, &green, &blue, picture->bitCount == 32 ? &alpha : nullptr, kRgb)) return nullptr;
+    ColorFilter_zanto(red, tint.red);
+    ColorFilter_zanto(green, tint.green);
+    ColorFilter_zanto(blue, tint.blue);
+    Image *out = Combine(red, green, blue, alpha, kRgb);
+    free_Image(&red, 0);
+    free_Image(&green, 0);
+    free_Image(&blue, 0);
+    free_Image(&alpha, 0);
+    return out;
+}
+
+// Uses the slot's image when it matches `tag`, else releases it and stores a
+// freshly prepared one (kept in `temp` when there is no slot); pastes it
+// softly at (cx, cy) when r is non-zero.
+template <class Prepare>
+int32_t cached_brush(Image *picture, Image **cache, uint32_t tag, int32_t cx, int32_t cy, int32_t r, Prepare prepare) {
+    ImagePtr temp;
+    Image *prepared = nullptr;
+    if (cache_matches(cache, picture, tag)) {
+        prepared = *cache;
+    } else {
+        if (cache != nullptr) free_Image(cache, 0);
+        prepared = prepare();
+        if (prepared == nullptr) return 0;
+        if (cache != nullptr)
+            *cache = prepared;
+        else
+            temp.reset(prepared);
+    }
+    prepared->tag = tag;
+    if (r != 0) PointArea_Copy(picture, prepared, cx, cy, r);
+    return 1;
+}
+
 } // namespace
 
 extern "C" {
@@ -66,6 +116,22 @@ int32_t PX_Mimic(Image *picture, int32_t srcX, int32_t srcY, const Image *refere
                      [&](auto fs, auto fd) { shift_into<decltype(fs), decltype(fd)>(picture, copy, dx, dy); });
     }
     if (r != 0) PointArea_Copy(picture, copy, cx, cy, r);
+    return 1;
+}
+
+int32_t alg_Blending(Image *picture, void *, int32_t cx, int32_t cy, PXTint tint, int32_t r, Image **cache) {
+    if (!brushable(picture)) return 0;
+    const uint32_t tag = tint.red | static_cast<uint32_t>(tint.green) << 8 | static_cast<uint32_t>(tint.blue) << 16;
+    return cached_brush(picture, cache, tag, cx, cy, r, [&] { return tinted_copy(picture, tint); });
+}
+
+int32_t alg_Img_Blending(Image *src, Image **out) {
+    Image *tinted = nullptr;
+    alg_Blending(src, nullptr, 0, 0, PXTint{201, 189, 203}, 0, &tinted);
+    ImagePtr owned(tinted);
+    Image *target = out == nullptr ? (has_pixels(src) ? src : nullptr) : acquire_result(src, out);
+    if (target == nullptr || !owned) return 0;
+    PX_Img_Copy(target, owned.get());
     return 1;
 }
 

@@ -135,4 +135,21 @@ void lift_pixels(const Image *src, Image *dst, const uint8_t *amount, size_t str
     }
 }
 
+// Maps blue, green and red of every pixel through per-channel tables in
+// place; alpha kept.
+template <class F> void map_channels(Image *img, const uint8_t tb[256], const uint8_t tg[256], const uint8_t tr[256]) {
+    for (int32_t y = 0; y < img->height; ++y) {
+        const typename F::CRow in = F::crow(img, y);
+        const typename F::Row out = F::row(img, y);
+        for (int32_t x = 0; x < img->width; ++x) {
+            const uint32_t c = F::load(in, x);
+            F::store(out, x, pack(tb[blue_of(c)], tg[green_of(c)], tr[red_of(c)], alpha_of(c)));
+        }
+    }
+}
+
+inline void map_channels(Image *img, const uint8_t table[256]) {
+    with_format(img->bitCount, [&](auto f) { map_channels<decltype(f)>(img, table, table, table); });
+}
+
 } // namespace pxfx

@@ -9,6 +9,7 @@
 #include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "retouch/retouch_common.hpp"
 
 using namespace pxfx;
 
@@ -61,24 +62,13 @@ template <class F> void lighten_crescent(Image *img, const Crescent &k, int64_t 
 
 // Raises blue, green and red of every pixel by level, capped at 255 (a
 // negative level keeps the low byte).
-template <class F> void brighten_pixels(Image *img, const uint8_t table[256]) {
-    for (int32_t y = 0; y < img->height; ++y) {
-        const typename F::CRow in = F::crow(img, y);
-        const typename F::Row out = F::row(img, y);
-        for (int32_t x = 0; x < img->width; ++x) {
-            const uint32_t c = F::load(in, x);
-            F::store(out, x, pack(table[blue_of(c)], table[green_of(c)], table[red_of(c)], alpha_of(c)));
-        }
-    }
-}
-
 void brighten(Image *img, int32_t level) {
     uint8_t table[256];
     for (int32_t i = 0; i < 256; ++i) {
         const int64_t v = static_cast<int64_t>(i) + level;
         table[i] = v > 255 ? 255 : static_cast<uint8_t>(v);
     }
-    with_format(img->bitCount, [&](auto f) { brighten_pixels<decltype(f)>(img, table); });
+    map_channels(img, table);
 }
 
 bool brushable(const Image *img) { return has_pixels(img) && (img->bitCount == 24 || img->bitCount == 32); }
