@@ -15,7 +15,7 @@ result against the six-decimal rows listed in the reference's matrixX table,
 and writes color/gaussian_table.cpp with exact (%.9g) literals.
 
 The build never runs this script; its output is committed. Run it from the
-repository root after changing a table, then clang-format the outputs.
+repository root after changing a table.
 """
 
 import math
@@ -66,6 +66,7 @@ def emit_curves(lines):
         'extern "C" {',
         "",
     ]
+    out.append("// clang-format off")
     for name in CURVES:
         values = curve_table(lines, name)
         out.append("// %s" % CURVE_DOCS[name])
@@ -74,6 +75,7 @@ def emit_curves(lines):
             out.append("    " + ", ".join(str(v) for v in values[16 * r:16 * r + 16]) + ",")
         out.append("};")
         out.append("")
+    out.append("// clang-format on")
     out.append('} // extern "C"')
     return "\n".join(out) + "\n"
 
@@ -120,11 +122,13 @@ def emit_gaussian(rows):
         "",
         'extern "C" {',
         "",
+        "// clang-format off",
         "const float matrixX[10][21] = {",
     ]
     for row in rows:
         out.append("    {" + ", ".join(("%.9gf" % v) if v else "0.0f" for v in row) + "},")
     out.append("};")
+    out.append("// clang-format on")
     out.append("")
     out.append('} // extern "C"')
     return "\n".join(out) + "\n"

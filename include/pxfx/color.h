@@ -74,22 +74,42 @@ PXFX_API int32_t PX_IMG_Transform(const Image *src, Image **out, int32_t amount,
 
 /* ---- Kernel convolution ------------------------------------------------------ */
 
-/* Normalised Gaussian kernels: row r - 1 holds radius r (taps 0..2r), zero-padded. */
+/* Normalised Gaussian kernels: row r - 1 holds radius r (taps 0..2r, sigma
+ * r / 3, each row summing to 1), zero-padded. Not read by Filter. */
 PXFX_API extern const float matrixX[10][21];
 
-/* Convolves src with a size x size kernel, divides, offsets and clamps; into dst
- * (same size and bit count) or, with dst null, in place. An 8-bit mask selects
- * pixels of 8-bit images and limits the area of others; gray >= 1 writes gray.
- * 1, or 0 for no pixels or a failed allocation. */
+/* Convolves src with a size x size kernel (row-major; weight of the source
+ * pixel at (x + dx, y + dy) at [(dy + size/2) * size + dx + size/2]), sums in
+ * 32-bit integers (wrapping), divides by divisor (none for 0), adds offset and
+ * clamps to 0..255. Source reads repeat the edge pixels.
+ *  - Writes into dst (any size: its width x height is processed), or with dst
+ *    null into a working image that is then copied back into src and released
+ *    whole (record and pixels). A dst whose pixels overlap src's is filtered
+ *    from a snapshot of src, as if it were a separate image.
+ *  - An 8-bit mask limits the processed area to its width x height. For an
+ *    8-bit result the mask also selects: where its byte is 0 the source index
+ *    is copied; a mask of another bit count only selects, bytes outside its
+ *    rows counting as set. A mask without pixels is ignored.
+ *  - 8-bit results read the source as GetPixelIndex does, 24- and 32-bit ones
+ *    as GetPixelColor does; gray >= 1 writes (B + 2G + R) >> 2 to all three
+ *    channels. A 32-bit result takes the alpha of the bottom-right tap's pixel
+ *    (x + size - size/2 - 1, y + size - size/2 - 1, clamped), or keeps its own
+ *    alpha when size <= 0 (no taps: every channel is the clamped offset).
+ *  - Other result bit counts are not written (in place, a 16-bit src thus
+ *    turns white).
+ * Returns 1, or 0 when src or a given dst has no pixels, the kernel is null
+ * with size > 0, size * size exceeds 2^31 - 1, or memory runs out. */
 PXFX_API int32_t Filter(Image *src, const int32_t *kernel, int32_t size, int32_t divisor, int32_t offset,
                         const Image *mask, Image *dst, int32_t gray);
-/* 3 x 3 mean into *out (reused when it fits). Result of Filter, or 0. */
+/* 3 x 3 mean into *out (reused when its width, height and bit count match,
+ * else replaced). Result of Filter, or 0 for a null src or out, or a src
+ * without pixels. The three below follow the same rules. */
 PXFX_API int32_t PX_IMG_Blur(const Image *src, Image **out);
-/* 3 x 3 soften (centre weight 8, divisor 16) into *out. Result of Filter, or 0. */
+/* 3 x 3 soften (centre weight 8, divisor 16) into *out. */
 PXFX_API int32_t PX_IMG_Soften(const Image *src, Image **out);
-/* 3 x 3 sharpen (centre 15, divisor 7) into *out. Result of Filter, or 0. */
+/* 3 x 3 sharpen (centre 15, others -1, divisor 7) into *out. */
 PXFX_API int32_t PX_IMG_Sharpen(const Image *src, Image **out);
-/* Gray diagonal relief around 127 into *out. Result of Filter, or 0. */
+/* Gray diagonal relief 127 + (pixel (x-1, y+1) - pixel (x+1, y-1)) into *out. */
 PXFX_API int32_t PX_IMG_Emboss1(const Image *src, Image **out);
 
 /* ---- Fast box smoothing ------------------------------------------------------- */

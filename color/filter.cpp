@@ -1,0 +1,271 @@
+// Square-kernel convolution (Filter) and the four 3 x 3 kernel effects.
+//
+// The filter works a row at a time: every non-zero tap adds its weighted
+// source row into 32-bit row sums (wrapping as 32-bit integers do), the part
+// of the row whose reads stay inside the picture in one contiguous loop and
+// the parts that fall off either edge with the edge pixel. Sums are finished
+// per pixel: divided, offset, clamped.
+#include <pxfx/color.h>
+
+#include <algorithm>
+#include <cstdint>
+#include <cstring>
+
+#include "core/internal/image_check.hpp"
+#include "core/internal/math.hpp"
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+#include "core/internal/result.hpp"
+
+using namespace pxfx;
+
+namespace {
+
+struct Tap {
+    int32_t dx, dy;
+    uint32_t weight;
+};
+
+// The non-zero taps of a size x size kernel. Offsets beyond reach - 1 (in
+// either direction) read the same clamped pixel for every output pixel, so
+// they are folded onto offset +-(reach - 1) and their weights added; this keeps
+// the work bounded by the picture whatever the kernel size.
+struct Taps {
+    Buffer<Tap> list;
+    size_t count = 0;
+    bool ok = true;
+
+    Taps(const int32_t *kernel, int32_t size, int32_t reachX, int32_t reachY) {
+        if (size <= 0) return;
+        const int32_t half = size / 2;
+        auto fold = [](int32_t d, int32_t reach) { return std::clamp(d, 1 - reach, reach - 1); };
+        const int32_t x0 = fold(-half, reachX), x1 = fold(size - half - 1, reachX);
+        const int32_t y0 = fold(-half, reachY), y1 = fold(size - half - 1, reachY);
+        const size_t gw = static_cast<size_t>(x1 - x0 + 1), gh = static_cast<size_t>(y1 - y0 + 1);
+        Buffer<uint32_t> grid = alloc_zeroed<uint32_t>(checked_size(gw, gh));
+        list = alloc_buffer<Tap>(checked_size(gw, gh));
+        if (!grid || !list) {
+            ok = false;
+            return;
+        }
+        for (int32_t ky = 0; ky < size; ++ky) {
+            const size_t gy = static_cast<size_t>(fold(ky - half, reachY) - y0);
+            const int32_t *krow = kernel + static_cast<size_t>(ky) * static_cast<size_t>(size);
+            for (int32_t kx = 0; kx < size; ++kx)
+                grid[gy * gw + static_cast<size_t>(fold(kx - half, reachX) - x0)] += static_cast<uint32_t>(krow[kx]);
+        }
+        for (size_t gy = 0; gy < gh; ++gy)
+            for (size_t gx = 0; gx < gw; ++gx)
+                if (const uint32_t k = grid[gy * gw + gx]; k != 0)
+                    list[count++] = {x0 + static_cast<int32_t>(gx), y0 + static_cast<int32_t>(gy), k};
+    }
+};
+
+// sum / divisor (none for 0) + offset, clamped. The quotient of two 32-bit
+// integers is exact in double and truncates like integer division.
+struct Finish {
+    double divisor;
+    int64_t offset;
+    uint8_t operator()(uint32_t acc) const {
+        const int32_t sum = static_cast<int32_t>(acc);
+        const int64_t q =
+            divisor != 0.0 ? static_cast<int64_t>(static_cast<double>(sum) / divisor) : static_cast<int64_t>(sum);
+        const int64_t v = q + offset;
+        return static_cast<uint8_t>(v < 0 ? 0 : (v > 255 ? 255 : v));
+    }
+};
+
+// Adds every tap's weighted source row to acc (S bytes per pixel, W output
+// pixels), reading with the edge rows and columns repeated.
+template <int S> void accumulate(const Image *src, const Taps &taps, int32_t y, int32_t width, uint32_t *acc) {
+    const int32_t w = src->width, h = src->height;
+    std::memset(acc, 0, sizeof(uint32_t) * S * static_cast<size_t>(width));
+    for (size_t t = 0; t < taps.count; ++t) {
+        const Tap tap = taps.list[t];
+        const uint8_t *row = row_ptr(src, std::clamp(y + tap.dy, 0, h - 1));
+        const uint32_t k = tap.weight;
+        // Output pixels x in [lo, hi) read inside the row.
+        const int32_t lo = std::clamp(-tap.dx, 0, width), hi = std::clamp(w - tap.dx, lo, width);
+        for (int32_t x = 0; x < lo; ++x)
+            for (int c = 0; c < S; ++c)
+                acc[S * x + c] += k * row[c];
+        const ptrdiff_t shift = static_cast<ptrdiff_t>(S) * tap.dx;
+        for (int32_t j = S * lo; j < S * hi; ++j)
+            acc[j] += k * row[j + shift];
+        const uint8_t *last = row + static_cast<size_t>(S) * (w - 1);
+        for (int32_t x = hi; x < width; ++x)
+            for (int c = 0; c < S; ++c)
+                acc[S * x + c] += k * last[c];
+    }
+}
+
+struct Job {
+    const Image *src; // 8-bit for an 8-bit destination, else 24- or 32-bit
+    Image *dst;
+    const Image *mask; // selects pixels of an 8-bit destination; may be null
+    int32_t width, height;
+    int32_t lastDx, lastDy; // the bottom-right tap, whose alpha a 32-bit result takes
+    bool anyTap;
+    bool gray;
+    Finish finish;
+};
+
+// Mask byte at (x, y) read from the mask's rows; bytes beyond its block count
+// as set.
+bool selected(const Image *mask, int32_t x, int32_t y) {
+    if (y >= mask->height || static_cast<uint32_t>(x) >= mask->pitch) return true;
+    return row_ptr(mask, y)[x] != 0;
+}
+
+void filter_index(const Job &job, const Taps &taps, uint32_t *acc) {
+    const Image *src = job.src;
+    for (int32_t y = 0; y < job.height; ++y) {
+        accumulate<1>(src, taps, y, job.width, acc);
+        uint8_t *out = row_ptr(job.dst, y);
+        const uint8_t *own = row_ptr(src, std::min(y, src->height - 1));
+        for (int32_t x = 0; x < job.width; ++x) {
+            if (job.mask != nullptr && !selected(job.mask, x, y))
+                out[x] = own[std::min(x, src->width - 1)];
+            else
+                out[x] = job.finish(acc[x]);
+        }
+    }
+}
+
+template <int S, int D> void filter_colour(const Job &job, const Taps &taps, uint32_t *acc) {
+    const Image *src = job.src;
+    for (int32_t y = 0; y < job.height; ++y) {
+        accumulate<S>(src, taps, y, job.width, acc);
+        uint8_t *out = row_ptr(job.dst, y);
+        const uint8_t *alphaRow = row_ptr(src, std::clamp(y + job.lastDy, 0, src->height - 1));
+        for (int32_t x = 0; x < job.width; ++x) {
+            uint8_t b = job.finish(acc[S * x]), g = job.finish(acc[S * x + 1]), r = job.finish(acc[S * x + 2]);
+            if (job.gray) b = g = r = static_cast<uint8_t>((b + 2 * g + r) >> 2);
+            uint8_t *p = out + D * x;
+            p[0] = b;
+            p[1] = g;
+            p[2] = r;
+            if constexpr (D == 4) {
+                if (job.anyTap) {
+                    const int32_t ax = std::clamp(x + job.lastDx, 0, src->width - 1);
+                    p[3] = S == 4 ? alphaRow[4 * ax + 3] : 255;
+                }
+            }
+        }
+    }
+}
+
+bool overlaps(const Image *a, const Image *b) {
+    const uintptr_t a0 = reinterpret_cast<uintptr_t>(a->bits), b0 = reinterpret_cast<uintptr_t>(b->bits);
+    return a0 < b0 + block_bytes(b) && b0 < a0 + block_bytes(a);
+}
+
+// A source readable by the row loops: the picture itself when its format is
+// `want` (or 24/32 for colour), else a copy made through the pixel readers
+// (GetPixelIndex for index work, GetPixelColor as 32 bits for colour work).
+struct Source {
+    Image view{};
+    ImagePtr converted;
+    Buffer<uint8_t> snapshot;
+
+    bool prepare(const Image *src, bool index, bool mustCopy) {
+        view = *src;
+        const bool direct = index ? src->bitCount == 8 : (src->bitCount == 24 || src->bitCount == 32);
+        if (direct) {
+            if (!mustCopy) return true;
+            snapshot = alloc_buffer<uint8_t>(block_bytes(src));
+            if (!snapshot) return false;
+            std::memcpy(snapshot.get(), src->bits, block_bytes(src));
+            view.bits = snapshot.get();
+            return true;
+        }
+        converted = make_image(src->width, src->height, index ? 8 : 32);
+        if (!converted) return false;
+        Image *c = converted.get();
+        for (int32_t y = 0; y < src->height; ++y) {
+            uint8_t *row = row_ptr(c, y);
+            for (int32_t x = 0; x < src->width; ++x) {
+                if (index)
+                    row[x] = GetPixelIndex(src, x, y);
+                else
+                    Bgra32::store(row, x, GetPixelColor(src, x, y));
+            }
+        }
+        view = *c;
+        return true;
+    }
+};
+
+int32_t run_filter(const Image *src, const int32_t *kernel, int32_t size, int32_t divisor, int32_t offset,
+                   const Image *mask, Image *dst, int32_t gray) {
+    const uint32_t bits = dst->bitCount;
+    if (bits != 8 && bits != 24 && bits != 32) return 1;
+    if (mask != nullptr && !has_pixels(mask)) mask = nullptr;
+    int32_t width = dst->width, height = dst->height;
+    if (mask != nullptr && mask->bitCount == 8) {
+        width = std::min(width, mask->width);
+        height = std::min(height, mask->height);
+    }
+    Source source;
+    if (!source.prepare(src, bits == 8, overlaps(src, dst))) return 0;
+    const Taps taps(kernel, size, std::max(width, src->width), std::max(height, src->height));
+    Buffer<uint32_t> acc = alloc_buffer<uint32_t>(checked_size(static_cast<uint64_t>(width), 4));
+    if (!taps.ok || !acc) return 0;
+    Job job{&source.view,
+            dst,
+            bits == 8 ? mask : nullptr,
+            width,
+            height,
+            size - size / 2 - 1,
+            size - size / 2 - 1,
+            size > 0,
+            gray >= 1,
+            {divisor == 0 ? 0.0 : static_cast<double>(divisor), offset}};
+    if (bits == 8) {
+        filter_index(job, taps, acc.get());
+    } else {
+        const bool four = source.view.bitCount == 32;
+        if (bits == 24)
+            four ? filter_colour<4, 3>(job, taps, acc.get()) : filter_colour<3, 3>(job, taps, acc.get());
+        else
+            four ? filter_colour<4, 4>(job, taps, acc.get()) : filter_colour<3, 4>(job, taps, acc.get());
+    }
+    return 1;
+}
+
+// The 3 x 3 kernels of the effects, rows top to bottom.
+const int32_t kBlur[9] = {1, 1, 1, 1, 1, 1, 1, 1, 1};
+const int32_t kSoften[9] = {1, 1, 1, 1, 8, 1, 1, 1, 1};
+const int32_t kSharpen[9] = {-1, -1, -1, -1, 15, -1, -1, -1, -1};
+const int32_t kEmboss[9] = {0, 0, -1, 0, 0, 0, 1, 0, 0};
+
+int32_t kernel_effect(const Image *src, Image **out, const int32_t *kernel, int32_t divisor, int32_t offset,
+                      int32_t gray) {
+    if (src == nullptr || out == nullptr || !has_pixels(src)) return 0;
+    Image *dst = acquire_result(src, out);
+    if (dst == nullptr) return 0;
+    return Filter(const_cast<Image *>(src), kernel, 3, divisor, offset, nullptr, dst, gray);
+}
+
+} // namespace
+
+extern "C" {
+
+int32_t Filter(Image *src, const int32_t *kernel, int32_t size, int32_t divisor, int32_t offset, const Image *mask,
+               Image *dst, int32_t gray) {
+    if (!has_pixels(src)) return 0;
+    if (size > 0 && (kernel == nullptr || checked_size(static_cast<uint64_t>(size), static_cast<uint64_t>(size)) == 0))
+        return 0;
+    if (dst != nullptr) return has_pixels(dst) ? run_filter(src, kernel, size, divisor, offset, mask, dst, gray) : 0;
+    ImagePtr work = make_image(src->width, src->height, static_cast<int32_t>(src->bitCount));
+    if (!work || run_filter(src, kernel, size, divisor, offset, mask, work.get(), gray) == 0) return 0;
+    PX_Img_Copy(src, work.get());
+    return 1;
+}
+
+int32_t PX_IMG_Blur(const Image *src, Image **out) { return kernel_effect(src, out, kBlur, 9, 0, 0); }
+int32_t PX_IMG_Soften(const Image *src, Image **out) { return kernel_effect(src, out, kSoften, 16, 0, 0); }
+int32_t PX_IMG_Sharpen(const Image *src, Image **out) { return kernel_effect(src, out, kSharpen, 7, 0, 0); }
+int32_t PX_IMG_Emboss1(const Image *src, Image **out) { return kernel_effect(src, out, kEmboss, 0, 127, 1); }
+
+} // extern "C"
