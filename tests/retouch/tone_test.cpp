@@ -199,3 +199,36 @@ TEST(CrossMedian, MatchesSortedCrossInEveryMode) {
     Owned deep = random_image(20, 20, 24, 1);
     EXPECT_EQ(MyOneKeyFliter(deep.get(), nullptr), 0);
 }
+
+TEST(ThresholdBlur, NearBlackWindowsAndCurves) {
+    uint32_t seed = 500;
+    for (int32_t bc : kBitCounts)
+        for (auto [w, h] : kSizes)
+            for (auto [size, amount] : {std::pair{1, 50}, {3, 100}, {0, -5}, {14, 130}}) {
+                Owned src = random_image(w, h, bc, seed++);
+                const int32_t sz = std::clamp(size, 1, 10), am = std::clamp(amount, 0, 100);
+                uint8_t curve[3][256];
+                const int32_t a[3] = {am * 75 / 100, am * 61 / 100, am * 73 / 100};
+                for (int c = 0; c < 3; ++c)
+                    for (int i = 0; i < 256; ++i)
+                        curve[c][i] = uint8_t((i * (100 - a[c]) + a[c] * ZANTOMOPI[ZANTOFILTER[i]] + 63) / 100);
+                Owned expected = make(w, h, bc);
+                for (int32_t y = 0; y < h; ++y)
+                    for (int32_t x = 0; x < w; ++x) {
+                        bool dark[3] = {};
+                        uint32_t last = 0;
+                        for (int32_t k = -sz; k <= sz; ++k) {
+                            last = GetPixelColor(src.get(), x + k, y);
+                            for (int c = 0; c < 3; ++c)
+                                dark[c] = dark[c] || ch(last, 8 * c) <= 10;
+                        }
+                        uint32_t o = last & 0xFF000000u;
+                        for (int c = 0; c < 3; ++c)
+                            o |= uint32_t(curve[c][dark[c] ? 0 : ch(last, 8 * c)]) << 8 * c;
+                        SetPixelColor(expected.get(), x, y, o);
+                    }
+                Slot dst;
+                thresholdBlur(0, 0, size, amount, src.get(), &dst);
+                EXPECT_EQ(diff(dst.get(), expected.get()), "") << bc << " " << w << "x" << h << " " << size;
+            }
+}
