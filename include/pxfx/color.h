@@ -64,12 +64,22 @@ PXFX_API Image *Combine(const Image *plane1, const Image *plane2, const Image *p
 
 /* ---- Hue, lightness and saturation ---------------------------------------- */
 
-/* Shifts an 8-bit hue plane by (amount * 255 - 25500) / 100, wrapping by 255. 1 or 0. */
+/* Shifts every value of an 8-bit hue plane by (amount * 255 - 25500) / 100
+ * (amount 100: none, 0: -255, 200: +255), wrapping by 255 past either end.
+ * The step is computed exactly for any amount. 1, or 0 when plane is null,
+ * has no pixels or is not 8-bit. */
 PXFX_API int32_t BaseTran_Hue(Image *plane, int32_t amount);
-/* Shifts an 8-bit saturation or lightness plane by the same step, clamped. 1 or 0. */
+/* Shifts an 8-bit saturation or lightness plane by the same step, clamped to
+ * 0..255. 1 or 0 as BaseTran_Hue. */
 PXFX_API int32_t BaseTran_LS(Image *plane, int32_t amount);
 /* Shifts hue (component 0), saturation (1) or lightness (2) of a picture by a
- * slider amount (100 = unchanged) through HSL planes into *out. 1 or 0. */
+ * slider amount (100 = unchanged; other components change nothing) through
+ * HSL, into *out: a 32-bit picture with the source's alpha. An image already
+ * in *out receives it through PX_Img_Copy (keeping its size and bit count);
+ * with *out null a 32-bit source gets the 32-bit picture itself and other
+ * sources a new image of their own bit count. Returns 1, or 0 when src or out
+ * is null, src has no pixels, *out holds a record without pixels, or memory
+ * runs out (*out is then unchanged). */
 PXFX_API int32_t PX_IMG_Transform(const Image *src, Image **out, int32_t amount, int32_t component);
 
 /* ---- Kernel convolution ------------------------------------------------------ */
@@ -114,11 +124,23 @@ PXFX_API int32_t PX_IMG_Emboss1(const Image *src, Image **out);
 
 /* ---- Fast box smoothing ------------------------------------------------------- */
 
-/* In-place size x size box mean plus offset, clamped, edges repeated; alpha is
- * smoothed too. 1 when processed, 0 when refused. */
+/* In-place box mean: every channel of pixel (x, y) becomes the mean (sum
+ * divided by size * size, truncated) of the size x size box from
+ * (x - size/2, y - size/2), edges repeated, plus offset, clamped to 0..255.
+ * 8-, 24- and 32-bit images; the alpha of 32-bit images is smoothed and offset
+ * too. A 16-bit image (or any other bit count of 8 or more) is not smoothed:
+ * it receives the untouched white working image, as the filter always did,
+ * and the call returns 1. Sums are exact at every size (no 32-bit wrap).
+ * Returns 1 when processed, 0 (image unchanged) when the image is null, has
+ * no pixels or fewer than 8 bits, size is 0, negative or above 2^20, or the
+ * working image cannot be made. */
 PXFX_API int32_t Filter_fast(Image *image, int32_t size, int32_t offset);
-/* Box smoothing by a 0-100 strength (box size strength / 10) into *out, or in
- * place when out is null. 1 or 0. */
+/* Box smoothing by a strength: size min(strength, 100) / 10, nothing for a
+ * strength of 3 or less (a plain copy). With out null src itself is smoothed;
+ * else src is copied into *out (created when null; an existing image is used
+ * whatever its size and bit count) and *out smoothed. Returns 1, or 0 when
+ * src has no pixels, *out holds a record without pixels, or *out cannot be
+ * made. */
 PXFX_API int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength);
 
 #ifdef __cplusplus

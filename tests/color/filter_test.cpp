@@ -225,7 +225,9 @@ TEST(MatrixX, NormalisedSymmetricGaussians) {
                 EXPECT_EQ(matrixX[r - 1][j], 0.0f);
             } else {
                 EXPECT_EQ(matrixX[r - 1][j], matrixX[r - 1][2 * r - j]);
-                if (j > 0 && j <= r) EXPECT_GT(matrixX[r - 1][j], matrixX[r - 1][j - 1]);
+                if (j > 0 && j <= r) {
+                    EXPECT_GT(matrixX[r - 1][j], matrixX[r - 1][j - 1]);
+                }
             }
         }
         EXPECT_NEAR(sum, 1.0, 1e-6) << r;

@@ -1,0 +1,106 @@
+// Hue, saturation and lightness shifts: the plane operations BaseTran_Hue and
+// BaseTran_LS, and PX_IMG_Transform, which applies one of them to a picture
+// through HSL. The picture pass converts, shifts and converts back pixel by
+// pixel into one 32-bit image, which equals splitting into planes, shifting
+// a plane and combining them, without the four planes.
+#include <pxfx/color.h>
+
+#include "color/colorspace.hpp"
+#include "core/internal/image_check.hpp"
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+
+using namespace pxfx;
+using namespace pxfx::colour;
+
+namespace {
+
+using Map = uint8_t[256];
+
+// Step of a slider amount (100 = none); exact for any amount.
+int64_t step_of(int32_t amount) { return (static_cast<int64_t>(amount) * 255 - 25500) / 100; }
+
+// Hue turns by 255 per full circle: past either end it wraps by 255.
+void hue_map(int32_t amount, Map &m) {
+    const int64_t delta = step_of(amount);
+    for (int64_t v = 0; v < 256; ++v) {
+        const int64_t s = v + delta;
+        const int64_t t = s > 255 ? s + 1 : (s < 0 ? s - 1 : s);
+        m[v] = static_cast<uint8_t>(static_cast<uint64_t>(t) & 255);
+    }
+}
+
+void linear_map(int32_t amount, Map &m) {
+    const int64_t delta = step_of(amount);
+    for (int64_t v = 0; v < 256; ++v) {
+        const int64_t s = v + delta;
+        m[v] = static_cast<uint8_t>(s < 0 ? 0 : (s > 255 ? 255 : s));
+    }
+}
+
+int32_t map_plane(Image *plane, const Map &m) {
+    for (int32_t y = 0; y < plane->height; ++y) {
+        uint8_t *row = row_ptr(plane, y);
+        for (int32_t x = 0; x < plane->width; ++x)
+            row[x] = m[row[x]];
+    }
+    return 1;
+}
+
+// maps[0] is applied to hue, maps[1] to saturation, maps[2] to lightness.
+template <class F> void transform_rows(const Image *src, Image *dst, const Map *maps) {
+    for (int32_t y = 0; y < src->height; ++y) {
+        const typename F::CRow in = F::crow(src, y);
+        uint8_t *out = row_ptr(dst, y);
+        for (int32_t x = 0; x < src->width; ++x) {
+            const uint32_t hsl = rgb_to_hsl(F::load(in, x));
+            const uint32_t moved =
+                pack(maps[2][blue_of(hsl)], maps[1][green_of(hsl)], maps[0][red_of(hsl)], 0) | keep_alpha(hsl);
+            Bgra32::store(out, x, hsl_to_rgb(moved));
+        }
+    }
+}
+
+} // namespace
+
+extern "C" {
+
+int32_t BaseTran_Hue(Image *plane, int32_t amount) {
+    if (!is_plane(plane)) return 0;
+    Map m;
+    hue_map(amount, m);
+    return map_plane(plane, m);
+}
+
+int32_t BaseTran_LS(Image *plane, int32_t amount) {
+    if (!is_plane(plane)) return 0;
+    Map m;
+    linear_map(amount, m);
+    return map_plane(plane, m);
+}
+
+int32_t PX_IMG_Transform(const Image *src, Image **out, int32_t amount, int32_t component) {
+    if (out == nullptr || !has_pixels(src)) return 0;
+    if (*out != nullptr && !has_pixels(*out)) return 0;
+    Map maps[3];
+    for (int i = 0; i < 3; ++i)
+        for (int v = 0; v < 256; ++v)
+            maps[i][v] = static_cast<uint8_t>(v);
+    if (component == 0) hue_map(amount, maps[0]);
+    if (component == 1 || component == 2) linear_map(amount, maps[component]);
+    ImagePtr combined = make_image(src->width, src->height, 32);
+    if (!combined) return 0;
+    with_format(src->bitCount, [&](auto f) { transform_rows<decltype(f)>(src, combined.get(), maps); });
+    if (*out == nullptr && src->bitCount == 32) {
+        *out = combined.release();
+        return 1;
+    }
+    if (*out == nullptr) {
+        *out = malloc_Image(src->width, src->height, static_cast<int32_t>(src->bitCount));
+        if (*out == nullptr) return 0;
+    }
+    PX_Img_Copy(*out, combined.get());
+    return 1;
+}
+
+} // extern "C"
