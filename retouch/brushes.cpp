@@ -91,6 +91,15 @@ int32_t cached_brush(Image *picture, Image **cache, uint32_t tag, int32_t cx, in
     return 1;
 }
 
+// A copy of the picture box-smoothed with side `size`; null when it cannot be made.
+Image *smoothed_copy(const Image *picture, int32_t size) {
+    ImagePtr copy = make_image(picture->width, picture->height, static_cast<int32_t>(picture->bitCount));
+    if (!copy) return nullptr;
+    PX_Img_Copy(copy.get(), picture);
+    Filter_fast(copy.get(), size, 0);
+    return copy.release();
+}
+
 } // namespace
 
 extern "C" {
@@ -133,6 +142,13 @@ int32_t alg_Img_Blending(Image *src, Image **out) {
     if (target == nullptr || !owned) return 0;
     PX_Img_Copy(target, owned.get());
     return 1;
+}
+
+int32_t alg_smooth(Image *picture, int32_t, int32_t cx, int32_t cy, int32_t r, int32_t strength, Image **cache) {
+    if (!brushable(picture)) return 0;
+    const int32_t size = strength > 2 ? strength : 3;
+    return cached_brush(picture, cache, static_cast<uint32_t>(strength), cx, cy, r,
+                        [&] { return smoothed_copy(picture, size); });
 }
 
 } // extern "C"

@@ -247,3 +247,36 @@ TEST(Bezier, PointsAlongTheCurve) {
     ComputeBezier(nullptr, 2, untouched);
     EXPECT_EQ(untouched[0].x, 7);
 }
+
+TEST(CachedBrushes, SmoothingBrushKeysOnStrength) {
+    Owned pic = random_image(40, 30, 32, 8);
+    Owned original = clone(pic.get());
+    auto smoothed = [](const Image *im, int32_t size) {
+        Owned s = clone(im);
+        Filter_fast(s.get(), size, 0);
+        return s;
+    };
+    Slot cache;
+    ASSERT_EQ(alg_smooth(pic.get(), 0, 10, 10, 0, 2, &cache), 1);
+    EXPECT_EQ(cache->tag, 2u);
+    EXPECT_EQ(diff(cache.get(), smoothed(original.get(), 3).get()), "");
+    Image *first = cache.get();
+    ASSERT_EQ(alg_smooth(pic.get(), 0, 10, 10, 7, 2, &cache), 1);
+    ASSERT_EQ(alg_smooth(pic.get(), 0, 20, 12, 7, 2, &cache), 1);
+    EXPECT_EQ(cache.get(), first);
+    Owned painted = ref_paste(original.get(), first, 10, 10, 7, false, 0);
+    painted = ref_paste(painted.get(), first, 20, 12, 7, false, 0);
+    EXPECT_EQ(diff(pic.get(), painted.get()), "");
+    ASSERT_EQ(alg_smooth(pic.get(), 0, 0, 0, 0, 5, &cache), 1);
+    EXPECT_EQ(cache->tag, 5u);
+    EXPECT_EQ(diff(cache.get(), smoothed(pic.get(), 5).get()), "");
+    // A cache of another size is replaced.
+    Owned wide = random_image(41, 30, 32, 9);
+    ASSERT_EQ(alg_smooth(wide.get(), 0, 0, 0, 0, 5, &cache), 1);
+    EXPECT_EQ(cache->width, 41);
+    // Without a slot the copy lives for one dab only.
+    Owned once = clone(original.get());
+    ASSERT_EQ(alg_smooth(once.get(), 0, 15, 15, 9, 4, nullptr), 1);
+    EXPECT_EQ(diff(once.get(), ref_paste(original.get(), smoothed(original.get(), 4).get(), 15, 15, 9, false, 0).get()),
+              "");
+}
