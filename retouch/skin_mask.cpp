@@ -88,9 +88,11 @@ bool erode(Image *mask) {
         for (int32_t x = x0; x < x1; ++x) {
             const int32_t xa = x - kErodeHalf, xb = x + kErodeHalf + 1;
             const int32_t ia = clip(xa, x0, x1), ib = clip(xb, x0, x1);
+            if (zeros(above, y + kErodeHalf + 1, xa, xb) == 0) continue;
             uint32_t n = zeros(y + 1, y + kErodeHalf + 1, xa, xb) + zeros(y, y + 1, x, xb);
-            n += zeros(y, y + 1, xa, x) - zeros(y, y + 1, ia, x);
-            n += zeros(above, y, xa, xb) - zeros(aboveInner, y, ia, ib);
+            if (n == 0)
+                n = zeros(y, y + 1, xa, x) - zeros(y, y + 1, ia, x) + zeros(above, y, xa, xb) -
+                    zeros(aboveInner, y, ia, ib);
             if (n != 0) m[x] = 1;
         }
     }
