@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <array>
+#include <vector>
 
 #include "retouch/reference.hpp"
 
@@ -55,14 +56,7 @@ Owned tinted(const Image *pic, uint8_t lr, uint8_t lg, uint8_t lb) {
 
 Owned brightened(const Image *pic, int level) {
     Owned out = clone(pic);
-    for (int32_t y = 0; y < pic->height; ++y)
-        for (int32_t x = 0; x < pic->width; ++x) {
-            const uint32_t c = GetPixelColor(pic, x, y);
-            uint32_t o = c & 0xFF000000u;
-            for (int s : {0, 8, 16})
-                o |= uint32_t(std::min(ch(c, s) + level, 255)) << s;
-            SetPixelColor(out.get(), x, y, o);
-        }
+    map_pixels(out.get(), [&](int v, int) { return std::min(v + level, 255); });
     return out;
 }
 
@@ -87,196 +81,122 @@ TEST(Paste, SoftAndLightenPastesMatchStraightVersion) {
             }
 }
 
-TEST(Paste, EdgeRules) {
-    Owned dst = filled(100, 9, 24, 0x101010), src = filled(100, 9, 24, 0xF0F0F0);
-    EXPECT_EQ(PointArea_Copy(dst.get(), src.get(), 50, 4, 0), 0);
-    EXPECT_EQ(PointArea_Copy(nullptr, src.get(), 50, 4, 3), 0);
-    EXPECT_EQ(GetPixelColor(dst.get(), 50, 4), 0xFF101010u);
-    // r = 1: the centre takes the source, the ring at distance 1 keeps the destination.
-    EXPECT_EQ(PointArea_Copy(dst.get(), src.get(), 50, 4, 1), 1);
-    EXPECT_EQ(GetPixelColor(dst.get(), 50, 4), 0xFFF0F0F0u);
-    EXPECT_EQ(GetPixelColor(dst.get(), 51, 4), 0xFF101010u);
-    // A negative centre lands on the far edge.
-    EXPECT_EQ(PointArea_Copy(dst.get(), src.get(), -3, 4, 2), 1);
-    EXPECT_EQ(GetPixelColor(dst.get(), 99, 4), 0xFFF0F0F0u);
-    // Lighten-only with level 0: a darker source never wins.
-    Owned bright = filled(20, 20, 32, 0xFF808080), dark = filled(20, 20, 32, 0x40404040);
-    EXPECT_EQ(PointArea_Copy_Alph(bright.get(), dark.get(), 10, 10, 8, 0), 1);
-    EXPECT_EQ(GetPixelColor(bright.get(), 13, 10) & 0xFFFFFF, 0x808080u);
+// Two dabs through a slot: the first builds the copy (r = 0 paints nothing),
+// later ones paste that same copy although the picture has changed.
+template <class Brush>
+void expect_stroke(Image *pic, Slot &cache, const Owned &prepared, Brush dab, bool lighten, int32_t level) {
+    const Owned before = clone(pic);
+    ASSERT_EQ(dab(0, 0, 0), 1);
+    EXPECT_EQ(diff(pic, before.get()), "");
+    EXPECT_EQ(diff(cache.get(), prepared.get()), "");
+    Image *first = cache.get();
+    ASSERT_EQ(dab(40, 50, 12), 1);
+    ASSERT_EQ(dab(52, 50, 9), 1);
+    EXPECT_EQ(cache.get(), first);
+    Owned painted = ref_paste(before.get(), prepared.get(), 40, 50, 12, lighten, level);
+    EXPECT_EQ(diff(pic, ref_paste(painted.get(), prepared.get(), 52, 50, 9, lighten, level).get()), "");
 }
 
-TEST(CachedBrushes, TintBrushBuildsOnceAndRebuildsOnChange) {
+TEST(CachedBrushes, TintBrushKeysOnItsLevels) {
     Owned pic = load_fixture("portrait-128.bmp");
     Slot cache;
     const PXTint tint{150, 128, 90};
-    ASSERT_EQ(alg_Blending(pic.get(), nullptr, 0, 0, tint, 0, &cache), 1);
-    Image *first = cache.get();
-    EXPECT_EQ(first->tag, 150u | 128u << 8 | 90u << 16);
-    const Owned expected = tinted(pic.get(), 150, 128, 90);
-    EXPECT_EQ(diff(first, expected.get()), "");
-    // Later dabs of the stroke paste the same copy, even though the picture changed.
-    Owned before = clone(pic.get());
-    ASSERT_EQ(alg_Blending(pic.get(), nullptr, 40, 50, tint, 12, &cache), 1);
-    ASSERT_EQ(alg_Blending(pic.get(), nullptr, 60, 50, tint, 12, &cache), 1);
-    EXPECT_EQ(cache.get(), first);
-    Owned painted = ref_paste(before.get(), expected.get(), 40, 50, 12, false, 0);
-    painted = ref_paste(painted.get(), expected.get(), 60, 50, 12, false, 0);
-    EXPECT_EQ(diff(pic.get(), painted.get()), "");
-    // A new colour rebuilds from the picture as it is now.
+    expect_stroke(
+        pic.get(), cache, tinted(pic.get(), 150, 128, 90),
+        [&](int32_t x, int32_t y, int32_t r) { return alg_Blending(pic.get(), nullptr, x, y, tint, r, &cache); }, false,
+        0);
+    EXPECT_EQ(cache->tag, 150u | 128u << 8 | 90u << 16);
     ASSERT_EQ(alg_Blending(pic.get(), nullptr, 0, 0, PXTint{128, 128, 200}, 0, &cache), 1);
     EXPECT_EQ(diff(cache.get(), tinted(pic.get(), 128, 128, 200).get()), "");
+    Slot out;
+    ASSERT_EQ(alg_Img_Blending(pic.get(), &out), 1);
+    EXPECT_EQ(diff(out.get(), tinted(pic.get(), 201, 189, 203).get()), "");
     Owned gray = random_image(8, 8, 8, 1);
     EXPECT_EQ(alg_Blending(gray.get(), nullptr, 0, 0, tint, 3, &cache), 0);
-    // The whole-picture tint, into a slot and in place.
-    Slot out;
-    ASSERT_EQ(alg_Img_Blending(before.get(), &out), 1);
-    EXPECT_EQ(diff(out.get(), tinted(before.get(), 201, 189, 203).get()), "");
-    ASSERT_EQ(alg_Img_Blending(before.get(), nullptr), 1);
-    EXPECT_EQ(diff(before.get(), out.get()), "");
-}
-
-TEST(CachedBrushes, CloneBrushShiftsAndReloads) {
-    Owned pic = random_image(30, 20, 24, 5);
-    Owned original = clone(pic.get());
-    Slot cache;
-    ASSERT_EQ(PX_Mimic(pic.get(), 10, 4, nullptr, 3, 6, 0, 0, 0, 1, &cache), 1);
-    for (int32_t y = 0; y < 20; ++y)
-        for (int32_t x = 0; x < 30; ++x) {
-            const int32_t sx = x + 7, sy = y - 2;
-            const bool inside = sx < 30 && sy >= 0;
-            ASSERT_EQ(GetPixelColor(cache.get(), x, y), GetPixelColor(original.get(), inside ? sx : x, inside ? sy : y))
-                << x << "," << y;
-        }
-    Image *first = cache.get();
-    const Owned shifted = clone(first);
-    ASSERT_EQ(PX_Mimic(pic.get(), 0, 0, nullptr, 0, 0, 15, 10, 6, 0, &cache), 1);
-    EXPECT_EQ(cache.get(), first);
-    EXPECT_EQ(diff(pic.get(), ref_paste(original.get(), shifted.get(), 15, 10, 6, false, 0).get()), "");
-    // A reference of another format replaces the copy.
-    Owned ref32 = random_image(30, 20, 32, 6);
-    ASSERT_EQ(PX_Mimic(pic.get(), 0, 0, ref32.get(), 0, 0, 0, 0, 0, 0, &cache), 1);
-    EXPECT_EQ(cache->bitCount, 32u);
-    EXPECT_EQ(diff(cache.get(), ref32.get()), "");
-    EXPECT_EQ(PX_Mimic(pic.get(), 0, 0, nullptr, 0, 0, 0, 0, 0, 0, nullptr), 0);
-}
-
-TEST(CachedBrushes, UnderEyeBrushKeepsItsLevel) {
-    Owned pic = load_fixture("portrait-128.bmp");
-    Owned original = clone(pic.get());
-    Slot cache;
-    ASSERT_EQ(alg_QuHeiYanQuan(pic.get(), 40, 40, 0, 30, &cache, 0), 1);
-    EXPECT_EQ(diff(pic.get(), original.get()), "");
-    EXPECT_EQ(cache->tag, 30u);
-    const Owned light = brightened(original.get(), 30);
-    EXPECT_EQ(diff(cache.get(), light.get()), "");
-    Image *first = cache.get();
-    ASSERT_EQ(alg_QuHeiYanQuan(pic.get(), 40, 40, 9, 30, &cache, 0), 1);
-    EXPECT_EQ(cache.get(), first);
-    EXPECT_EQ(diff(cache.get(), light.get()), "");
-    EXPECT_EQ(diff(pic.get(), ref_paste(original.get(), light.get(), 40, 40, 9, true, 30).get()), "");
-    // Refresh takes the painted picture and lightens it once.
-    ASSERT_EQ(alg_QuHeiYanQuan(pic.get(), 0, 0, 0, 30, &cache, 1), 1);
-    EXPECT_EQ(diff(cache.get(), brightened(pic.get(), 30).get()), "");
-    // Several centres in one call.
-    Owned multi = clone(original.get());
-    const int32_t xs[] = {20, 90, -5}, ys[] = {30, 100, 60};
-    ASSERT_EQ(alg_QuHeiYanQuan_1(multi.get(), xs, ys, 3, 11, 25), 1);
-    const Owned l25 = brightened(original.get(), 25);
-    Owned expected = clone(original.get());
-    for (int i = 0; i < 3; ++i)
-        expected = ref_paste(expected.get(), l25.get(), xs[i], ys[i], 11, true, 25);
-    EXPECT_EQ(diff(multi.get(), expected.get()), "");
-    EXPECT_EQ(alg_QuHeiYanQuan_1(multi.get(), nullptr, ys, 3, 11, 25), 0);
-    EXPECT_EQ(alg_QuHeiYanQuan_1(multi.get(), xs, ys, 0, 11, 25), 0);
-}
-
-TEST(Eradicate, PullsDarkPixelsTowardTheSurroundings) {
-    uint32_t seed = 9;
-    for (int32_t bc : kBitCounts)
-        for (auto [cx, cy, r] : {std::array{10, 8, 5}, {0, 0, 4}, {18, 3, 9}, {-2, 5, 4}, {9, 9, 1}}) {
-            Owned pic = random_image(21, 15, bc, seed++);
-            Owned expected = clone(pic.get());
-            const int32_t x0 = std::max(cx - r, 0), x1 = std::min(cx + r, 20);
-            const int32_t y0 = std::max(cy - r, 0), y1 = std::min(cy + r, 14);
-            int64_t sum[3] = {}, n = 0;
-            for (int32_t y = y0; y <= y1; ++y)
-                for (int32_t x = x0; x < x1; ++x)
-                    if (int32_t(distance(x - cx, y - cy)) >= r) {
-                        const uint32_t c = GetPixelColor(pic.get(), x, y);
-                        sum[0] += ch(c, 0), sum[1] += ch(c, 8), sum[2] += ch(c, 16), ++n;
-                    }
-            for (int32_t y = y0; y <= y1 && n > 0; ++y)
-                for (int32_t x = x0; x < x1; ++x) {
-                    const int32_t d = int32_t(distance(x - cx, y - cy));
-                    const uint32_t c = GetPixelColor(pic.get(), x, y);
-                    if (d > r || sum[1] / n - ch(c, 8) <= 1) continue;
-                    uint32_t o = c & 0xFF000000u;
-                    for (int i = 0; i < 3; ++i) {
-                        const int64_t v = ch(c, 8 * i) + (r - d) * (sum[i] / n - ch(c, 8 * i)) / r;
-                        o |= uint32_t(std::min<int64_t>(v, 255)) << 8 * i;
-                    }
-                    SetPixelColor(expected.get(), x, y, o);
-                }
-            alg_Img_Eradicate(pic.get(), cx, cy, r);
-            EXPECT_EQ(diff(pic.get(), expected.get()), "") << bc << " " << cx << "," << cy << " r" << r;
-        }
-    // A disc that covers its whole rectangle has no surroundings.
-    Owned small = random_image(3, 3, 24, 4), before = clone(small.get());
-    alg_Img_Eradicate(small.get(), 1, 1, 2);
-    EXPECT_EQ(diff(small.get(), before.get()), "");
-}
-
-TEST(Bezier, PointsAlongTheCurve) {
-    const PXPoint c[4] = {{0, 0}, {10, 30}, {20, 30}, {30, 0}};
-    PXPoint out[5] = {};
-    ComputeBezier(c, 1, out);
-    EXPECT_EQ(out[0].x, 0);
-    ComputeBezier(c, 2, out);
-    EXPECT_EQ(out[0].x, 0);
-    EXPECT_EQ(out[1].x, 30);
-    EXPECT_EQ(out[1].y, 0);
-    ComputeBezier(c, 5, out);
-    EXPECT_EQ(out[2].x, 15);
-    EXPECT_EQ(out[2].y, 22); // 0.75 * 30 = 22.5, truncated
-    PXPoint r{-1, -1};
-    const PXPoint p = PointOnCubicBezier(&r, c, 0.5f);
-    EXPECT_EQ(p.x, r.x);
-    EXPECT_EQ(r.y, 22);
-    PXPoint untouched[2] = {{7, 7}, {7, 7}};
-    ComputeBezier(c, 0, untouched);
-    ComputeBezier(nullptr, 2, untouched);
-    EXPECT_EQ(untouched[0].x, 7);
 }
 
 TEST(CachedBrushes, SmoothingBrushKeysOnStrength) {
-    Owned pic = random_image(40, 30, 32, 8);
-    Owned original = clone(pic.get());
+    Owned pic = random_image(90, 70, 32, 8);
     auto smoothed = [](const Image *im, int32_t size) {
         Owned s = clone(im);
         Filter_fast(s.get(), size, 0);
         return s;
     };
     Slot cache;
-    ASSERT_EQ(alg_smooth(pic.get(), 0, 10, 10, 0, 2, &cache), 1);
+    expect_stroke(
+        pic.get(), cache, smoothed(pic.get(), 3),
+        [&](int32_t x, int32_t y, int32_t r) { return alg_smooth(pic.get(), 0, x, y, r, 2, &cache); }, false, 0);
     EXPECT_EQ(cache->tag, 2u);
-    EXPECT_EQ(diff(cache.get(), smoothed(original.get(), 3).get()), "");
-    Image *first = cache.get();
-    ASSERT_EQ(alg_smooth(pic.get(), 0, 10, 10, 7, 2, &cache), 1);
-    ASSERT_EQ(alg_smooth(pic.get(), 0, 20, 12, 7, 2, &cache), 1);
-    EXPECT_EQ(cache.get(), first);
-    Owned painted = ref_paste(original.get(), first, 10, 10, 7, false, 0);
-    painted = ref_paste(painted.get(), first, 20, 12, 7, false, 0);
-    EXPECT_EQ(diff(pic.get(), painted.get()), "");
     ASSERT_EQ(alg_smooth(pic.get(), 0, 0, 0, 0, 5, &cache), 1);
-    EXPECT_EQ(cache->tag, 5u);
     EXPECT_EQ(diff(cache.get(), smoothed(pic.get(), 5).get()), "");
-    // A cache of another size is replaced.
-    Owned wide = random_image(41, 30, 32, 9);
-    ASSERT_EQ(alg_smooth(wide.get(), 0, 0, 0, 0, 5, &cache), 1);
-    EXPECT_EQ(cache->width, 41);
-    // Without a slot the copy lives for one dab only.
-    Owned once = clone(original.get());
-    ASSERT_EQ(alg_smooth(once.get(), 0, 15, 15, 9, 4, nullptr), 1);
-    EXPECT_EQ(diff(once.get(), ref_paste(original.get(), smoothed(original.get(), 4).get(), 15, 15, 9, false, 0).get()),
-              "");
+}
+
+TEST(CachedBrushes, UnderEyeBrushKeepsItsLevel) {
+    Owned pic = load_fixture("portrait-128.bmp");
+    Owned original = clone(pic.get());
+    Slot cache;
+    expect_stroke(
+        pic.get(), cache, brightened(pic.get(), 30),
+        [&](int32_t x, int32_t y, int32_t r) { return alg_QuHeiYanQuan(pic.get(), x, y, r, 30, &cache, 0); }, true, 30);
+    // Refresh takes the painted picture and lightens it once.
+    ASSERT_EQ(alg_QuHeiYanQuan(pic.get(), 0, 0, 0, 30, &cache, 1), 1);
+    EXPECT_EQ(diff(cache.get(), brightened(pic.get(), 30).get()), "");
+    const int32_t xs[] = {20, 90, -5}, ys[] = {30, 100, 60};
+    ASSERT_EQ(alg_QuHeiYanQuan_1(original.get(), xs, ys, 3, 11, 25), 1);
+    Owned expected = load_fixture("portrait-128.bmp");
+    const Owned l25 = brightened(expected.get(), 25);
+    for (int i = 0; i < 3; ++i)
+        expected = ref_paste(expected.get(), l25.get(), xs[i], ys[i], 11, true, 25);
+    EXPECT_EQ(diff(original.get(), expected.get()), "");
+}
+
+TEST(CachedBrushes, CloneBrushShiftsAndReloads) {
+    Owned pic = random_image(30, 20, 24, 5), original = clone(pic.get());
+    Slot cache;
+    ASSERT_EQ(PX_Mimic(pic.get(), 10, 4, nullptr, 3, 6, 0, 0, 0, 1, &cache), 1);
+    for (int32_t y = 0; y < 20; ++y)
+        for (int32_t x = 0; x < 30; ++x) {
+            const bool inside = x + 7 < 30 && y >= 2;
+            ASSERT_EQ(GetPixelColor(cache.get(), x, y),
+                      GetPixelColor(original.get(), inside ? x + 7 : x, inside ? y - 2 : y));
+        }
+    Image *first = cache.get();
+    ASSERT_EQ(PX_Mimic(pic.get(), 0, 0, nullptr, 0, 0, 15, 10, 6, 0, &cache), 1);
+    EXPECT_EQ(cache.get(), first);
+    EXPECT_EQ(diff(pic.get(), ref_paste(original.get(), first, 15, 10, 6, false, 0).get()), "");
+    Owned ref32 = random_image(30, 20, 32, 6); // another format replaces the copy
+    ASSERT_EQ(PX_Mimic(pic.get(), 0, 0, ref32.get(), 0, 0, 0, 0, 0, 0, &cache), 1);
+    EXPECT_EQ(diff(cache.get(), ref32.get()), "");
+}
+
+TEST(Eradicate, PullsDarkPixelsTowardTheSurroundings) {
+    // Gray 200 surroundings, a dark spot of radius 3 with one bright pixel.
+    Owned pic = filled(21, 15, 24, 0xC8C8C8);
+    for (int32_t y = 0; y < 15; ++y)
+        for (int32_t x = 0; x < 21; ++x)
+            if (distance(x - 10, y - 8) <= 3) SetPixelColor(pic.get(), x, y, 0x204060);
+    SetPixelColor(pic.get(), 11, 8, 0xF0F0F0);
+    Owned before = clone(pic.get());
+    alg_Img_Eradicate(pic.get(), 10, 8, 5);
+    EXPECT_EQ(GetPixelColor(pic.get(), 10, 8), 0xFFC8C8C8u); // the centre reaches the mean
+    EXPECT_EQ(GetPixelColor(pic.get(), 11, 8), 0xFFF0F0F0u); // brighter in green: kept
+    EXPECT_EQ(GetPixelColor(pic.get(), 13, 8), 0xFF637689u); // w = 2: red 32 + 2 (200 - 32) / 5
+    for (int32_t y = 0; y < 15; ++y)
+        EXPECT_EQ(GetPixelColor(pic.get(), 15, y), GetPixelColor(before.get(), 15, y)); // column cx + r
+    // A disc that covers its whole rectangle has no surroundings.
+    Owned small = random_image(3, 3, 24, 4);
+    before = clone(small.get());
+    alg_Img_Eradicate(small.get(), 1, 1, 2);
+    EXPECT_EQ(diff(small.get(), before.get()), "");
+}
+
+TEST(Bezier, PointsAlongTheCurve) {
+    const PXPoint c[4] = {{0, 0}, {10, 30}, {20, 30}, {30, 0}};
+    PXPoint out[5] = {{7, 7}, {7, 7}};
+    ComputeBezier(c, 0, out);
+    EXPECT_EQ(out[0].x, 7);
+    ComputeBezier(c, 1, out);
+    EXPECT_EQ(out[0].x, 0);
+    ComputeBezier(c, 5, out);
+    EXPECT_EQ(std::vector<int32_t>({out[2].x, out[2].y, out[4].x, out[4].y}), std::vector<int32_t>({15, 22, 30, 0}));
 }

@@ -113,6 +113,18 @@ inline Owned ref_smooth_1(const Image *src) {
     return out;
 }
 
+// Replaces blue, green and red of every pixel by fn(value, shift); alpha kept.
+template <class Fn> void map_pixels(Image *im, Fn fn) {
+    for (int32_t y = 0; y < im->height; ++y)
+        for (int32_t x = 0; x < im->width; ++x) {
+            const uint32_t c = GetPixelColor(im, x, y);
+            uint32_t o = c & 0xFF000000u;
+            for (int s : {0, 8, 16})
+                o |= uint32_t(fn(ch(c, s), s)) << s;
+            SetPixelColor(im, x, y, o);
+        }
+}
+
 inline uint32_t distance(int64_t dx, int64_t dy) {
     return Distance2D(static_cast<int32_t>(std::llabs(dx)), static_cast<int32_t>(std::llabs(dy)));
 }

@@ -4,60 +4,44 @@
 #include <gtest/gtest.h>
 
 #include <climits>
-#include <vector>
 
 #include "retouch/reference.hpp"
 
 using namespace pxtest;
-using namespace rtest;
 
 TEST(Safety, NullRecordsAndSlotsAreRefused) {
     Owned pic = random_image(12, 9, 24, 1);
     Image empty = *pic;
     empty.bits = nullptr;
     Image *slot = nullptr;
-    for (const Image *bad : {static_cast<const Image *>(nullptr), static_cast<const Image *>(&empty)}) {
-        Image *m = const_cast<Image *>(bad);
-        EXPECT_EQ(CreateFaceMaskImg(bad, &slot), 0);
-        EXPECT_EQ(SmileDetect(bad, &slot, 0), 0);
-        EXPECT_EQ(alg_Img_smooth_1(bad, &slot), 0);
-        alg_Img_smooth(bad, &slot);
-        EXPECT_EQ(alg_Img_Skin(bad, &slot, 1), 0);
-        EXPECT_EQ(LightUP(m), 0);
-        EXPECT_EQ(Best_Color(m, 3), 0);
+    for (Image *bad : {static_cast<Image *>(nullptr), &empty}) {
+        const int32_t results[] = {CreateFaceMaskImg(bad, &slot),
+                                   SmileDetect(bad, &slot, 0),
+                                   alg_Img_smooth_1(bad, &slot),
+                                   alg_Img_Skin(bad, &slot, 1),
+                                   LightUP(bad),
+                                   Best_Color(bad, 3),
+                                   ImageAutoGradationProcess(bad, &slot, 50),
+                                   ImageExposure(bad, &slot, 5),
+                                   MyOneKeyFliter(bad, &slot),
+                                   PointArea_Copy(bad, pic.get(), 3, 3, 3),
+                                   PointArea_Copy_Alph(pic.get(), bad, 3, 3, 3, 9),
+                                   PX_Mimic(bad, 0, 0, nullptr, 0, 0, 3, 3, 3, 1, &slot),
+                                   alg_Blending(bad, nullptr, 3, 3, PXTint{1, 2, 3}, 3, &slot),
+                                   alg_Img_Blending(bad, &slot),
+                                   alg_smooth(bad, 0, 3, 3, 3, 5, &slot),
+                                   EyesEnlarge(bad),
+                                   alg_QuHeiYanQuan(bad, 3, 3, 3, 20, &slot, 0)};
+        for (int32_t r : results)
+            EXPECT_EQ(r, 0);
         MoreLight(bad, 3, &slot);
-        EXPECT_EQ(ImageAutoGradationProcess(bad, &slot, 50), 0);
         ImageAutoGradationProcess1(bad, &slot, 0, 1);
-        EXPECT_EQ(ImageExposure(bad, &slot, 5), 0);
-        EXPECT_EQ(MyOneKeyFliter(m, &slot), 0);
         thresholdBlur(0, 0, 3, 50, bad, &slot);
-        EXPECT_EQ(PointArea_Copy(m, pic.get(), 3, 3, 3), 0);
-        EXPECT_EQ(PointArea_Copy_Alph(pic.get(), bad, 3, 3, 3, 9), 0);
-        EXPECT_EQ(PX_Mimic(m, 0, 0, nullptr, 0, 0, 3, 3, 3, 1, &slot), 0);
-        EXPECT_EQ(alg_Blending(m, nullptr, 3, 3, PXTint{1, 2, 3}, 3, &slot), 0);
-        EXPECT_EQ(alg_Img_Blending(m, &slot), 0);
-        EXPECT_EQ(alg_smooth(m, 0, 3, 3, 3, 5, &slot), 0);
-        alg_Img_Eradicate(m, 3, 3, 3);
-        alg_Img_EyesEnlarge(m, 3, 3, 3, 1);
-        alg_Img_EyesEnlarge(m, 3, 3, 3, 0);
-        EXPECT_EQ(EyesEnlarge(m), 0);
-        alg_Img_EyesMoreContrast_ellipse(m, 3, 3, 3, 50);
-        alg_Img_quheiyanquan_ellipse(m, 3, 3, 5);
-        EXPECT_EQ(alg_QuHeiYanQuan(m, 3, 3, 3, 20, &slot, 0), 0);
         EXPECT_EQ(slot, nullptr);
     }
-    const Owned before = clone(pic.get());
-    SmileDetect(pic.get(), nullptr, 0);
-    MoreLight(pic.get(), 3, nullptr);
-    ImageAutoGradationProcess1(pic.get(), nullptr, 0, 1);
-    thresholdBlur(0, 0, 3, 50, pic.get(), nullptr);
     EXPECT_EQ(PX_Mimic(pic.get(), 0, 0, &empty, 0, 0, 3, 3, 3, 1, &slot), 0);
-    EXPECT_EQ(diff(pic.get(), before.get()), "");
-    EXPECT_EQ(Sort_largelow(nullptr, 5), nullptr);
     EXPECT_EQ(getpos(nullptr, 5, 1), 5);
-    BuildTable(nullptr, 1.0f);
-    MakeMapping(nullptr, 0, 0);
-    EXPECT_EQ(PointOnCubicBezier(nullptr, nullptr, 0.5f).x, 0);
+    EXPECT_EQ(PointArea_Copy(pic.get(), pic.get(), 5, 5, 0), 0);
 }
 
 TEST(Safety, ExtremeCentresAndRadiiStayInside) {
@@ -83,15 +67,13 @@ TEST(Safety, ExtremeCentresAndRadiiStayInside) {
         EXPECT_EQ(PointArea_Copy_Alph(pic.get(), tiny.get(), 6, 5, 40, 3), 1);
     }
     Owned gray = random_image(9, 9, 8, 5);
-    for (int32_t size : {INT_MIN, -300})
-        EXPECT_EQ(Best_Color(gray.get(), size), 1);
+    EXPECT_EQ(Best_Color(gray.get(), INT_MIN), 1);
     EXPECT_EQ(Best_Color(gray.get(), INT_MAX), 0);
     Slot out;
     MoreLight(gray.get(), INT_MIN, &out);
-    MoreLight(gray.get(), 255, &out);
     thresholdBlur(INT_MIN, INT_MAX, INT_MIN, INT_MAX, gray.get(), &out);
-    std::vector<PXPoint> pts(3);
+    PXPoint pts[3];
     const PXPoint far[4] = {{INT_MIN, INT_MAX}, {INT_MAX, INT_MIN}, {INT_MIN, INT_MIN}, {INT_MAX, INT_MAX}};
-    ComputeBezier(far, 3, pts.data());
+    ComputeBezier(far, 3, pts);
     EXPECT_EQ(pts[0].x, INT_MIN);
 }
