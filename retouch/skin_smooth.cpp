@@ -92,10 +92,26 @@ int32_t alg_Img_Skin(const Image *src, Image **dst, int32_t lighten) {
     uint8_t tone[256];
     for (int32_t i = 0; i < 256; ++i)
         tone[i] = static_cast<uint8_t>((52 * i + 75 * ZANTOFILTER[i] + 63) / 127);
-    alg_Img_smooth(src, dst);
-    if (!has_pixels(*dst)) return 0;
-    if (lighten != 0) LightUP(*dst);
-    map_channels(*dst, tone);
+    alg_Img_smooth_1(src, dst);
+    Image *out = *dst;
+    if (!has_pixels(out)) return 0;
+    const int32_t lightUps = lighten != 0 ? 2 : 1;
+    if (out->bitCount == 8 || out->bitCount == 24 || out->bitCount == 32) {
+        // Byte channels store every intermediate value exactly, so the
+        // brightening passes and the tone curve fold into one table.
+        uint8_t table[256];
+        for (int32_t i = 0; i < 256; ++i) {
+            uint8_t v = static_cast<uint8_t>(i);
+            for (int32_t k = 0; k < lightUps; ++k)
+                v = ZANTOMOPI[v];
+            table[i] = tone[v];
+        }
+        map_channels(out, table);
+        return 1;
+    }
+    for (int32_t k = 0; k < lightUps; ++k)
+        LightUP(out);
+    map_channels(out, tone);
     return 1;
 }
 

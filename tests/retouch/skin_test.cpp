@@ -105,6 +105,12 @@ TEST(SkinSmooth, SpotBrighteningMatchesAccessorVersion) {
     map_pixels(expected.get(), [](int v, int) { return ZANTOMOPI[v]; });
     ASSERT_EQ(LightUP(deep.get()), 1);
     EXPECT_EQ(diff(deep.get(), expected.get()), "");
+    Slot skin16, steps;
+    alg_Img_Skin(deep.get(), &skin16, 1);
+    alg_Img_smooth(deep.get(), &steps);
+    LightUP(steps.get());
+    map_pixels(steps.get(), [](int v, int) { return (52 * v + 75 * ZANTOFILTER[v] + 63) / 127; });
+    EXPECT_EQ(diff(skin16.get(), steps.get()), "");
 }
 
 TEST(RankFilters, SortAndPosition) {
