@@ -5,6 +5,7 @@
 #include <pxfx/toolkit.h>
 
 #include <algorithm>
+#include <cstring>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
@@ -23,39 +24,38 @@ constexpr double kSpotBlue = 0.8, kSpotGreen = 0.8, kSpotRed = 0.7;
 
 // Spot map of the skin mask: the second largest value of the 5 x 5 window
 // minus the centre, where at least kMinBrighter values exceed a non-zero
-// centre. Only the centre decides whether a window is read at all, so the
-// windows of skin pixels are scanned directly on an edge-padded copy.
+// centre. Rows are gathered offset by offset on an edge-padded copy, so the
+// inner loops run over whole rows of bytes.
 bool spot_map(const Image *mask, uint8_t *spots) {
     constexpr int32_t side = 2 * kSpotHalf + 1;
     const int32_t w = mask->width, h = mask->height;
     const size_t pw = static_cast<size_t>(w) + side - 1;
     Buffer<uint8_t> pad = alloc_buffer<uint8_t>(checked_size(pw, static_cast<uint64_t>(h) + side - 1));
-    if (!pad) return false;
+    Buffer<uint8_t> rows = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(w), 3));
+    if (!pad || !rows) return false;
     for (int32_t Y = 0; Y < h + side - 1; ++Y) {
         const uint8_t *in = row_ptr(mask, clamp_to(Y - kSpotHalf, 0, h - 1));
         uint8_t *out = pad.get() + static_cast<size_t>(Y) * pw;
         for (int32_t X = 0; X < w + side - 1; ++X)
             out[X] = in[clamp_to(X - kSpotHalf, 0, w - 1)];
     }
+    uint8_t *first = rows.get(), *second = first + w, *above = second + w;
     for (int32_t y = 0; y < h; ++y) {
         const uint8_t *centre = row_ptr(mask, y);
-        const uint8_t *top = pad.get() + static_cast<size_t>(y) * pw;
-        for (int32_t x = 0; x < w; ++x) {
-            const uint32_t c = centre[x];
-            if (c == 0) continue;
-            uint32_t above = 0, first = 0, second = 0;
-            for (int32_t dy = 0; dy < side; ++dy) {
-                const uint8_t *p = top + static_cast<size_t>(dy) * pw + x;
-                for (int32_t dx = 0; dx < side; ++dx) {
-                    const uint32_t v = p[dx];
-                    above += v > c;
-                    second = std::max(second, std::min(first, v));
-                    first = std::max(first, v);
+        std::memset(rows.get(), 0, static_cast<size_t>(w) * 3);
+        for (int32_t dy = 0; dy < side; ++dy)
+            for (int32_t dx = 0; dx < side; ++dx) {
+                const uint8_t *p = pad.get() + static_cast<size_t>(y + dy) * pw + dx;
+                for (int32_t x = 0; x < w; ++x) {
+                    const uint8_t v = p[x];
+                    above[x] = static_cast<uint8_t>(above[x] + (v > centre[x]));
+                    second[x] = std::max(second[x], std::min(first[x], v));
+                    first[x] = std::max(first[x], v);
                 }
             }
-            if (above >= kMinBrighter)
-                spots[static_cast<size_t>(y) * w + x] = static_cast<uint8_t>((second - c) & 255u);
-        }
+        uint8_t *out = spots + static_cast<size_t>(y) * w;
+        for (int32_t x = 0; x < w; ++x)
+            if (centre[x] != 0 && above[x] >= kMinBrighter) out[x] = static_cast<uint8_t>(second[x] - centre[x]);
     }
     return true;
 }
