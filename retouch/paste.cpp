@@ -15,13 +15,13 @@ using namespace pxfx;
 
 namespace {
 
-struct Ring {
-    int64_t r, ri, rw;
-};
+// Ring of the soft edge in the integer type of its arithmetic: 32 bits while
+// every product fits (the usual brush), 64 bits otherwise.
+template <class T> struct Ring { T r, ri, rw; };
 
 // Blend of the ring: the source at the inner edge, the destination at the rim.
 struct SoftRule {
-    static uint8_t ring(const Ring &g, int64_t d, uint8_t o, uint8_t s, int64_t) {
+    template <class T> static uint8_t ring(const Ring<T> &g, T d, uint8_t o, uint8_t s, T) {
         return static_cast<uint8_t>(((d - g.ri) * o + (g.r - d) * s) / g.rw);
     }
 };
@@ -29,23 +29,49 @@ struct SoftRule {
 // Fades from s to s - level across the ring and only ever brightens (or
 // writes when the destination plus the level equals the source exactly).
 struct LightenRule {
-    static uint8_t ring(const Ring &g, int64_t d, uint8_t o, uint8_t s, int64_t level) {
+    template <class T> static uint8_t ring(const Ring<T> &g, T d, uint8_t o, uint8_t s, T level) {
         const uint8_t v = static_cast<uint8_t>(((d - g.ri) * (s - level) + s * (g.r - d)) / g.rw);
         return v > o || o + level == s ? v : o;
     }
 };
 
+// Radii and levels up to which the ring arithmetic fits 32 bits:
+// 2e6 * (255 + 255) + 255 * 2e6 < 2^31.
+constexpr int64_t kNarrowRadius = 2000000;
+constexpr int64_t kNarrowLevel = 255;
+
+// Distance2D along a row without a square root per pixel: the rounded root
+// of n is the smallest k with k * k + k >= n, so it moves by a step or two
+// between neighbours. Valid while dx * dx + dy * dy does not wrap 32 bits.
+struct RowDistance {
+    uint64_t k = 0;
+    uint32_t next(uint64_t n) {
+        while (k * k + k < n)
+            ++k;
+        while (k > 0 && (k - 1) * (k - 1) + (k - 1) >= n)
+            --k;
+        return static_cast<uint32_t>(k);
+    }
+};
+
+constexpr int64_t kMaxSteppedOffset = 46340; // 2 * 46340^2 < 2^32
+
 // Pixel layout of a paste: bytes per destination and source pixel, colour
 // bytes, and whether the alpha byte follows the source inside the brush.
-template <int DS, int SS, int NC, bool Alpha, class Rule>
+template <int DS, int SS, int NC, bool Alpha, class Rule, class T>
 void paste_rect(Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t x0, int32_t x1, int32_t y0, int32_t y1,
-                const Ring &g, int64_t level) {
+                const Ring<T> &g, T level) {
+    const bool stepped = std::max<int64_t>(std::abs(x0 - cx), std::abs(x1 - cx)) <= kMaxSteppedOffset &&
+                         std::max<int64_t>(std::abs(y0 - cy), std::abs(y1 - cy)) <= kMaxSteppedOffset;
     for (int32_t y = y0; y <= y1; ++y) {
         uint8_t *o = row_ptr(dst, y);
         const uint8_t *s = row_ptr(src, y);
         const int32_t dy = std::abs(y - cy);
+        RowDistance root{distance2d(std::abs(x0 - cx), dy)};
         for (int32_t x = x0; x <= x1; ++x) {
-            const int64_t d = distance2d(std::abs(x - cx), dy);
+            const int64_t dx = std::abs(x - cx);
+            const T d = static_cast<T>(stepped ? root.next(static_cast<uint64_t>(dx * dx + int64_t(dy) * dy))
+                                               : distance2d(static_cast<int32_t>(dx), dy));
             if (d > g.r) continue;
             uint8_t *op = o + static_cast<size_t>(x) * DS;
             const uint8_t *sp = s + static_cast<size_t>(x) * SS;
@@ -82,22 +108,30 @@ int32_t paste(Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t r, d
     const int64_t y0 = std::max<int64_t>(static_cast<int64_t>(cy) - r, 0);
     const int64_t y1 = std::min<int64_t>({static_cast<int64_t>(cy) + r, h - 1, src->height - 1});
     if (x0 > x1 || y0 > y1) return 1;
-    Ring g{r, static_cast<int64_t>(static_cast<int32_t>(innerFactor * r)), 0};
-    g.rw = g.r - g.ri;
-    if (g.rw < 2) {
-        g.ri = 0;
-        g.rw = g.r;
+    int64_t ri = static_cast<int32_t>(innerFactor * r), rw = r - ri;
+    if (rw < 2) {
+        ri = 0;
+        rw = r;
     }
     const int32_t a = static_cast<int32_t>(x0), b = static_cast<int32_t>(x1), c = static_cast<int32_t>(y0),
                   e = static_cast<int32_t>(y1);
-    if (dst->bitCount == 8)
-        paste_rect<1, 1, 1, false, Rule>(dst, src, cx, cy, a, b, c, e, g, level);
-    else if (dst->bitCount == 24)
-        paste_rect<3, 3, 3, false, Rule>(dst, src, cx, cy, a, b, c, e, g, level);
-    else if (ss == 4)
-        paste_rect<4, 4, 3, true, Rule>(dst, src, cx, cy, a, b, c, e, g, level);
+    auto run = [&](auto zero) {
+        using T = decltype(zero);
+        const Ring<T> g{static_cast<T>(r), static_cast<T>(ri), static_cast<T>(rw)};
+        const T lv = static_cast<T>(level);
+        if (dst->bitCount == 8)
+            paste_rect<1, 1, 1, false, Rule>(dst, src, cx, cy, a, b, c, e, g, lv);
+        else if (dst->bitCount == 24)
+            paste_rect<3, 3, 3, false, Rule>(dst, src, cx, cy, a, b, c, e, g, lv);
+        else if (ss == 4)
+            paste_rect<4, 4, 3, true, Rule>(dst, src, cx, cy, a, b, c, e, g, lv);
+        else
+            paste_rect<4, 3, 3, false, Rule>(dst, src, cx, cy, a, b, c, e, g, lv);
+    };
+    if (r <= kNarrowRadius && level >= -kNarrowLevel && level <= kNarrowLevel)
+        run(int32_t{0});
     else
-        paste_rect<4, 3, 3, false, Rule>(dst, src, cx, cy, a, b, c, e, g, level);
+        run(int64_t{0});
     return 1;
 }
 
