@@ -11,7 +11,6 @@
 #include <pxfx/color.h>
 
 #include <algorithm>
-#include <cstring>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"

@@ -25,6 +25,27 @@ inline int32_t trunc_i(float v) { return static_cast<int32_t>(v); }
 inline int32_t trunc_i(double v) { return static_cast<int32_t>(v); }
 inline float f(int32_t v) { return static_cast<float>(v); }
 
+// n / d truncated toward zero for |n| < 2^17 and 1 <= d <= 510, as a
+// multiplication: with r = floor(2^31 / d) + 1 the error of |n| r / 2^31
+// against |n| / d stays below 2^-14, less than the 1/d gap to the next integer.
+struct Reciprocals {
+    uint32_t r[511] = {};
+    constexpr Reciprocals() {
+        for (uint32_t d = 1; d < 511; ++d)
+            r[d] = static_cast<uint32_t>((uint64_t{1} << 31) / d + 1);
+    }
+};
+inline constexpr Reciprocals kReciprocals{};
+
+inline int32_t div_small(int32_t n, int32_t d) {
+    const uint32_t m = static_cast<uint32_t>(n < 0 ? -n : n);
+    const int32_t q = static_cast<int32_t>((static_cast<uint64_t>(m) * kReciprocals.r[d]) >> 31);
+    return n < 0 ? -q : q;
+}
+
+// Written with selects rather than branches: the channel that is largest
+// changes from pixel to pixel. A tie goes to red, then to blue unless green is
+// the largest; a gray (d = 0) has hue 170 and saturation 0.
 inline uint32_t rgb_to_hsl(uint32_t c) {
     const int32_t r = static_cast<int32_t>(red_of(c)), g = static_cast<int32_t>(green_of(c)),
                   b = static_cast<int32_t>(blue_of(c));
@@ -32,20 +53,13 @@ inline uint32_t rgb_to_hsl(uint32_t c) {
     const int32_t mn = r < g ? (r < b ? r : b) : (g < b ? g : b);
     const int32_t sum = mx + mn, d = mx - mn;
     const uint32_t l = static_cast<uint32_t>((sum + 1) >> 1) & 255;
-    uint32_t s = 0, h = 170;
-    if (d != 0) {
-        const int32_t den = l <= 127 ? sum : 510 - sum;
-        s = static_cast<uint32_t>((d * 255 + den / 2) / den) & 255;
-        int32_t hh;
-        if (r == mx)
-            hh = ((g - b) * 255 / 6 + d / 2) / d + (g < b ? 255 : 0);
-        else if (g != mx)
-            hh = ((r - g) * 255 / 6 + d / 2) / d + 170;
-        else
-            hh = ((b - r) * 255 / 6 + d / 2) / d + 85;
-        h = static_cast<uint32_t>(hh) & 0xFFFF;
-        if (h > 255) h = 255;
-    }
+    const int32_t den = l <= 127 ? sum : 510 - sum;
+    const int32_t num = r == mx ? g - b : (g != mx ? r - g : b - r);
+    const int32_t turn = r == mx ? (g < b ? 255 : 0) : (g != mx ? 170 : 85);
+    const int32_t dd = d != 0 ? d : 1;
+    const uint32_t s = d != 0 ? static_cast<uint32_t>(div_small(d * 255 + den / 2, den != 0 ? den : 1)) & 255 : 0;
+    uint32_t h = static_cast<uint32_t>(div_small(num * 255 / 6 + dd / 2, dd) + turn) & 0xFFFF;
+    h = d != 0 ? (h > 255 ? 255 : h) : 170;
     return l | s << 8 | h << 16 | keep_alpha(c);
 }
 
@@ -59,16 +73,39 @@ constexpr uint16_t hue_to_rgb(uint16_t lo, uint16_t hi, uint16_t hue) {
     return lo;
 }
 
+// hue_to_rgb(lo, hi, hue) = lo + ((hi - lo) * w + 126) / 255 when lo <= hi,
+// with w = 6 hue, 255, 1020 - 6 hue or 0 by the range of the (folded) hue: the
+// ranges that return hi or lo give exactly that. HSLtoRGB always has
+// 0 <= M1 <= M2 (M2 <= 2L), so its channels take their weights from tables
+// indexed by the hue byte instead of branching.
+constexpr int32_t hue_weight(uint32_t hue) {
+    const uint32_t h = hue > 255 ? (hue - 255) & 0xFFFF : hue;
+    return h <= 41 ? static_cast<int32_t>(6 * h)
+                   : (h <= 126 ? 255 : (h <= 169 ? static_cast<int32_t>(1020 - 6 * h) : 0));
+}
+
+struct HueWeights {
+    uint16_t red[256] = {}, green[256] = {}, blue[256] = {};
+    constexpr HueWeights() {
+        for (uint32_t h = 0; h < 256; ++h) {
+            red[h] = static_cast<uint16_t>(hue_weight(h + 85));
+            green[h] = static_cast<uint16_t>(hue_weight(h));
+            blue[h] = static_cast<uint16_t>(hue_weight((h - 85) & 0xFFFF));
+        }
+    }
+};
+inline constexpr HueWeights kHueWeights{};
+
 inline uint32_t hsl_to_rgb(uint32_t c) {
     const int32_t l = static_cast<int32_t>(blue_of(c)), s = static_cast<int32_t>(green_of(c));
-    const int32_t h = static_cast<int32_t>(red_of(c));
+    const uint32_t h = red_of(c);
     if (s == 0)
         return pack(static_cast<uint32_t>(l), static_cast<uint32_t>(l), static_cast<uint32_t>(l), 0) | keep_alpha(c);
-    const uint16_t m2 = static_cast<uint16_t>(l <= 127 ? (l * (s + 255) + 127) / 255 : l + s - (l * s + 127) / 255);
-    const uint16_t m1 = static_cast<uint16_t>(2 * l - m2);
-    const uint32_t rr = hue_to_rgb(m1, m2, static_cast<uint16_t>(h + 85)) & 255u;
-    const uint32_t gg = hue_to_rgb(m1, m2, static_cast<uint16_t>(h)) & 255u;
-    const uint32_t bb = hue_to_rgb(m1, m2, static_cast<uint16_t>(h - 85)) & 255u;
+    const int32_t m2 = l <= 127 ? (l * (s + 255) + 127) / 255 : l + s - (l * s + 127) / 255;
+    const int32_t m1 = 2 * l - m2, span = m2 - m1;
+    const uint32_t rr = static_cast<uint32_t>(m1 + (span * kHueWeights.red[h] + 126) / 255) & 255u;
+    const uint32_t gg = static_cast<uint32_t>(m1 + (span * kHueWeights.green[h] + 126) / 255) & 255u;
+    const uint32_t bb = static_cast<uint32_t>(m1 + (span * kHueWeights.blue[h] + 126) / 255) & 255u;
     return pack(bb, gg, rr, 0) | keep_alpha(c);
 }
 

@@ -12,7 +12,6 @@
 #include <cstring>
 
 #include "core/internal/image_check.hpp"
-#include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
@@ -82,10 +81,11 @@ template <int S> void accumulate(const Image *src, const Taps &taps, int32_t y, 
     std::memset(acc, 0, sizeof(uint32_t) * S * static_cast<size_t>(width));
     for (size_t t = 0; t < taps.count; ++t) {
         const Tap tap = taps.list[t];
-        const uint8_t *row = row_ptr(src, std::clamp(y + tap.dy, 0, h - 1));
+        const uint8_t *row = row_ptr(src, static_cast<int32_t>(std::clamp<int64_t>(int64_t{y} + tap.dy, 0, h - 1)));
         const uint32_t k = tap.weight;
         // Output pixels x in [lo, hi) read inside the row.
-        const int32_t lo = std::clamp(-tap.dx, 0, width), hi = std::clamp(w - tap.dx, lo, width);
+        const int32_t lo = std::clamp(-tap.dx, 0, width);
+        const int32_t hi = static_cast<int32_t>(std::clamp<int64_t>(int64_t{w} - tap.dx, lo, width));
         for (int32_t x = 0; x < lo; ++x)
             for (int c = 0; c < S; ++c)
                 acc[S * x + c] += k * row[c];

@@ -2,11 +2,17 @@
 // do not edit by hand.
 #include <pxfx/toolkit.h>
 
+#if defined(__ELF__)
+#define PXFX_TABLE __attribute__((section(".rodata.pxfx_tables")))
+#else
+#define PXFX_TABLE
+#endif
+
 extern "C" {
 
 // clang-format off
 // Gentle lifting curve.
-const uint8_t ZANTOMOPI[256] = {
+PXFX_TABLE const uint8_t ZANTOMOPI[256] = {
     0, 1, 2, 4, 5, 6, 7, 9, 10, 11, 13, 14, 16, 17, 18, 20,
     21, 23, 24, 25, 27, 28, 29, 31, 32, 34, 35, 36, 38, 39, 40, 42,
     43, 45, 46, 47, 49, 50, 51, 53, 54, 55, 57, 59, 60, 61, 62, 64,
@@ -26,7 +32,7 @@ const uint8_t ZANTOMOPI[256] = {
 };
 
 // Darkening curve; its top end dips from 246 back to 228.
-const uint8_t ZANTOFILTERBK[256] = {
+PXFX_TABLE const uint8_t ZANTOFILTERBK[256] = {
     0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0,
     0, 1, 1, 1, 1, 1, 1, 2, 2, 2, 2, 2, 2, 2, 2, 2,
     3, 4, 4, 3, 4, 4, 4, 4, 5, 5, 5, 5, 6, 7, 7, 8,
@@ -46,7 +52,7 @@ const uint8_t ZANTOFILTERBK[256] = {
 };
 
 // Brightening curve; its top end wavers between 246 and 255.
-const uint8_t ZANTOFILTER[256] = {
+PXFX_TABLE const uint8_t ZANTOFILTER[256] = {
     0, 0, 2, 3, 8, 8, 12, 12, 14, 16, 18, 20, 22, 24, 26, 28,
     29, 31, 33, 35, 37, 39, 41, 42, 43, 46, 48, 49, 51, 53, 54, 57,
     58, 60, 62, 64, 65, 67, 69, 71, 72, 74, 76, 77, 79, 81, 82, 84,

@@ -48,7 +48,8 @@ PXFX_API uint32_t XYZtoRGB(uint32_t colour);
  * null or has no pixels, when any of the three plane slots is null (a partial
  * set is refused, nothing is touched), when two slots are the same pointer, or
  * when a plane cannot be made (the three slots are then released and null).
- * A slot may hold src itself: the old images are released after the split. */
+ * A slot may hold src itself: the old images are released after the split,
+ * an image held in two slots once. */
 PXFX_API int32_t Split(const Image *src, Image **plane1, Image **plane2, Image **plane3, Image **alphaPlane,
                        int32_t mode);
 /* Joins three planes (and an optional alpha plane) into a new image of
