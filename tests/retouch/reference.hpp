@@ -2,6 +2,7 @@
 // test pictures, shared by the retouch tests.
 #pragma once
 
+#include <algorithm>
 #include <cstdlib>
 #include <random>
 
@@ -20,16 +21,9 @@ inline Owned skin_picture(int32_t w, int32_t h, int32_t bitCount, uint32_t seed)
     std::mt19937 rng(seed);
     for (int32_t y = 0; y < h; ++y)
         for (int32_t x = 0; x < w; ++x) {
-            const uint32_t k = rng() % 100;
-            uint32_t r = 120 + rng() % 120, g = 60 + rng() % 60, b = 40 + rng() % 60;
-            if (k < 6)
-                r = g = b = rng() % 60; // dark speck
-            else if (k < 9)
-                g = r + 1 + rng() % 10; // greener than red: not skin
-            else if (k < 10)
-                r = 40 + rng() % 15; // near the red threshold
-            if (g > 255) g = 255;
-            SetPixelColor(im.get(), x, y, b | g << 8 | r << 16 | (rng() % 256) << 24);
+            const uint32_t k = rng() % 100, r = k < 2 ? 40 + rng() % 15 : 120 + rng() % 120, b = 40 + rng() % 60;
+            const uint32_t g = k < 5 ? std::min<uint32_t>(r + rng() % 10, 255) : 60 + rng() % 60; // greener or skin
+            SetPixelColor(im.get(), x, y, k < 8 ? rng() % 60 * 0x010101u : b | g << 8 | r << 16 | rng() << 24);
         }
     return im;
 }

@@ -113,15 +113,6 @@ TEST(SkinSmooth, SpotBrighteningMatchesAccessorVersion) {
     EXPECT_EQ(diff(skin16.get(), steps.get()), "");
 }
 
-TEST(RankFilters, SortAndPosition) {
-    int32_t v[] = {3, -7, 9, 3, 0, 9};
-    Sort_largelow(v, 6);
-    EXPECT_EQ(std::vector<int32_t>(v, v + 6), (std::vector<int32_t>{9, 9, 3, 3, 0, -7}));
-    EXPECT_EQ(getpos(v, 6, 3), 2);
-    EXPECT_EQ(getpos(v, 6, 2), 4);
-    EXPECT_EQ(getpos(v, 6, -8), 6);
-}
-
 TEST(RankFilters, BestColorIsTheThirdLargest) {
     uint32_t seed = 90;
     for (int32_t size : {-3, 0, 1, 2, 3, 4, 5, 8, 25})
