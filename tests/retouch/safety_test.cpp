@@ -15,25 +15,16 @@ TEST(Safety, NullRecordsAndSlotsAreRefused) {
     empty.bits = nullptr;
     Image *slot = nullptr;
     for (Image *bad : {static_cast<Image *>(nullptr), &empty}) {
-        const int32_t results[] = {CreateFaceMaskImg(bad, &slot),
-                                   SmileDetect(bad, &slot, 0),
-                                   alg_Img_smooth_1(bad, &slot),
-                                   alg_Img_Skin(bad, &slot, 1),
-                                   LightUP(bad),
-                                   Best_Color(bad, 3),
-                                   ImageAutoGradationProcess(bad, &slot, 50),
-                                   ImageExposure(bad, &slot, 5),
-                                   MyOneKeyFliter(bad, &slot),
-                                   PointArea_Copy(bad, pic.get(), 3, 3, 3),
-                                   PointArea_Copy_Alph(pic.get(), bad, 3, 3, 3, 9),
-                                   PX_Mimic(bad, 0, 0, nullptr, 0, 0, 3, 3, 3, 1, &slot),
-                                   alg_Blending(bad, nullptr, 3, 3, PXTint{1, 2, 3}, 3, &slot),
-                                   alg_Img_Blending(bad, &slot),
-                                   alg_smooth(bad, 0, 3, 3, 3, 5, &slot),
-                                   EyesEnlarge(bad),
-                                   alg_QuHeiYanQuan(bad, 3, 3, 3, 20, &slot, 0)};
-        for (int32_t r : results)
-            EXPECT_EQ(r, 0);
+        // Every result is 0 or 1, so a zero sum means all were refused.
+        EXPECT_EQ(
+            CreateFaceMaskImg(bad, &slot) + SmileDetect(bad, &slot, 0) + alg_Img_smooth_1(bad, &slot) +
+                alg_Img_Skin(bad, &slot, 1) + LightUP(bad) + Best_Color(bad, 3) +
+                ImageAutoGradationProcess(bad, &slot, 50) + ImageExposure(bad, &slot, 5) + MyOneKeyFliter(bad, &slot) +
+                PointArea_Copy(bad, pic.get(), 3, 3, 3) + PointArea_Copy_Alph(pic.get(), bad, 3, 3, 3, 9) +
+                PX_Mimic(bad, 0, 0, nullptr, 0, 0, 3, 3, 3, 1, &slot) +
+                alg_Blending(bad, nullptr, 3, 3, PXTint{1, 2, 3}, 3, &slot) + alg_Img_Blending(bad, &slot) +
+                alg_smooth(bad, 0, 3, 3, 3, 5, &slot) + EyesEnlarge(bad) + alg_QuHeiYanQuan(bad, 3, 3, 3, 20, &slot, 0),
+            0);
         MoreLight(bad, 3, &slot);
         ImageAutoGradationProcess1(bad, &slot, 0, 1);
         thresholdBlur(0, 0, 3, 50, bad, &slot);
