@@ -4,7 +4,7 @@
 // and the format dispatch for a source and its result.
 //
 // A window list sorted largest first (a stable selection sort) is fully
-// described by its value counts, so the ranks the retouch filters use - the
+// determined by its value counts, so the ranks the retouch filters use - the
 // k-th element of the sorted list and the position of the first element not
 // above a value - come from a sliding 256-bin histogram with 16 coarse bins.
 #pragma once

@@ -68,3 +68,21 @@ TEST(Safety, ExtremeCentresAndRadiiStayInside) {
     ComputeBezier(far, 3, pts);
     EXPECT_EQ(pts[0].x, INT_MIN);
 }
+
+TEST(Safety, HandFilledNibbleRecords) {
+    // 4-bit records read their indices through the accessors and are never
+    // written past their short rows.
+    uint8_t block[8 * 5];
+    for (size_t i = 0; i < sizeof block; ++i)
+        block[i] = static_cast<uint8_t>(i * 37);
+    Image nibbles{9, 5, 4, block, 8, 0};
+    Slot mask, lifted;
+    EXPECT_EQ(CreateFaceMaskImg(&nibbles, &mask), 1);
+    MoreLight(&nibbles, 3, &lifted);
+    EXPECT_EQ(lifted->bitCount, 8u);
+    Owned pic = random_image(9, 5, 24, 1);
+    EXPECT_EQ(PointArea_Copy(pic.get(), &nibbles, 4, 2, 30), 1);
+    alg_Img_EyesEnlarge(&nibbles, 4, 2, 6, 1);
+    alg_Img_quheiyanquan_ellipse(&nibbles, 4, 4, 10);
+    EXPECT_EQ(EyesEnlarge(&nibbles), 1);
+}
