@@ -12,27 +12,24 @@ using namespace rtest;
 
 namespace {
 
-struct Ellipse {
-    int64_t f1, f2;
-    uint32_t e(int32_t x, int32_t y, int32_t cy) const { return distance(x - f1, y - cy) + distance(x - f2, y - cy); }
-};
-
-Ellipse foci(const Image *im, int32_t cx, int32_t a) {
-    const int64_t f = xxgluSqrtFx(uint32_t(a * a - (a / 2) * (a / 2)));
-    return {std::clamp<int64_t>(cx - f, 0, im->width - 1), std::clamp<int64_t>(cx + f, 0, im->width - 1)};
-}
-
-// The four quadrant passes over every row and column of the loops, with
-// clamped reads and rejected writes doing the clipping.
-template <class K>
-void ref_passes(Image *im, int32_t cx, int32_t cy, int32_t x0, int32_t x1, int32_t y0, int32_t y1, K factor,
-                bool circle) {
+// The stretch with the accessors over the whole loop ranges: clamped reads
+// and rejected writes do the clipping.
+void ref_stretch(Image *im, int32_t cx, int32_t cy, int32_t a, bool ellipse) {
+    const int32_t f = int32_t(xxgluSqrtFx(uint32_t(a * a - (a / 2) * (a / 2)))), t = a + f / 2;
+    const int64_t f1 = std::clamp<int64_t>(cx - f, 0, im->width - 1),
+                  f2 = std::clamp<int64_t>(cx + f, 0, im->width - 1);
     auto move = [&](int32_t x, int32_t y, int dir, int minShift) {
-        const float k = factor(x, y);
-        if (k == 0) return;
+        const int32_t d = int32_t(distance(x - cx, y - cy)),
+                      e = int32_t(distance(x - f1, y - cy) + distance(x - f2, y - cy));
+        if ((ellipse ? e > 2 * a : d > a) || (!ellipse && minShift == 1 && dir == 1 && d <= 10)) return;
+        const float k = ellipse ? (e <= t ? 1.2f : 1.0f + float(2 * a - e) * 0.2f / float(2 * a - t) * 0.5f)
+                                : (d <= a / 2 ? 1.2f : 1.0f + float(a - d) * 0.2f / float(a - a / 2));
         const int shift = std::max(int(float(std::abs(y - cy)) / k), minShift);
         SetPixelColor(im, x, y, GetPixelColor(im, x, cy + dir * shift));
     };
+    const int32_t x0 = std::max(cx - a, 0), x1 = std::min(cx + a, im->width - 1);
+    const int32_t y0 = std::max(cy - (ellipse ? a / 2 : a), 0),
+                  y1 = std::min(cy + (ellipse ? (a + 1) / 2 : a), im->height - 1);
     for (int32_t y = y0; y <= cy; ++y)
         for (int32_t x = x0; x <= cx; ++x)
             move(x, y, -1, 0);
@@ -41,32 +38,10 @@ void ref_passes(Image *im, int32_t cx, int32_t cy, int32_t x0, int32_t x1, int32
             move(x, y, 1, 0);
     for (int32_t y = y1; y >= cy + 1; --y)
         for (int32_t x = x0; x <= cx - 1; ++x)
-            if (!circle || distance(x - cx, y - cy) > 10) move(x, y, 1, 1);
+            move(x, y, 1, 1);
     for (int32_t y = y0; y <= cy - 1; ++y)
         for (int32_t x = x1; x >= cx + 1; --x)
             move(x, y, -1, 1);
-}
-
-void ref_ellipse(Image *im, int32_t cx, int32_t cy, int32_t a) {
-    const Ellipse el = foci(im, cx, a);
-    const int32_t f = int32_t(xxgluSqrtFx(uint32_t(a * a - (a / 2) * (a / 2)))), t = a + f / 2, k = 2 * a - t;
-    auto factor = [&](int32_t x, int32_t y) -> float {
-        const int32_t e = int32_t(el.e(x, y, cy));
-        if (e > 2 * a) return 0;
-        return e <= t ? 1.2f : 1.0f + float(2 * a - e) * 0.2f / float(k) * 0.5f;
-    };
-    ref_passes(im, cx, cy, std::max(cx - a, 0), std::min(cx + a, im->width - 1), std::max(cy - a / 2, 0),
-               std::min(cy + (a + 1) / 2, im->height - 1), factor, false);
-}
-
-void ref_circle(Image *im, int32_t cx, int32_t cy, int32_t r) {
-    auto factor = [&](int32_t x, int32_t y) -> float {
-        const int32_t d = int32_t(distance(x - cx, y - cy));
-        if (d > r) return 0;
-        return d <= r / 2 ? 1.2f : 1.0f + float(r - d) * 0.2f / float(r - r / 2);
-    };
-    ref_passes(im, cx, cy, std::max(cx - r, 0), std::min(cx + r, im->width - 1), std::max(cy - r, 0),
-               std::min(cy + r, im->height - 1), factor, true);
 }
 
 void ref_under_eye(Image *im, int32_t cx, int32_t cy, int32_t strength) {
@@ -103,10 +78,10 @@ TEST(EyesEnlarge, EllipseAndCircleMatchAccessorVersion) {
             Owned ellipse = clone(pic.get()), circle = clone(pic.get());
             Owned refE = clone(pic.get()), refC = clone(pic.get());
             alg_Img_EyesEnlarge(ellipse.get(), cx, cy, a, 1);
-            ref_ellipse(refE.get(), cx, cy, a);
+            ref_stretch(refE.get(), cx, cy, a, true);
             EXPECT_EQ(diff(ellipse.get(), refE.get()), "") << bc << " " << cx << "," << cy << " a" << a;
             alg_Img_EyesEnlarge(circle.get(), cx, cy, a, 0);
-            ref_circle(refC.get(), cx, cy, a);
+            ref_stretch(refC.get(), cx, cy, a, false);
             EXPECT_EQ(diff(circle.get(), refC.get()), "") << bc << " " << cx << "," << cy << " r" << a;
         }
 }
