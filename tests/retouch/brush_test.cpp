@@ -13,32 +13,24 @@ using namespace rtest;
 
 namespace {
 
-uint8_t *px(Image *im, int32_t x, int32_t y, int32_t bpp) { return im->bits + size_t(y) * im->pitch + size_t(x) * bpp; }
-
 Owned ref_paste(const Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t r, bool lighten, int64_t level) {
     Owned out = clone(dst);
-    const int32_t w = dst->width, h = dst->height;
-    if (uint32_t(cx) >= uint32_t(w)) cx = w - 1;
-    if (uint32_t(cy) >= uint32_t(h)) cy = h - 1;
+    cx = uint32_t(cx) >= uint32_t(dst->width) ? dst->width - 1 : cx;
+    cy = uint32_t(cy) >= uint32_t(dst->height) ? dst->height - 1 : cy;
     int64_t ri = int32_t((lighten ? 0.1 : 0.6) * r), rw = r - ri;
     if (rw < 2) ri = 0, rw = r;
     const int32_t ds = int32_t(dst->bitCount / 8), ss = ds == 4 && src->bitCount != 32 ? 3 : ds;
-    for (int32_t y = 0; y < h; ++y)
-        for (int32_t x = 0; x < w; ++x) {
-            if (std::llabs(int64_t(x) - cx) > r || std::llabs(int64_t(y) - cy) > r) continue;
+    for (int32_t y = 0; y < dst->height; ++y)
+        for (int32_t x = 0; x < dst->width; ++x) {
             const int64_t d = distance(x - cx, y - cy);
-            if (d > r) continue;
-            uint8_t *o = px(out.get(), x, y, ds);
-            const uint8_t *s = px(const_cast<Image *>(src), x, y, ss);
+            if (std::llabs(int64_t(x) - cx) > r || std::llabs(int64_t(y) - cy) > r || d > r) continue;
+            uint8_t *o = out->bits + size_t(y) * out->pitch + size_t(x) * ds;
+            const uint8_t *s = src->bits + size_t(y) * src->pitch + size_t(x) * ss;
             for (int c = 0; c < (ds == 1 ? 1 : 3); ++c) {
-                if (d < ri) {
-                    o[c] = s[c];
-                } else if (!lighten) {
-                    o[c] = uint8_t(((d - ri) * o[c] + (r - d) * s[c]) / rw);
-                } else {
-                    const uint8_t v = uint8_t(((d - ri) * (s[c] - level) + s[c] * (r - d)) / rw);
-                    if (v > o[c] || o[c] + level == s[c]) o[c] = v;
-                }
+                const uint8_t v = uint8_t(d < ri    ? s[c]
+                                          : lighten ? ((d - ri) * (s[c] - level) + s[c] * (r - d)) / rw
+                                                    : ((d - ri) * o[c] + (r - d) * s[c]) / rw);
+                if (!lighten || d < ri || v > o[c] || o[c] + level == s[c]) o[c] = v;
             }
             if (ds == 4 && ss == 4) o[3] = s[3];
         }
