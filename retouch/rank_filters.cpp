@@ -2,6 +2,9 @@
 // specks) and the list helpers they are defined by.
 #include <pxfx/retouch.h>
 
+#include <algorithm>
+#include <cstring>
+
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
@@ -75,12 +78,28 @@ int32_t Best_Color(Image *img, int32_t size) {
             std::memset(row_ptr(img, y), 0, static_cast<size_t>(w));
         return 1;
     }
-    return for_each_window(img->bits, img->pitch, w, h, window_lo(size), window_hi(size),
-                           [&](int32_t x, int32_t y, uint8_t, const RankHist &hist) {
-                               row_ptr(img, y)[x] = static_cast<uint8_t>(hist.kth_largest(2));
-                           })
-               ? 1
-               : 0;
+    // Third largest of every window, gathered offset by offset over whole
+    // padded rows: each row keeps its three largest values so far.
+    const size_t pw = static_cast<size_t>(w) + size - 1;
+    Buffer<uint8_t> pad = padded_plane(img->bits, img->pitch, w, h, window_lo(size), size);
+    Buffer<uint8_t> rows = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(w), 3));
+    if (!pad || !rows) return 0;
+    uint8_t *first = rows.get(), *second = first + w, *third = second + w;
+    for (int32_t y = 0; y < h; ++y) {
+        std::memset(rows.get(), 0, static_cast<size_t>(w) * 3);
+        for (int32_t dy = 0; dy < size; ++dy)
+            for (int32_t dx = 0; dx < size; ++dx) {
+                const uint8_t *p = pad.get() + static_cast<size_t>(y + dy) * pw + dx;
+                for (int32_t x = 0; x < w; ++x) {
+                    const uint8_t v = p[x];
+                    third[x] = std::max(third[x], std::min(second[x], v));
+                    second[x] = std::max(second[x], std::min(first[x], v));
+                    first[x] = std::max(first[x], v);
+                }
+            }
+        std::memcpy(row_ptr(img, y), third, static_cast<size_t>(w));
+    }
+    return 1;
 }
 
 void MoreLight(const Image *src, int32_t size, Image **dst) {

@@ -61,6 +61,25 @@ struct RankHist {
     }
 };
 
+// Copy of a w x h plane with `side - 1` extra rows and columns whose reads
+// are clamped to the plane: padded (X, Y) holds plane (X + lo, Y + lo), so
+// the window of offsets lo .. lo + side - 1 around (x, y) starts at padded
+// (x, y). Null when it cannot be allocated.
+inline Buffer<uint8_t> padded_plane(const uint8_t *plane, size_t stride, int32_t w, int32_t h, int32_t lo,
+                                    int32_t side) {
+    const int64_t pw = static_cast<int64_t>(w) + side - 1, ph = static_cast<int64_t>(h) + side - 1;
+    Buffer<uint8_t> pad = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(pw), static_cast<uint64_t>(ph)));
+    if (!pad) return pad;
+    for (int64_t Y = 0; Y < ph; ++Y) {
+        const int64_t sy = Y + lo < 0 ? 0 : (Y + lo >= h ? h - 1 : Y + lo);
+        const uint8_t *in = plane + static_cast<size_t>(sy) * stride;
+        uint8_t *out = pad.get() + static_cast<size_t>(Y) * static_cast<size_t>(pw);
+        for (int64_t X = 0; X < pw; ++X)
+            out[X] = in[X + lo < 0 ? 0 : (X + lo >= w ? w - 1 : X + lo)];
+    }
+    return pad;
+}
+
 // Calls fn(x, y, centre, hist) for every pixel of a w x h plane (rows of
 // `stride` bytes), rows from the top, with the histogram of the window of
 // offsets lo..hi in both directions, reads clamped to the plane. Returns false
@@ -68,19 +87,9 @@ struct RankHist {
 template <class Fn>
 bool for_each_window(const uint8_t *plane, size_t stride, int32_t w, int32_t h, int32_t lo, int32_t hi, Fn &&fn) {
     const int32_t side = hi - lo + 1;
-    const int64_t pw = static_cast<int64_t>(w) + side - 1, ph = static_cast<int64_t>(h) + side - 1;
-    Buffer<uint8_t> pad = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(pw), static_cast<uint64_t>(ph)));
+    const size_t ps = static_cast<size_t>(w) + side - 1;
+    Buffer<uint8_t> pad = padded_plane(plane, stride, w, h, lo, side);
     if (!pad) return false;
-    const size_t ps = static_cast<size_t>(pw);
-    for (int64_t Y = 0; Y < ph; ++Y) {
-        const int64_t sy = Y + lo < 0 ? 0 : (Y + lo >= h ? h - 1 : Y + lo);
-        const uint8_t *in = plane + static_cast<size_t>(sy) * stride;
-        uint8_t *out = pad.get() + static_cast<size_t>(Y) * ps;
-        for (int64_t X = 0; X < pw; ++X) {
-            const int64_t sx = X + lo < 0 ? 0 : (X + lo >= w ? w - 1 : X + lo);
-            out[X] = in[sx];
-        }
-    }
     RankHist hist;
     for (int32_t y = 0; y < h; ++y) {
         const uint8_t *top = pad.get() + static_cast<size_t>(y) * ps;

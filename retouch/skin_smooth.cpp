@@ -30,15 +30,9 @@ bool spot_map(const Image *mask, uint8_t *spots) {
     constexpr int32_t side = 2 * kSpotHalf + 1;
     const int32_t w = mask->width, h = mask->height;
     const size_t pw = static_cast<size_t>(w) + side - 1;
-    Buffer<uint8_t> pad = alloc_buffer<uint8_t>(checked_size(pw, static_cast<uint64_t>(h) + side - 1));
+    Buffer<uint8_t> pad = padded_plane(mask->bits, mask->pitch, w, h, -kSpotHalf, side);
     Buffer<uint8_t> rows = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(w), 3));
     if (!pad || !rows) return false;
-    for (int32_t Y = 0; Y < h + side - 1; ++Y) {
-        const uint8_t *in = row_ptr(mask, clamp_to(Y - kSpotHalf, 0, h - 1));
-        uint8_t *out = pad.get() + static_cast<size_t>(Y) * pw;
-        for (int32_t X = 0; X < w + side - 1; ++X)
-            out[X] = in[clamp_to(X - kSpotHalf, 0, w - 1)];
-    }
     uint8_t *first = rows.get(), *second = first + w, *above = second + w;
     for (int32_t y = 0; y < h; ++y) {
         const uint8_t *centre = row_ptr(mask, y);
