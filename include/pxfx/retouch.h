@@ -30,38 +30,50 @@ typedef struct PXTint {
 
 /* New 8-bit skin mask (green of skin pixels, 0 elsewhere) into *mask. 1 or 0. */
 PXFX_API int32_t CreateFaceMaskImg(const Image *src, Image **mask);
-/* The skin mask as a picture of the source's format in *dst; `unused` is ignored. 1. */
+/* The skin mask as a picture of the source's format in *dst; `unused` is ignored.
+ * 1; 0 for a source without pixels or a null slot. The temporary mask is released. */
 PXFX_API int32_t SmileDetect(const Image *src, Image **dst, int32_t unused);
-/* Brightens small dark spots on the skin into *dst. 1 or 0. */
+/* Brightens small dark spots on the skin into *dst. 1; 0 for a source without pixels,
+ * a null slot or a failed allocation. Without a skin mask the source is copied. */
 PXFX_API int32_t alg_Img_smooth_1(const Image *src, Image **dst);
 /* alg_Img_smooth_1 followed by LightUP on the result. */
 PXFX_API void alg_Img_smooth(const Image *src, Image **dst);
-/* Skin smoothing, LightUP once (twice when lighten is non-zero) and a tone curve. 1. */
+/* Skin smoothing, LightUP once (twice when lighten is non-zero) and a tone curve. 1;
+ * 0 for a source without pixels, a null slot or no result image. */
 PXFX_API int32_t alg_Img_Skin(const Image *src, Image **dst, int32_t lighten);
-/* Maps blue, green and red through ZANTOMOPI in place. 1, or 0 for null. */
+/* Maps blue, green and red through ZANTOMOPI in place. 1, or 0 for null or no pixels. */
 PXFX_API int32_t LightUP(Image *img);
-/* Third-largest value of a size x size window (size 1..25) of an 8-bit image, in place. 1 or 0. */
+/* Third-largest value of a size x size window (size up to 25) of an 8-bit image, in
+ * place; windows of fewer than three values (size <= 1) give 0. 1 or 0. */
 PXFX_API int32_t Best_Color(Image *img, int32_t size);
-/* Lifts dark specks of an 8-bit image by the window's largest value into *dst. */
+/* Lifts dark specks of an 8-bit image by the window's largest value into *dst.
+ * Sizes above 255 are refused (the slot is left alone). A size <= 0 reads an empty
+ * window: its list stays cleared, so only sizes 0 and -1 (size * size <= 1) lift. */
 PXFX_API void MoreLight(const Image *src, int32_t size, Image **dst);
-/* Sorts values[0..count-1] largest first (stable selection); returns values. */
+/* Sorts values[0..count-1] largest first (stable selection); returns values (null stays null). */
 PXFX_API int32_t *Sort_largelow(int32_t *values, int32_t count);
-/* First index i with values[i] <= value, or count. */
+/* First index i with values[i] <= value, or count (also for null values). */
 PXFX_API int32_t getpos(const int32_t *values, int32_t count, int32_t value);
 
 /* ---- Tone curves and automatic gradation ----------------------------------------------- */
 
-/* 256-entry gamma table. */
+/* 256-entry gamma table; a null table is ignored. */
 PXFX_API void BuildTable(uint8_t table[256], float gamma);
-/* Turns a 256-bin histogram into a stretch mapping in place. */
+/* Turns a 256-bin histogram into a stretch mapping in place. An empty histogram has
+ * both cuts at 0 (every entry 0); a null table is ignored. */
 PXFX_API void MakeMapping(int32_t table[256], float lowFraction, float highThreshold);
-/* Auto levels blended with a local screen by amount (0..100) into *dst. 1. */
+/* Auto levels blended with a local screen by amount (0..100) into *dst; alpha is the
+ * source's. 1; 0 for a source without pixels, a null slot or a failed allocation. */
 PXFX_API int32_t ImageAutoGradationProcess(const Image *src, Image **dst, int32_t amount);
-/* Auto levels of the darker half with an optional 5/6 gamma into *dst. */
+/* Auto levels of the darker half with an optional 5/6 gamma (identity when gammaFlag
+ * is 0) into *dst; alpha is the source's. */
 PXFX_API void ImageAutoGradationProcess1(const Image *src, Image **dst, int32_t unused, int32_t gammaFlag);
-/* Adds delta to the HSL lightness into *dst. 1 or 0. */
+/* Adds delta to the HSL lightness into *dst (32-bit sources keep their alpha plane).
+ * 1; 0 for a source without pixels, a null slot, a slot image without pixels, or a
+ * failed split or combine. */
 PXFX_API int32_t ImageExposure(const Image *src, Image **dst, int32_t delta);
-/* 15 x 15 cross median of an 8-bit image into *dst, or in place when dst is null. 1 or 0. */
+/* 15 x 15 cross median of an 8-bit image into *dst, or in place when dst is null; the
+ * result of an empty slot is 8-bit with an uncomputed border of 255. 1 or 0. */
 PXFX_API int32_t MyOneKeyFliter(Image *src, Image **dst);
 /* Blur of near-black values with a tone curve into *dst. */
 PXFX_API void thresholdBlur(int32_t unused1, int32_t unused2, int32_t size, int32_t amount, const Image *src,
@@ -69,15 +81,19 @@ PXFX_API void thresholdBlur(int32_t unused1, int32_t unused2, int32_t size, int3
 
 /* ---- Area copy, clone and blending --------------------------------------------------------- */
 
-/* Soft round paste of src into dst at (cx, cy) with radius r. 1, or 0 for null images or r = 0. */
+/* Soft round paste of src into dst at (cx, cy) with radius r. 1, or 0 for images without
+ * pixels or r = 0. The source is read in the destination's layout; pixels it does not
+ * hold (rows past its height, columns past its pitch) are left unchanged. */
 PXFX_API int32_t PointArea_Copy(Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t r);
-/* Lighten-only round paste with a rim darkened by level. 1, or 0 for null images or r = 0. */
+/* Lighten-only round paste with a rim darkened by level. 1, or 0 for images without
+ * pixels or r = 0; a source smaller than dst is read as in PointArea_Copy. */
 PXFX_API int32_t PointArea_Copy_Alph(Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t r, int32_t level);
 /* Clone brush: pastes a copy of the picture (or reference) shifted by (srcX - dstX,
- * srcY - dstY), cached in *cache. 1 or 0. */
+ * srcY - dstY), cached in *cache. 1 or 0 (also for a reference without pixels). */
 PXFX_API int32_t PX_Mimic(Image *picture, int32_t srcX, int32_t srcY, const Image *reference, int32_t dstX,
                           int32_t dstY, int32_t cx, int32_t cy, int32_t r, int32_t reload, Image **cache);
-/* Tint brush: pastes a tinted copy of the picture (cached in *cache when given). 1 or 0. */
+/* Tint brush: pastes a tinted copy of the picture (cached in *cache when given). 1 or 0
+ * (also when the planes cannot be combined; the slot is then empty). */
 PXFX_API int32_t alg_Blending(Image *picture, void *unused, int32_t cx, int32_t cy, PXTint tint, int32_t r,
                               Image **cache);
 /* Whole-picture tint into *out, or in place when out is null. 1 or 0. */
@@ -85,26 +101,35 @@ PXFX_API int32_t alg_Img_Blending(Image *src, Image **out);
 /* Smoothing brush: pastes a box-smoothed copy (cached in *cache when given). 1 or 0. */
 PXFX_API int32_t alg_smooth(Image *picture, int32_t unused, int32_t cx, int32_t cy, int32_t r, int32_t strength,
                             Image **cache);
-/* Pulls a disc toward the mean colour of its surroundings (unchanged when there are none). */
+/* Pulls a disc toward the mean colour of its surroundings; a rectangle with no pixel
+ * outside the disc leaves the picture unchanged. */
 PXFX_API void alg_Img_Eradicate(Image *picture, int32_t cx, int32_t cy, int32_t r);
-/* Point of the cubic Bezier curve of four control points at t, written to *result and returned. */
+/* Point of the cubic Bezier curve of four control points at t, written to *result (when
+ * not null) and returned. Coordinates beyond 32 bits saturate, NaN gives 0; null controls
+ * give (0, 0). */
 PXFX_API PXPoint PointOnCubicBezier(PXPoint *result, const PXPoint controls[4], float t);
-/* n points along the cubic Bezier curve (n = 1 gives the start point). */
+/* n points along the cubic Bezier curve (n = 1 gives the start point; n <= 0 or null
+ * arrays: nothing). */
 PXFX_API void ComputeBezier(const PXPoint controls[4], int32_t n, PXPoint *result);
 
 /* ---- Eyes and under-eyes ----------------------------------------------------------------- */
 
-/* Vertical stretch of an eye inside an ellipse of semi-axis a around (cx, cy), in place. */
+/* Vertical stretch of an eye inside an ellipse of semi-axis a around (cx, cy), in place.
+ * Centres and axes may lie outside the picture: reads are clamped to it and only its
+ * own pixels are written. */
 PXFX_API void alg_Img_EyesEnlarge_ellipse(Image *img, int32_t cx, int32_t cy, int32_t a);
 /* Vertical stretch of an eye inside a circle of radius r, in place. */
 PXFX_API void alg_Img_EyesEnlarge_circle(Image *img, int32_t cx, int32_t cy, int32_t r);
 /* The ellipse variant (shape non-zero, a = size) or the circle variant (r = size). */
 PXFX_API void alg_Img_EyesEnlarge(Image *img, int32_t cx, int32_t cy, int32_t size, int32_t shape);
-/* Finds both eyes from the skin colour and enlarges them. 1 when the search ran, 0 on failure. */
+/* Finds both eyes from the skin colour and enlarges them. 1 when the search ran, 0 for no
+ * pixels or a failed allocation. All working memory is released; the hole fill uses
+ * one stack bounded by the face band. */
 PXFX_API int32_t EyesEnlarge(Image *img);
 /* Contrast boost by a percent inside an eye ellipse, in place. */
 PXFX_API void alg_Img_EyesMoreContrast_ellipse(Image *img, int32_t cx, int32_t cy, int32_t a, int32_t contrast);
-/* Lightens the dark crescent under an eye centre by strength 0..10, in place. */
+/* Lightens the dark crescent under an eye centre by strength 0..10, in place; alpha is
+ * kept. Only pixels inside the picture are visited. */
 PXFX_API void alg_Img_quheiyanquan_ellipse(Image *img, int32_t cx, int32_t cy, int32_t strength);
 /* Lightening brush with a cached lightened copy. 1 or 0. */
 PXFX_API int32_t alg_QuHeiYanQuan(Image *img, int32_t cx, int32_t cy, int32_t r, int32_t level, Image **cache,

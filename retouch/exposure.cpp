@@ -1,0 +1,56 @@
+// Exposure control: a shift of the HSL lightness plane.
+#include <pxfx/color.h>
+#include <pxfx/retouch.h>
+
+#include "core/internal/image_check.hpp"
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+
+using namespace pxfx;
+
+namespace {
+
+constexpr int32_t kHsl = 1;
+
+void shift_plane(Image *plane, int32_t delta) {
+    uint8_t table[256];
+    for (int32_t i = 0; i < 256; ++i) {
+        const int64_t v = static_cast<int64_t>(i) + delta;
+        table[i] = v > 255 ? 255 : (v < 0 ? 0 : static_cast<uint8_t>(v));
+    }
+    for (int32_t y = 0; y < plane->height; ++y) {
+        uint8_t *p = row_ptr(plane, y);
+        for (int32_t x = 0; x < plane->width; ++x)
+            p[x] = table[p[x]];
+    }
+}
+
+} // namespace
+
+extern "C" {
+
+int32_t ImageExposure(const Image *src, Image **dst, int32_t delta) {
+    if (!has_pixels(src) || dst == nullptr) return 0;
+    if (*dst != nullptr && !has_pixels(*dst)) return 0;
+    Image *h = nullptr, *s = nullptr, *l = nullptr, *a = nullptr;
+    if (!Split(src, &h, &s, &l, src->bitCount == 32 ? &a : nullptr, kHsl)) return 0;
+    shift_plane(l, delta);
+    ImagePtr combined(Combine(h, s, l, a, kHsl));
+    free_Image(&h, 0);
+    free_Image(&s, 0);
+    free_Image(&l, 0);
+    free_Image(&a, 0);
+    if (!combined) return 0;
+    if (*dst == nullptr && combined->bitCount == src->bitCount) {
+        *dst = combined.release();
+        return 1;
+    }
+    if (*dst == nullptr) {
+        *dst = malloc_Image(src->width, src->height, static_cast<int32_t>(src->bitCount));
+        if (*dst == nullptr) return 0;
+    }
+    PX_Img_Copy(*dst, combined.get());
+    return 1;
+}
+
+} // extern "C"

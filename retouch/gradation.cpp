@@ -1,0 +1,224 @@
+// Tone curves and automatic levels: the gamma table, the histogram stretch
+// mapping, auto levels blended with a local screen, and the split auto levels
+// of the darker half.
+#include <pxfx/retouch.h>
+
+#include <cmath>
+
+#include "core/internal/image_check.hpp"
+#include "core/internal/math.hpp"
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+#include "core/internal/result.hpp"
+#include "retouch/retouch_common.hpp"
+
+using namespace pxfx;
+
+namespace {
+
+// The stretch mapping of a histogram whose bins may exceed 32 bits.
+void make_mapping(const int64_t hist[256], float lowFraction, float highThreshold, int32_t map[256]) {
+    int64_t total = 0;
+    for (int32_t i = 0; i < 256; ++i)
+        total += hist[i];
+    const float lowCut = static_cast<float>(total) * lowFraction;
+    int32_t lo = 0, hi = 0;
+    int64_t run = 0;
+    for (int32_t i = 0; i < 256; ++i) {
+        run += hist[i];
+        if (static_cast<float>(run) > lowCut) {
+            lo = i;
+            break;
+        }
+    }
+    run = 0;
+    for (int32_t i = 255; i >= 0; --i) {
+        run += hist[i];
+        if (static_cast<float>(run) > highThreshold) {
+            hi = i;
+            break;
+        }
+    }
+    for (int32_t i = 0; i < 256; ++i) {
+        if (hi == lo)
+            map[i] = hi;
+        else if (i < lo)
+            map[i] = 0;
+        else if (i <= hi)
+            map[i] = (255 * i - 255 * lo) / (hi - lo);
+        else
+            map[i] = 255;
+    }
+}
+
+template <class F> void channel_histogram(const Image *src, int64_t hist[256]) {
+    for (int32_t y = 0; y < src->height; ++y) {
+        const typename F::CRow in = F::crow(src, y);
+        for (int32_t x = 0; x < src->width; ++x) {
+            const uint32_t c = F::load(in, x);
+            ++hist[blue_of(c)];
+            ++hist[green_of(c)];
+            ++hist[red_of(c)];
+        }
+    }
+}
+
+// Loads row y of src into buf[1..w] with the edge pixels repeated at 0 and w + 1.
+template <class F> void load_row(const Image *src, int32_t y, uint32_t *buf) {
+    const typename F::CRow in = F::crow(src, y);
+    for (int32_t x = 0; x < src->width; ++x)
+        buf[x + 1] = F::load(in, x);
+    buf[0] = buf[1];
+    buf[src->width + 1] = buf[src->width];
+}
+
+struct LocalScreen {
+    uint8_t map[256];
+    uint8_t screen[256][256]; // [neighbour mean n][M[v]]
+    uint8_t blend[256][256];  // [screen s][v]
+};
+
+template <class FS, class FD>
+bool auto_levels(const Image *src, Image *out, const int32_t map[256], int32_t amount, LocalScreen &t) {
+    for (int32_t i = 0; i < 256; ++i)
+        t.map[i] = static_cast<uint8_t>(map[i]);
+    for (int32_t n = 0; n < 256; ++n)
+        for (int32_t m = 0; m < 256; ++m)
+            t.screen[n][m] = static_cast<uint8_t>(255 - ((255 - n) * (255 - m)) / 255);
+    for (int32_t s = 0; s < 256; ++s)
+        for (int32_t v = 0; v < 256; ++v)
+            t.blend[s][v] = static_cast<uint8_t>((amount * s + (100 - amount) * v) / 100);
+    const int32_t w = src->width, h = src->height;
+    Buffer<uint32_t> rows = alloc_buffer<uint32_t>(checked_size(static_cast<uint64_t>(w) + 2, 3));
+    if (!rows) return false;
+    uint32_t *up = rows.get(), *cur = up + (w + 2), *down = cur + (w + 2);
+    load_row<FS>(src, 0, cur);
+    load_row<FS>(src, h > 1 ? 1 : 0, down);
+    for (int32_t i = 0; i < w + 2; ++i)
+        up[i] = cur[i];
+    for (int32_t y = 0; y < h; ++y) {
+        const typename FD::Row o = FD::row(out, y);
+        for (int32_t x = 1; x <= w; ++x) {
+            const uint32_t c = cur[x], l = cur[x - 1], r = cur[x + 1], a = up[x], b = down[x];
+            uint32_t res = c & 0xFF000000u;
+            for (uint32_t shift = 0; shift < 24; shift += 8) {
+                const uint32_t v = (c >> shift) & 255;
+                const uint32_t n = (t.map[(l >> shift) & 255] + t.map[(r >> shift) & 255] + t.map[(a >> shift) & 255] +
+                                    t.map[(b >> shift) & 255] + 2) /
+                                   4;
+                res |= static_cast<uint32_t>(t.blend[t.screen[n][t.map[v]]][v]) << shift;
+            }
+            FD::store(o, x - 1, res);
+        }
+        uint32_t *spare = up;
+        up = cur;
+        cur = down;
+        down = spare;
+        if (y + 2 < h)
+            load_row<FS>(src, y + 2, down);
+        else
+            for (int32_t i = 0; i < w + 2; ++i)
+                down[i] = cur[i];
+    }
+    return true;
+}
+
+template <class F> void green_and_dark_histograms(const Image *src, int64_t green[256], int64_t dark[256]) {
+    for (int32_t y = 0; y < src->height; ++y) {
+        const typename F::CRow in = F::crow(src, y);
+        for (int32_t x = 0; x < src->width; ++x)
+            ++green[green_of(F::load(in, x))];
+    }
+    int64_t half = static_cast<int64_t>(src->width) * src->height / 2, sum = 0;
+    int32_t split = 255;
+    for (int32_t i = 255; i > 0; --i) {
+        sum += green[i];
+        if (sum >= half) {
+            split = i;
+            break;
+        }
+    }
+    for (int32_t y = 0; y < src->height; ++y) {
+        const typename F::CRow in = F::crow(src, y);
+        for (int32_t x = 0; x < src->width; ++x) {
+            const uint32_t c = F::load(in, x);
+            if (red_of(c) <= static_cast<uint32_t>(split)) {
+                ++dark[blue_of(c)];
+                ++dark[green_of(c)];
+            }
+        }
+    }
+}
+
+template <class FS, class FD> void map_pixels(const Image *src, Image *out, const uint8_t table[3][256]) {
+    for (int32_t y = 0; y < src->height; ++y) {
+        const typename FS::CRow in = FS::crow(src, y);
+        const typename FD::Row o = FD::row(out, y);
+        for (int32_t x = 0; x < src->width; ++x) {
+            const uint32_t c = FS::load(in, x);
+            FD::store(o, x, pack(table[0][blue_of(c)], table[1][green_of(c)], table[2][red_of(c)], alpha_of(c)));
+        }
+    }
+}
+
+} // namespace
+
+extern "C" {
+
+void BuildTable(uint8_t table[256], float gamma) {
+    if (table == nullptr) return;
+    for (int32_t i = 0; i < 256; ++i) {
+        const float x = (static_cast<float>(i) + 0.5f) * 0.00390625f;
+        const float p = static_cast<float>(std::pow(static_cast<double>(x), static_cast<double>(gamma)));
+        const float v = p * 256.0f - 0.5f;
+        table[i] = v > 255.0f ? 255 : (v < 0.0f ? 0 : static_cast<uint8_t>(static_cast<int32_t>(v)));
+    }
+}
+
+void MakeMapping(int32_t table[256], float lowFraction, float highThreshold) {
+    if (table == nullptr) return;
+    int64_t hist[256];
+    for (int32_t i = 0; i < 256; ++i)
+        hist[i] = table[i];
+    make_mapping(hist, lowFraction, highThreshold, table);
+}
+
+int32_t ImageAutoGradationProcess(const Image *src, Image **dst, int32_t amount) {
+    Image *out = acquire_result(src, dst);
+    if (out == nullptr) return 0;
+    amount = clamp_to(amount, 0, 100);
+    int64_t hist[256] = {};
+    with_format(src->bitCount, [&](auto f) { channel_histogram<decltype(f)>(src, hist); });
+    int32_t map[256];
+    make_mapping(hist, 0.0005f, 0.0005f, map);
+    Buffer<LocalScreen> tables = alloc_buffer<LocalScreen>(1);
+    if (!tables) return 0;
+    bool ok = false;
+    with_formats(src, out, [&](auto fs, auto fd) {
+        ok = auto_levels<decltype(fs), decltype(fd)>(src, out, map, amount, tables[0]);
+    });
+    return ok ? 1 : 0;
+}
+
+void ImageAutoGradationProcess1(const Image *src, Image **dst, int32_t, int32_t gammaFlag) {
+    Image *out = acquire_result(src, dst);
+    if (out == nullptr) return;
+    uint8_t gamma[256];
+    if (gammaFlag != 0)
+        BuildTable(gamma, 0.8333333f);
+    else
+        for (int32_t i = 0; i < 256; ++i)
+            gamma[i] = static_cast<uint8_t>(i);
+    // The stretch of the brighter half would be written first and then
+    // overwritten everywhere by the darker half's, so only the latter is made.
+    int64_t green[256] = {}, dark[256] = {};
+    with_format(src->bitCount, [&](auto f) { green_and_dark_histograms<decltype(f)>(src, green, dark); });
+    int32_t map[256];
+    make_mapping(dark, 0.0f, 0.0f, map);
+    uint8_t table[3][256];
+    for (int32_t i = 0; i < 256; ++i)
+        table[0][i] = table[1][i] = table[2][i] = gamma[map[i]];
+    with_formats(src, out, [&](auto fs, auto fd) { map_pixels<decltype(fs), decltype(fd)>(src, out, table); });
+}
+
+} // extern "C"

@@ -1,0 +1,100 @@
+// One-key noise filter of 8-bit pictures: the median of a 15 x 15 cross
+// (the centre column and the centre row, 29 values), kept with one histogram
+// per column that slides down the picture.
+#include <pxfx/retouch.h>
+
+#include <cstring>
+
+#include "core/internal/image_check.hpp"
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+
+using namespace pxfx;
+
+namespace {
+
+constexpr int32_t kArm = 7;
+constexpr uint32_t kMedianRank = 14; // the 15th of 29 values
+
+// Bins of a window: 256 fine counts and 16 coarse ones; counts stay below 16.
+struct Hist {
+    uint8_t fine[256];
+    uint8_t coarse[16];
+    void add(uint8_t v) {
+        ++fine[v];
+        ++coarse[v >> 4];
+    }
+    void remove(uint8_t v) {
+        --fine[v];
+        --coarse[v >> 4];
+    }
+};
+
+// Smallest value whose running count exceeds kMedianRank in the column plus
+// the row, with the centre (in both) counted once.
+uint8_t cross_rank(const Hist &col, const Hist &row, uint8_t centre) {
+    uint32_t seen = 0;
+    int32_t g = 0;
+    const int32_t cg = centre >> 4;
+    for (;; ++g) {
+        const uint32_t n = col.coarse[g] + row.coarse[g] - (g == cg);
+        if (seen + n > kMedianRank) break;
+        seen += n;
+    }
+    for (int32_t v = g * 16;; ++v) {
+        seen += col.fine[v] + row.fine[v] - (v == centre);
+        if (seen > kMedianRank) return static_cast<uint8_t>(v);
+    }
+}
+
+// Column histograms slide down one row per output row; the histogram of the
+// 15 pixels of the centre row slides along it.
+void cross_median(const Image *src, Image *res, Hist *cols) {
+    const int32_t w = src->width, h = src->height;
+    if (h < 2 * kArm + 3 || w < 2 * kArm + 2) return;
+    for (int32_t x = kArm; x <= w - 9; ++x)
+        for (int32_t y = 0; y < 2 * kArm + 1; ++y)
+            cols[x].add(row_ptr(src, y)[x]);
+    Hist row;
+    for (int32_t y = kArm + 1; y < h - kArm - 1; ++y) {
+        const uint8_t *leaving = row_ptr(src, y - kArm - 1), *entering = row_ptr(src, y + kArm);
+        const uint8_t *r = row_ptr(src, y);
+        uint8_t *out = row_ptr(res, y);
+        std::memset(&row, 0, sizeof row);
+        for (int32_t i = 0; i < 2 * kArm; ++i)
+            row.add(r[i]);
+        for (int32_t x = kArm; x < w - kArm - 1; ++x) {
+            Hist &c = cols[x];
+            c.remove(leaving[x]);
+            c.add(entering[x]);
+            row.add(r[x + kArm]);
+            out[x] = cross_rank(c, row, r[x]);
+            row.remove(r[x - kArm]);
+        }
+    }
+}
+
+} // namespace
+
+extern "C" {
+
+int32_t MyOneKeyFliter(Image *src, Image **dst) {
+    if (!is_plane(src)) return 0;
+    const int32_t w = src->width, h = src->height;
+    ImagePtr res = make_image(w, h, 8);
+    if (!res) return 0;
+    Buffer<Hist> cols = alloc_zeroed<Hist>(static_cast<size_t>(w));
+    if (!cols) return 0;
+    cross_median(src, res.get(), cols.get());
+    if (dst == nullptr) {
+        for (int32_t y = kArm + 1; y < h - kArm - 1 && w > 2 * kArm + 1; ++y)
+            std::memcpy(row_ptr(src, y) + kArm, row_ptr(res.get(), y) + kArm, static_cast<size_t>(w - 2 * kArm - 1));
+    } else if (*dst == nullptr) {
+        *dst = res.release();
+    } else {
+        PX_Img_Copy(*dst, res.get());
+    }
+    return 1;
+}
+
+} // extern "C"

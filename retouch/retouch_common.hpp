@@ -1,0 +1,164 @@
+// Building blocks shared by the retouch tools: rank statistics of square
+// windows over an 8-bit plane (reads outside the picture clamped to the
+// nearest edge, as GetPixelIndex does), brightening by a per-pixel amount map,
+// and the format dispatch for a source and its result.
+//
+// A window list sorted largest first (a stable selection sort) is fully
+// determined by its value counts, so the ranks the retouch filters use - the
+// k-th element of the sorted list and the position of the first element not
+// above a value - come from a sliding 256-bin histogram with 16 coarse bins.
+#pragma once
+
+#include <cstdint>
+#include <cstring>
+
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+
+namespace pxfx {
+
+struct RankHist {
+    uint32_t fine[256];
+    uint32_t coarse[16];
+
+    void clear() {
+        std::memset(fine, 0, sizeof fine);
+        std::memset(coarse, 0, sizeof coarse);
+    }
+    void add(uint8_t v) {
+        ++fine[v];
+        ++coarse[v >> 4];
+    }
+    void remove(uint8_t v) {
+        --fine[v];
+        --coarse[v >> 4];
+    }
+    // Number of values strictly greater than c: the position getpos returns
+    // for c on the sorted list.
+    uint32_t count_above(uint32_t c) const {
+        uint32_t n = 0;
+        for (uint32_t g = (c >> 4) + 1; g < 16; ++g)
+            n += coarse[g];
+        for (uint32_t v = c + 1; v < ((c >> 4) + 1) << 4; ++v)
+            n += fine[v];
+        return n;
+    }
+    // Element k (from 0) of the list sorted largest first; 0 when the window
+    // has k or fewer values (the rest of a cleared list).
+    uint32_t kth_largest(uint32_t k) const {
+        uint32_t seen = 0;
+        for (int32_t g = 15; g >= 0; --g) {
+            if (seen + coarse[g] <= k) {
+                seen += coarse[g];
+                continue;
+            }
+            for (int32_t v = g * 16 + 15;; --v) {
+                seen += fine[v];
+                if (seen > k) return static_cast<uint32_t>(v);
+            }
+        }
+        return 0;
+    }
+};
+
+// Copy of a w x h plane with `side - 1` extra rows and columns whose reads
+// are clamped to the plane: padded (X, Y) holds plane (X + lo, Y + lo), so
+// the window of offsets lo .. lo + side - 1 around (x, y) starts at padded
+// (x, y). Null when it cannot be allocated.
+inline Buffer<uint8_t> padded_plane(const uint8_t *plane, size_t stride, int32_t w, int32_t h, int32_t lo,
+                                    int32_t side) {
+    const int64_t pw = static_cast<int64_t>(w) + side - 1, ph = static_cast<int64_t>(h) + side - 1;
+    Buffer<uint8_t> pad = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(pw), static_cast<uint64_t>(ph)));
+    if (!pad) return pad;
+    for (int64_t Y = 0; Y < ph; ++Y) {
+        const int64_t sy = Y + lo < 0 ? 0 : (Y + lo >= h ? h - 1 : Y + lo);
+        const uint8_t *in = plane + static_cast<size_t>(sy) * stride;
+        uint8_t *out = pad.get() + static_cast<size_t>(Y) * static_cast<size_t>(pw);
+        for (int64_t X = 0; X < pw; ++X)
+            out[X] = in[X + lo < 0 ? 0 : (X + lo >= w ? w - 1 : X + lo)];
+    }
+    return pad;
+}
+
+// Calls fn(x, y, centre, hist) for every pixel of a w x h plane (rows of
+// `stride` bytes), rows from the top, with the histogram of the window of
+// offsets lo..hi in both directions, reads clamped to the plane. Returns false
+// when the padded working copy cannot be allocated.
+template <class Fn>
+bool for_each_window(const uint8_t *plane, size_t stride, int32_t w, int32_t h, int32_t lo, int32_t hi, Fn &&fn) {
+    const int32_t side = hi - lo + 1;
+    const size_t ps = static_cast<size_t>(w) + side - 1;
+    Buffer<uint8_t> pad = padded_plane(plane, stride, w, h, lo, side);
+    if (!pad) return false;
+    RankHist hist;
+    for (int32_t y = 0; y < h; ++y) {
+        const uint8_t *top = pad.get() + static_cast<size_t>(y) * ps;
+        const uint8_t *centreRow = plane + static_cast<size_t>(y) * stride;
+        hist.clear();
+        for (int32_t dy = 0; dy < side; ++dy)
+            for (int32_t dx = 0; dx < side; ++dx)
+                hist.add(top[static_cast<size_t>(dy) * ps + dx]);
+        for (int32_t x = 0;; ++x) {
+            fn(x, y, centreRow[x], hist);
+            if (x + 1 >= w) break;
+            const uint8_t *leaving = top + x, *entering = top + x + side;
+            for (int32_t dy = 0; dy < side; ++dy) {
+                hist.remove(leaving[static_cast<size_t>(dy) * ps]);
+                hist.add(entering[static_cast<size_t>(dy) * ps]);
+            }
+        }
+    }
+    return true;
+}
+
+// Calls fn(FS{}, FD{}) with the formats of a source and its result: one
+// specialisation when the bit counts agree, the accessors otherwise.
+template <class Fn> void with_formats(const Image *src, const Image *dst, Fn &&fn) {
+    if (src->bitCount == dst->bitCount)
+        with_format(src->bitCount, [&](auto f) { fn(f, f); });
+    else
+        fn(AnyFormat{}, AnyFormat{});
+}
+
+// c + weight * d in double precision, above 255.0 set to 255, else truncated.
+inline uint32_t lift_channel(uint32_t c, uint32_t d, double weight) {
+    const double v = static_cast<double>(c) + weight * static_cast<double>(d);
+    return v > 255.0 ? 255u : static_cast<uint32_t>(v);
+}
+
+// Writes every pixel of src to dst, raising blue, green and red of the pixels
+// whose amount byte d is non-zero by wb d, wg d and wr d; alpha kept.
+template <class FS, class FD>
+void lift_pixels(const Image *src, Image *dst, const uint8_t *amount, size_t stride, double wb, double wg, double wr) {
+    for (int32_t y = 0; y < src->height; ++y) {
+        const typename FS::CRow in = FS::crow(src, y);
+        const typename FD::Row out = FD::row(dst, y);
+        const uint8_t *a = amount + static_cast<size_t>(y) * stride;
+        for (int32_t x = 0; x < src->width; ++x) {
+            uint32_t c = FS::load(in, x);
+            if (a[x] != 0)
+                c = pack(lift_channel(blue_of(c), a[x], wb), lift_channel(green_of(c), a[x], wg),
+                         lift_channel(red_of(c), a[x], wr), alpha_of(c));
+            FD::store(out, x, c);
+        }
+    }
+}
+
+// Maps blue, green and red of every pixel through per-channel tables in
+// place; alpha kept.
+template <class F> void map_channels(Image *img, const uint8_t tb[256], const uint8_t tg[256], const uint8_t tr[256]) {
+    for (int32_t y = 0; y < img->height; ++y) {
+        const typename F::CRow in = F::crow(img, y);
+        const typename F::Row out = F::row(img, y);
+        for (int32_t x = 0; x < img->width; ++x) {
+            const uint32_t c = F::load(in, x);
+            F::store(out, x, pack(tb[blue_of(c)], tg[green_of(c)], tr[red_of(c)], alpha_of(c)));
+        }
+    }
+}
+
+inline void map_channels(Image *img, const uint8_t table[256]) {
+    with_format(img->bitCount, [&](auto f) { map_channels<decltype(f)>(img, table, table, table); });
+}
+
+} // namespace pxfx

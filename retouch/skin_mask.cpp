@@ -1,0 +1,136 @@
+// Skin mask of a portrait: colour rule, removal of short runs, an 11 x 11
+// erosion that reads the mask while rewriting it, and the clearing of the
+// erosion marks. SmileDetect hands the mask out as a picture.
+#include <pxfx/retouch.h>
+
+#include "core/internal/image_check.hpp"
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+#include "core/internal/result.hpp"
+
+using namespace pxfx;
+
+namespace {
+
+constexpr int32_t kMinRun = 20;
+constexpr int32_t kErodeHalf = 5;
+
+template <class F> void colour_rule(const Image *src, Image *mask) {
+    for (int32_t y = 0; y < src->height; ++y) {
+        const typename F::CRow in = F::crow(src, y);
+        uint8_t *m = row_ptr(mask, y);
+        for (int32_t x = 0; x < src->width; ++x) {
+            const uint32_t c = F::load(in, x);
+            const uint32_t b = blue_of(c), g = green_of(c), r = red_of(c);
+            m[x] = r >= g && r >= b && r > 49 ? static_cast<uint8_t>(g) : 0;
+        }
+    }
+}
+
+// Runs shorter than kMinRun end at a zero byte or at the last column; the
+// last column itself is never counted.
+void remove_short_runs(Image *mask) {
+    const int32_t w = mask->width;
+    for (int32_t y = 0; y < mask->height; ++y) {
+        uint8_t *m = row_ptr(mask, y);
+        int32_t run = 0;
+        for (int32_t x = 0; x < w; ++x) {
+            if (m[x] != 0 && x < w - 1) {
+                ++run;
+                continue;
+            }
+            if (run >= 1 && run < kMinRun)
+                for (int32_t i = x - run; i < x; ++i)
+                    m[i] = 0;
+            run = 0;
+        }
+    }
+}
+
+// The erosion visits (x, y) in [5, w - 6) x [5, h - 6) row by row and marks a
+// pixel 1 when its 11 x 11 window holds a 0 at that moment. A visited pixel
+// is never 0 afterwards (its own position is in its window), so the zeros a
+// window sees are the original zeros outside the visited area: everywhere in
+// the rows below, at and right of x in row y, and in the border band (outside
+// the visited rectangle) in row y to the left and in the rows above. These
+// counts come from a summed-area table of the original zeros.
+bool erode(Image *mask) {
+    const int32_t w = mask->width, h = mask->height;
+    const int32_t x0 = kErodeHalf, x1 = w - kErodeHalf - 1, y0 = kErodeHalf, y1 = h - kErodeHalf - 1;
+    if (x1 <= x0 || y1 <= y0) return true;
+    const size_t sw = static_cast<size_t>(w) + 1;
+    Buffer<uint32_t> sat = alloc_buffer<uint32_t>(checked_size(sw, static_cast<uint64_t>(h) + 1));
+    if (!sat) return false;
+    uint32_t *s = sat.get();
+    for (size_t i = 0; i < sw; ++i)
+        s[i] = 0;
+    for (int32_t y = 0; y < h; ++y) {
+        const uint8_t *m = row_ptr(mask, y);
+        uint32_t *prev = s + static_cast<size_t>(y) * sw, *cur = prev + sw;
+        uint32_t run = 0;
+        cur[0] = 0;
+        for (int32_t x = 0; x < w; ++x) {
+            run += m[x] == 0;
+            cur[x + 1] = prev[x + 1] + run;
+        }
+    }
+    // Zeros in rows [ya, yb) and columns [xa, xb), empty ranges giving 0.
+    auto zeros = [&](int32_t ya, int32_t yb, int32_t xa, int32_t xb) -> uint32_t {
+        if (ya >= yb || xa >= xb) return 0;
+        const uint32_t *ra = s + static_cast<size_t>(ya) * sw, *rb = s + static_cast<size_t>(yb) * sw;
+        return rb[xb] - rb[xa] - ra[xb] + ra[xa];
+    };
+    auto clip = [](int32_t v, int32_t lo, int32_t hi) { return v < lo ? lo : (v > hi ? hi : v); };
+    for (int32_t y = y0; y < y1; ++y) {
+        uint8_t *m = row_ptr(mask, y);
+        const int32_t above = y - kErodeHalf;
+        const int32_t aboveInner = clip(above, y0, y); // rows [aboveInner, y) are visited rows
+        for (int32_t x = x0; x < x1; ++x) {
+            const int32_t xa = x - kErodeHalf, xb = x + kErodeHalf + 1;
+            const int32_t ia = clip(xa, x0, x1), ib = clip(xb, x0, x1);
+            if (zeros(above, y + kErodeHalf + 1, xa, xb) == 0) continue;
+            uint32_t n = zeros(y + 1, y + kErodeHalf + 1, xa, xb) + zeros(y, y + 1, x, xb);
+            if (n == 0)
+                n = zeros(y, y + 1, xa, x) - zeros(y, y + 1, ia, x) + zeros(above, y, xa, xb) -
+                    zeros(aboveInner, y, ia, ib);
+            if (n != 0) m[x] = 1;
+        }
+    }
+    return true;
+}
+
+void clear_marks(Image *mask) {
+    for (int32_t y = 1; y < mask->height - 1; ++y) {
+        uint8_t *m = row_ptr(mask, y);
+        for (int32_t x = 1; x < mask->width - 1; ++x)
+            if (m[x] == 1) m[x] = 0;
+    }
+}
+
+} // namespace
+
+extern "C" {
+
+int32_t CreateFaceMaskImg(const Image *src, Image **mask) {
+    if (!has_pixels(src) || mask == nullptr) return 0;
+    free_Image(mask, 0);
+    ImagePtr m = make_image(src->width, src->height, 8);
+    if (!m) return 0;
+    with_format(src->bitCount, [&](auto f) { colour_rule<decltype(f)>(src, m.get()); });
+    remove_short_runs(m.get());
+    if (!erode(m.get())) return 0;
+    clear_marks(m.get());
+    *mask = m.release();
+    return 1;
+}
+
+int32_t SmileDetect(const Image *src, Image **dst, int32_t) {
+    Image *out = acquire_result(src, dst);
+    if (out == nullptr) return 0;
+    Image *mask = nullptr;
+    if (CreateFaceMaskImg(src, &mask)) PX_Img_Copy(out, mask);
+    free_Image(&mask, 0);
+    return 1;
+}
+
+} // extern "C"

@@ -1,0 +1,118 @@
+// Skin smoothing: small dark spots inside the skin mask are brightened by the
+// gap to their window's second largest mask value, then the brightening curve
+// and a blend of identity and the filter curve give the skin tone.
+#include <pxfx/retouch.h>
+#include <pxfx/toolkit.h>
+
+#include <algorithm>
+#include <cstring>
+
+#include "core/internal/image_check.hpp"
+#include "core/internal/math.hpp"
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+#include "core/internal/result.hpp"
+#include "retouch/retouch_common.hpp"
+
+using namespace pxfx;
+
+namespace {
+
+constexpr int32_t kSpotHalf = 2;     // 5 x 5 window
+constexpr uint32_t kMinBrighter = 3; // neighbours brighter than the centre
+constexpr double kSpotBlue = 0.8, kSpotGreen = 0.8, kSpotRed = 0.7;
+
+// Spot map of the skin mask: the second largest value of the 5 x 5 window
+// minus the centre, where at least kMinBrighter values exceed a non-zero
+// centre. Rows are gathered offset by offset on an edge-padded copy, so the
+// inner loops run over whole rows of bytes.
+bool spot_map(const Image *mask, uint8_t *spots) {
+    constexpr int32_t side = 2 * kSpotHalf + 1;
+    const int32_t w = mask->width, h = mask->height;
+    const size_t pw = static_cast<size_t>(w) + side - 1;
+    Buffer<uint8_t> pad = padded_plane(mask->bits, mask->pitch, w, h, -kSpotHalf, side);
+    Buffer<uint8_t> rows = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(w), 3));
+    if (!pad || !rows) return false;
+    uint8_t *first = rows.get(), *second = first + w, *above = second + w;
+    for (int32_t y = 0; y < h; ++y) {
+        const uint8_t *centre = row_ptr(mask, y);
+        std::memset(rows.get(), 0, static_cast<size_t>(w) * 3);
+        for (int32_t dy = 0; dy < side; ++dy)
+            for (int32_t dx = 0; dx < side; ++dx) {
+                const uint8_t *p = pad.get() + static_cast<size_t>(y + dy) * pw + dx;
+                for (int32_t x = 0; x < w; ++x) {
+                    const uint8_t v = p[x];
+                    above[x] = static_cast<uint8_t>(above[x] + (v > centre[x]));
+                    second[x] = std::max(second[x], std::min(first[x], v));
+                    first[x] = std::max(first[x], v);
+                }
+            }
+        uint8_t *out = spots + static_cast<size_t>(y) * w;
+        for (int32_t x = 0; x < w; ++x)
+            if (centre[x] != 0 && above[x] >= kMinBrighter) out[x] = static_cast<uint8_t>(second[x] - centre[x]);
+    }
+    return true;
+}
+
+} // namespace
+
+extern "C" {
+
+int32_t alg_Img_smooth_1(const Image *src, Image **dst) {
+    Image *out = acquire_result(src, dst);
+    if (out == nullptr) return 0;
+    const int32_t w = src->width, h = src->height;
+    Buffer<uint8_t> spots = alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h)));
+    if (!spots) return 0;
+    // Without a mask no pixel is skin and the source is copied unchanged.
+    Image *mask = nullptr;
+    const bool ok = !CreateFaceMaskImg(src, &mask) || spot_map(mask, spots.get());
+    free_Image(&mask, 0);
+    if (!ok) return 0;
+    with_formats(src, out, [&](auto fs, auto fd) {
+        lift_pixels<decltype(fs), decltype(fd)>(src, out, spots.get(), static_cast<size_t>(w), kSpotBlue, kSpotGreen,
+                                                kSpotRed);
+    });
+    return 1;
+}
+
+void alg_Img_smooth(const Image *src, Image **dst) {
+    alg_Img_smooth_1(src, dst);
+    if (dst != nullptr && *dst != nullptr) LightUP(*dst);
+}
+
+int32_t alg_Img_Skin(const Image *src, Image **dst, int32_t lighten) {
+    if (!has_pixels(src) || dst == nullptr) return 0;
+    uint8_t tone[256];
+    for (int32_t i = 0; i < 256; ++i)
+        tone[i] = static_cast<uint8_t>((52 * i + 75 * ZANTOFILTER[i] + 63) / 127);
+    alg_Img_smooth_1(src, dst);
+    Image *out = *dst;
+    if (!has_pixels(out)) return 0;
+    const int32_t lightUps = lighten != 0 ? 2 : 1;
+    if (out->bitCount == 8 || out->bitCount == 24 || out->bitCount == 32) {
+        // Byte channels store every intermediate value exactly, so the
+        // brightening passes and the tone curve fold into one table.
+        uint8_t table[256];
+        for (int32_t i = 0; i < 256; ++i) {
+            uint8_t v = static_cast<uint8_t>(i);
+            for (int32_t k = 0; k < lightUps; ++k)
+                v = ZANTOMOPI[v];
+            table[i] = tone[v];
+        }
+        map_channels(out, table);
+        return 1;
+    }
+    for (int32_t k = 0; k < lightUps; ++k)
+        LightUP(out);
+    map_channels(out, tone);
+    return 1;
+}
+
+int32_t LightUP(Image *img) {
+    if (!has_pixels(img)) return 0;
+    map_channels(img, ZANTOMOPI);
+    return 1;
+}
+
+} // extern "C"

@@ -1,0 +1,88 @@
+// Blur of near-black values with a tone curve. A channel of a pixel becomes
+// black when any tap of its horizontal Gaussian window holds a value of at
+// most 10 (those taps carry weight but no value); otherwise it keeps its value
+// in the window's last tap. Each channel then goes through its own blend of
+// identity and the brightened filter curve.
+#include <pxfx/color.h>
+#include <pxfx/retouch.h>
+#include <pxfx/toolkit.h>
+
+#include "core/internal/image_check.hpp"
+#include "core/internal/math.hpp"
+#include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
+#include "core/internal/result.hpp"
+#include "retouch/retouch_common.hpp"
+
+using namespace pxfx;
+
+namespace {
+
+constexpr uint32_t kNearBlack = 10;
+
+struct Curves {
+    uint8_t b[256], g[256], r[256];
+};
+
+Curves make_curves(int32_t amount) {
+    Curves c;
+    const int32_t ar = amount * 73 / 100, ag = amount * 61 / 100, ab = amount * 75 / 100;
+    for (int32_t i = 0; i < 256; ++i) {
+        const int32_t t = ZANTOMOPI[ZANTOFILTER[i]];
+        c.r[i] = static_cast<uint8_t>((i * (100 - ar) + ar * t + 63) / 100);
+        c.g[i] = static_cast<uint8_t>((i * (100 - ag) + ag * t + 63) / 100);
+        c.b[i] = static_cast<uint8_t>((i * (100 - ab) + ab * t + 63) / 100);
+    }
+    return c;
+}
+
+// taps: offsets (from -size) of the non-zero kernel weights, in order.
+template <class FS, class FD>
+bool blur_rows(const Image *src, Image *out, int32_t size, const int32_t *taps, int32_t ntaps, const Curves &cv) {
+    const int32_t w = src->width;
+    const size_t padded = static_cast<size_t>(w) + 2 * static_cast<size_t>(size);
+    Buffer<uint32_t> colours = alloc_buffer<uint32_t>(padded);
+    Buffer<uint8_t> dark = alloc_buffer<uint8_t>(padded);
+    if (!colours || !dark) return false;
+    for (int32_t y = 0; y < src->height; ++y) {
+        const typename FS::CRow in = FS::crow(src, y);
+        for (size_t i = 0; i < padded; ++i) {
+            const int64_t x = static_cast<int64_t>(i) - size;
+            const uint32_t c = FS::load(in, static_cast<int32_t>(x < 0 ? 0 : (x >= w ? w - 1 : x)));
+            colours[i] = c;
+            dark[i] = static_cast<uint8_t>((blue_of(c) <= kNearBlack) | (green_of(c) <= kNearBlack) << 1 |
+                                           (red_of(c) <= kNearBlack) << 2);
+        }
+        const typename FD::Row o = FD::row(out, y);
+        for (int32_t x = 0; x < w; ++x) {
+            uint8_t any = 0;
+            for (int32_t k = 0; k < ntaps; ++k)
+                any |= dark[static_cast<size_t>(x) + taps[k]];
+            const uint32_t last = colours[static_cast<size_t>(x) + taps[ntaps - 1]];
+            const uint32_t b = any & 1 ? 0 : blue_of(last), g = any & 2 ? 0 : green_of(last),
+                           r = any & 4 ? 0 : red_of(last);
+            FD::store(o, x, pack(cv.b[b], cv.g[g], cv.r[r], alpha_of(last)));
+        }
+    }
+    return true;
+}
+
+} // namespace
+
+extern "C" {
+
+void thresholdBlur(int32_t, int32_t, int32_t size, int32_t amount, const Image *src, Image **dst) {
+    size = clamp_to(size, 1, 10);
+    amount = clamp_to(amount, 0, 100);
+    Image *out = acquire_result(src, dst);
+    if (out == nullptr) return;
+    int32_t taps[21], ntaps = 0;
+    for (int32_t k = 0; k <= 2 * size; ++k)
+        if (matrixX[size - 1][k] != 0.0f) taps[ntaps++] = k;
+    const Curves cv = make_curves(amount);
+    if (ntaps == 0) return;
+    with_formats(src, out,
+                 [&](auto fs, auto fd) { blur_rows<decltype(fs), decltype(fd)>(src, out, size, taps, ntaps, cv); });
+}
+
+} // extern "C"
