@@ -12,5 +12,6 @@ void add_effects(std::vector<Operation> &table);
 void add_deform(std::vector<Operation> &table);
 void add_toolkit(std::vector<Operation> &table);
 void add_lines(std::vector<Operation> &table);
+void add_retouch(std::vector<Operation> &table);
 
 } // namespace pxop

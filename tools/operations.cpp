@@ -15,6 +15,7 @@ std::vector<Operation> build_table() {
     add_color(t);
     add_deform(t);
     add_toolkit(t);
+    add_retouch(t);
     add_lines(t);
     // Keep each group together, groups in the order they first appear.
     std::vector<std::string_view> groups;
