@@ -6,6 +6,7 @@
 #include <benchmark/benchmark.h>
 
 #include <cstdint>
+#include <cstring>
 #include <random>
 
 namespace pxbench {
@@ -23,6 +24,33 @@ inline Image *make_picture(int32_t bitCount, int32_t w = kWidth, int32_t h = kHe
             row[i] = static_cast<uint8_t>((i / 3 + y / 2) + (rng() >> 29));
     }
     return im;
+}
+
+// The bundled sample portrait (tests/data/portrait-128.bmp) scaled bilinearly
+// to side x side at the given bit count; null when the file cannot be read.
+inline Image *load_portrait(int32_t side, int32_t bitCount) {
+    int32_t size = 0;
+    unsigned char *file = PX_ReadMemFile(PXFX_BENCH_DATA_DIR "/portrait-128.bmp", &size);
+    if (file == nullptr) return nullptr;
+    auto le32 = [&](int at) { return int32_t(file[at] | file[at + 1] << 8 | file[at + 2] << 16 | file[at + 3] << 24); };
+    const int32_t w = le32(18), h = le32(22), offset = le32(10);
+    PXImage packed = {w, h, 24, static_cast<uint8_t *>(PX_malloc(static_cast<size_t>(w) * h * 3))};
+    const size_t pitch = (static_cast<size_t>(w) * 3 + 3) & ~size_t{3};
+    for (int32_t y = 0; y < h && packed.data != nullptr; ++y)
+        std::memcpy(packed.data + static_cast<size_t>(y) * w * 3, file + offset + y * pitch,
+                    static_cast<size_t>(w) * 3);
+    PX_ReleaseMemFile(file);
+    PXImage *scaled = packed.data != nullptr ? PXImage_Resize(&packed, side, side) : nullptr;
+    PX_free(packed.data);
+    if (scaled == nullptr) return nullptr;
+    Image *colour = malloc_Image(side, side, 24), *out = malloc_Image(side, side, bitCount);
+    for (int32_t y = 0; y < side && colour != nullptr; ++y)
+        std::memcpy(colour->bits + static_cast<size_t>(y) * colour->pitch,
+                    scaled->data + static_cast<size_t>(y) * side * 3, static_cast<size_t>(side) * 3);
+    PXImage_Free(scaled);
+    if (colour != nullptr && out != nullptr) PX_Img_Copy(out, colour);
+    free_Image(&colour, 0);
+    return out;
 }
 
 // Reports megapixels per second for a picture of w x h per iteration.

@@ -1,31 +1,11 @@
-// Portrait tools on a synthetic 2000 x 2000 portrait: a skin-toned face
-// with noise on a cooler background, two dark eye blobs and a few specks.
+// Portrait tools on the sample portrait scaled to 2000 x 2000.
 #include "bench_support.hpp"
 
 namespace {
 
 constexpr int32_t kSide = 2000;
 
-Image *make_portrait(int32_t bitCount) {
-    Image *im = malloc_Image(kSide, kSide, bitCount);
-    std::mt19937 rng(7);
-    const int32_t cx = kSide / 2, cy = kSide / 2, rx = kSide * 2 / 5, ry = kSide / 2 - 40;
-    for (int32_t y = 0; y < kSide; ++y)
-        for (int32_t x = 0; x < kSide; ++x) {
-            const int64_t dx = x - cx, dy = y - cy;
-            const bool face = dx * dx * ry * ry + dy * dy * rx * rx <= int64_t(rx) * rx * ry * ry;
-            const uint32_t n = rng() >> 28;
-            uint32_t r = 60 + n, g = 90 + n, b = 120 + n;
-            if (face) r = 205 + n, g = 150 + n, b = 125 + n;
-            for (int32_t eye : {cx - kSide / 6, cx + kSide / 6}) {
-                const int64_t ex = x - eye, ey = y - (cy - kSide / 12);
-                if (ex * ex / 4 + ey * ey <= 40 * 40) r = g = b = 30 + n;
-            }
-            if (face && (rng() & 1023) == 0) r = 120, g = 80, b = 70;
-            SetPixelColor(im, x, y, 0xFF000000u | r << 16 | g << 8 | b);
-        }
-    return im;
-}
+Image *make_portrait(int32_t bitCount) { return pxbench::load_portrait(kSide, bitCount); }
 
 void BM_Skin(benchmark::State &state) {
     Image *src = make_portrait(static_cast<int32_t>(state.range(0)));
