@@ -13,7 +13,7 @@ namespace pxtest {
 struct Size {
     int32_t w, h;
 };
-inline constexpr Size kAwkwardSizes[] = {{1, 1}, {1, 7}, {7, 1}, {2, 3}, {5, 5}, {6, 4}, {13, 9}, {33, 17}};
+inline constexpr Size kAwkwardSizes[] = {{1, 1}, {1, 7}, {7, 1}, {2, 3}, {5, 5}, {6, 4}, {13, 9}, {33, 17}, {64, 48}};
 
 constexpr int chan(uint32_t c, int shift) { return static_cast<int>((c >> shift) & 255); }
 constexpr uint32_t rgba(int b, int g, int r, int a) {
@@ -54,14 +54,6 @@ template <class Effect> void expect_format_consistent(Effect effect, uint32_t se
             });
         },
         seed);
-}
-
-// Checks effect(pixel) on a 2 x 2 picture of one 32-bit colour.
-template <class Effect> void expect_pixel(Effect effect, uint32_t in, uint32_t out) {
-    Owned src = filled(2, 2, 32, in);
-    Slot dst;
-    ASSERT_EQ(effect(src.get(), &dst), 1u);
-    EXPECT_EQ(GetPixelColor(dst.get(), 1, 1), out) << std::hex << in;
 }
 
 } // namespace pxtest

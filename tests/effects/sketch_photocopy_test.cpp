@@ -88,16 +88,15 @@ Owned reference_photocopy(const Image *src) {
 TEST(SketchPhotocopy, MatchRecipesOnEveryFormat) {
     uint32_t seed = 1;
     for (int32_t bc : kBitCounts)
-        for (auto [w, h] : {Size{1, 1}, Size{1, 5}, Size{5, 1}, Size{2, 3}, Size{4, 4}, Size{5, 5}, Size{6, 9},
-                            Size{31, 17}, Size{64, 48}}) {
+        for (auto [w, h] : kAwkwardSizes) {
             // Smooth areas, a black block and noise, so that every branch is reached.
             Owned src = random_image(w, h, bc, ++seed);
             for (int32_t y = 0; y < h; ++y)
                 for (int32_t x = 0; x < w * 3 / 4; ++x)
                     SetPixelColor(src.get(), x, y, x < w / 2 ? ((x * 7 + y * 3) & 255) * 0x010101u | seed << 31 : 0);
             Slot a, b, c;
-            ASSERT_EQ(PX_IMG_Sketch(src.get(), &a) + PX_IMG_Sketch_1(src.get(), &b), 2u);
-            ASSERT_EQ(PX_IMG_Photocopy(src.get(), &c), 1u);
+            ASSERT_EQ(PX_ProcessImage(src.get(), &a, 3) + PX_IMG_Sketch_1(src.get(), &b), 2u);
+            ASSERT_EQ(PX_ProcessImage(src.get(), &c, 2), 1u);
             EXPECT_EQ(diff(a.get(), reference_sketch(src.get(), true).get()), "") << w << "x" << h << "@" << bc;
             EXPECT_EQ(diff(b.get(), reference_sketch(src.get(), false).get()), "") << w << "x" << h << "@" << bc;
             EXPECT_EQ(diff(c.get(), reference_photocopy(src.get()).get()), "") << w << "x" << h << "@" << bc;

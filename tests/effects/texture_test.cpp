@@ -68,8 +68,7 @@ TEST(Texture, OilMatchesWindowRescanAndCopiesTheBorder) {
     uint32_t seed = 900;
     for (int r : {0, 1, 2, 3})
         for (int32_t bc : kBitCounts)
-            for (auto [w, h] :
-                 {Size{1, 1}, Size{2, 3}, Size{5, 5}, Size{6, 5}, Size{5, 9}, Size{21, 6}, Size{33, 17}}) {
+            for (auto [w, h] : kAwkwardSizes) {
                 Owned src = random_image(w, h, bc, seed++);
                 Slot dst;
                 const bool fits = 2 * r < w && 2 * r < h;
@@ -84,24 +83,25 @@ TEST(Texture, OilMatchesWindowRescanAndCopiesTheBorder) {
     EXPECT_EQ(GetPixelColor(dst.get(), 2, 2), 0xFFFFFFFFu);                       // the result is prepared, not written
 }
 
-TEST(ColorCompress, GroupsMapToTheirMostFrequentMember) {
-    Owned plane = make(12, 1, 8);
-    const uint8_t values[12] = {0, 85, 85, 40, 86, 171, 171, 90, 172, 255, 200, 200};
-    std::copy(values, values + 12, plane->bits);
-    ASSERT_EQ(ColorCompress(plane.get(), 3), 1); // groups 0..85, 86..171, 172..255
-    EXPECT_EQ(std::vector<uint8_t>(plane->bits, plane->bits + 12),
-              (std::vector<uint8_t>{85, 85, 85, 85, 171, 171, 171, 171, 200, 200, 200, 200}));
-    // 12 levels: groups of 22, the last one 242..255; a tie keeps the first
-    // value; the padding bytes (255) are neither counted nor changed.
-    Owned two = make(2, 1, 8);
-    two->bits[0] = 250, two->bits[1] = 243;
-    ASSERT_EQ(ColorCompress(two.get(), 12), 1);
-    EXPECT_EQ(std::vector<uint8_t>(two->bits, two->bits + 4), (std::vector<uint8_t>{243, 243, 255, 255}));
+// 3 levels: groups 0..85, 86..171, 172..255; 12 levels: groups of 22, the last
+// one 242..255. A tie keeps the first value; padding bytes (255) are neither
+// counted nor changed.
+TEST(Texture, ColorCompressMapsGroupsToTheirMostFrequentMember) {
+    const std::vector<uint8_t> in[2] = {{0, 85, 85, 40, 86, 171, 171, 90, 172, 255, 200, 200}, {250, 243}};
+    const std::vector<uint8_t> out[2] = {{85, 85, 85, 85, 171, 171, 171, 171, 200, 200, 200, 200},
+                                         {243, 243, 255, 255}};
+    for (int i = 0; i < 2; ++i) {
+        Owned plane = make(int32_t(in[i].size()), 1, 8);
+        std::copy(in[i].begin(), in[i].end(), plane->bits);
+        ASSERT_EQ(ColorCompress(plane.get(), i == 0 ? 3 : 12), 1);
+        EXPECT_EQ(std::vector<uint8_t>(plane->bits, plane->bits + plane->pitch), out[i]);
+    }
+    Owned plane = make(2, 2, 8);
     EXPECT_EQ(ColorCompress(make(2, 2, 24).get(), 3) + ColorCompress(plane.get(), 0) + ColorCompress(plane.get(), -4),
               0);
 }
 
-TEST(Oil1, PosterisesIntoANewImage) {
+TEST(Texture, Oil1PosterisesIntoANewImage) {
     // Gray stays gray (hue and saturation 0) and its lightness moves to the
     // most frequent level of its group; 32-bit sources keep their alpha.
     Owned src = filled(3, 2, 32, rgba(100, 100, 100, 7));
