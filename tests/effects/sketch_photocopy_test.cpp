@@ -88,7 +88,7 @@ Owned reference_photocopy(const Image *src) {
 TEST(SketchPhotocopy, MatchRecipesOnEveryFormat) {
     uint32_t seed = 1;
     for (int32_t bc : kBitCounts)
-        for (auto [w, h] : kAwkwardSizes) {
+        for (const auto &[w, h] : kAwkwardSizes) {
             // Smooth areas, a black block and noise, so that every branch is reached.
             Owned src = random_image(w, h, bc, ++seed);
             for (int32_t y = 0; y < h; ++y)

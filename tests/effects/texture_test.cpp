@@ -68,7 +68,7 @@ TEST(Texture, OilMatchesWindowRescanAndCopiesTheBorder) {
     uint32_t seed = 900;
     for (int r : {0, 1, 2, 3})
         for (int32_t bc : kBitCounts)
-            for (auto [w, h] : kAwkwardSizes) {
+            for (const auto &[w, h] : kAwkwardSizes) {
                 Owned src = random_image(w, h, bc, seed++);
                 Slot dst;
                 const bool fits = 2 * r < w && 2 * r < h;
