@@ -9,14 +9,8 @@
 
 namespace {
 
-uint32_t rounded_root(uint32_t x) {
-    uint64_t e = static_cast<uint64_t>(std::sqrt(static_cast<double>(x)));
-    while (e * e > x)
-        --e;
-    while ((e + 1) * (e + 1) <= x)
-        ++e;
-    return static_cast<uint32_t>(x - e * e > e ? e + 1 : e);
-}
+// No integer lies within 1e-6 of a half-integer root, so double rounding is exact.
+uint32_t rounded_root(uint32_t x) { return static_cast<uint32_t>(std::lround(std::sqrt(static_cast<double>(x)))); }
 
 // tatan2 by its definition: nearest sine-table entry to |y| / r, by quadrant.
 int32_t reference_atan2(int32_t y, int32_t x) {
