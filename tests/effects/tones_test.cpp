@@ -1,25 +1,68 @@
-// Colour tones: hand-computed pixels for every formula (with the quirks of the
-// old-photograph tables), every format, and the result-image rule.
+// Colour tones, channel shift, channel scaling, contrast and the soft glow:
+// hand-computed pixels for the formulas (with the quirks of their tables),
+// references where a short one exists, every format, the result-image rule.
 #include <gtest/gtest.h>
+
+#include <cstring>
+#include <functional>
+#include <numeric>
+#include <vector>
 
 #include "effect_check.hpp"
 
 using namespace pxtest;
 
-using Effect = uint32_t (*)(Image *, Image **);
+namespace {
 
-TEST(Tones, HandComputedPixels) {
+// Curve of `mode` for shift d at index i, low 8 bits (|d| small enough here
+// that no sum leaves 32 bits).
+int curve(uint32_t mode, int d, int i) {
+    const uint8_t *t = mode == 1 || mode == 4 ? ZANTOFILTERBK : ZANTOFILTER;
+    if (mode == 0) return i;
+    if (mode == 3 || mode == 4) return t[i];
+    if (mode == 5) t = d > 0 ? ZANTOFILTER : ZANTOFILTERBK;
+    if (mode > 5) t = d < 0 ? ZANTOFILTER : ZANTOFILTERBK;
+    const int w = std::abs(d);
+    return ((127 - w) * i + w * t[i] + 63) / 127 & 255;
+}
+
+// The glow as the chain of whole images: blur, halve, raise contrast, then a
+// screen blend written pixel by pixel.
+Owned ref_lambency(const Image *src) {
+    const int32_t k[9] = {1, 2, 1, 2, 4, 2, 1, 2, 1};
+    Owned t1 = make(src->width, src->height, static_cast<int32_t>(src->bitCount));
+    Filter(const_cast<Image *>(src), k, 3, 16, 0, nullptr, t1.get(), 0);
+    Slot t2, t3;
+    PX_IMG_Light_Alter(t1.get(), &t2, 50, 4);
+    PX_IMG_Ballance(t2.get(), &t3, 5);
+    return per_pixel(src, [&](uint32_t a, int x, int y) {
+        const uint32_t b = GetPixelColor(t3.get(), x, y);
+        for (int s : {0, 8, 16}) {
+            const int v = std::min(chan(a, s) + chan(b, s) - ((chan(a, s) * chan(b, s)) >> 8), 255);
+            a = (a & ~(255u << s)) | uint32_t(v) << s;
+        }
+        return a;
+    });
+}
+
+} // namespace
+
+TEST(Tones, HandComputedPixelsInEveryFormat) {
+    using Run = std::function<uint32_t(Image *, Image **)>;
+    const auto light = [](uint32_t p, uint32_t ch) {
+        return Run([=](Image *s, Image **d) { return PX_IMG_Light_Alter(s, d, p, ch); });
+    };
+    const auto contrast = [](int32_t c) { return Run([=](Image *s, Image **d) { return PX_IMG_Ballance(s, d, c); }); };
+    const uint32_t in = rgba(10, 200, 30, 77);
     const struct {
-        Effect effect;
+        Run effect;
         uint32_t in, out;
     } cases[] = {
         {PX_IMG_Negative, rgba(0, 100, 255, 7), rgba(255, 155, 0, 7)},
         {PX_IMG_WARM_YELLOW, rgba(160, 100, 255, 9), rgba(150, 69, 255, 9)}, // green - (255 >> 3)
         {PX_IMG_WARM_YELLOW, rgba(0, 3, 80, 9), rgba(0, 0, 100, 9)},         // green floors at 0
-        {PX_IMG_COLD_PUPRLE, rgba(255, 255, 255, 9), rgba(255, 255, 192, 9)},
         {PX_IMG_COLD_PUPRLE, rgba(100, 50, 200, 9), rgba(125, 59, 150, 9)},
         {PX_IMG_Repristination, rgba(0, 0, 0, 9), rgba(20, 0, 0, 9)},
-        {PX_IMG_Repristination, rgba(255, 255, 255, 9), rgba(255, 255, 235, 9)},
         {PX_IMG_Repristination, rgba(10, 20, 31, 9), rgba(40, 20, 0, 9)},
         // Old photograph: red sums clamp, green and blue wrap; tables are not monotone.
         {PX_IMG_Classical_Photograph, rgba(1, 1, 1, 9), rgba(0, 0, 255, 9)},
@@ -29,34 +72,77 @@ TEST(Tones, HandComputedPixels) {
         {PX_IMG_Classical_Photograph, rgba(255, 255, 255, 9), rgba(253, 253, 255, 9)},
         {PX_IMG_Classical_Photograph, rgba(102, 139, 10, 9), rgba(118, 132, 255, 9)},
         {PX_IMG_Classical_Photograph, rgba(101, 138, 200, 9), rgba(118, 132, 232, 9)},
+        {light(50, 0), in, rgba(10, 200, 15, 77)},
+        {light(200, 1), in, rgba(10, 255, 30, 77)},
+        {light(37, 2), in, rgba(3, 200, 30, 77)},
+        {light(150, 7), in, rgba(15, 255, 45, 77)},
+        {light(100, 2), in, in},
+        {light(0xFFFFFFFFu, 1), in, rgba(10, 255, 30, 77)}, // no wrap
+        {contrast(5), rgba(0, 255, 128, 1), rgba(0, 255, 128, 1)},
+        {contrast(5), rgba(188, 100, 228, 1), rgba(190, 98, 232, 1)}, // 60 * 1.05f = 62.9999962, + 128.0 in double
+        {contrast(-100), rgba(3, 200, 255, 1), rgba(128, 128, 128, 1)},
+        {contrast(INT32_MAX), rgba(0, 128, 255, 1), rgba(0, 128, 255, 1)}, // contrast + 100 does not overflow
+        {contrast(INT32_MIN), rgba(0, 128, 255, 1), rgba(255, 128, 0, 1)},
     };
-    for (const auto &c : cases)
-        expect_pixel(c.effect, c.in, c.out);
-    for (Effect effect :
-         {PX_IMG_Negative, PX_IMG_WARM_YELLOW, PX_IMG_COLD_PUPRLE, PX_IMG_Repristination, PX_IMG_Classical_Photograph})
-        expect_format_consistent(effect, 1);
+    for (const auto &c : cases) {
+        Owned one = filled(2, 2, 32, c.in);
+        Slot dst;
+        ASSERT_EQ(c.effect(one.get(), &dst), 1u);
+        EXPECT_EQ(GetPixelColor(dst.get(), 1, 1), c.out) << std::hex << c.in;
+        expect_format_consistent(c.effect, c.out);
+    }
 }
 
 TEST(Tones, LineDarkensAllButEveryThirdRow) {
+    const auto line = [](uint32_t c, int, int y) {
+        const auto dark = [&](int sh) { return std::max(chan(c, sh) - 128, 0); };
+        return y % 3 == 2 ? c : rgba(dark(0), dark(8), dark(16), chan(c, 24));
+    };
     expect_like_reference(
-        PX_IMG_Line,
-        [](const Image *s) {
-            return per_pixel(s, [](uint32_t c, int, int y) {
-                const auto dark = [&](int sh) { return std::max(chan(c, sh) - 128, 0); };
-                return y % 3 == 2 ? c : rgba(dark(0), dark(8), dark(16), chan(c, 24));
-            });
-        },
-        100);
+        PX_IMG_Line, [&](const Image *s) { return per_pixel(s, line); }, 100);
 }
 
-TEST(Tones, ResultRuleAndRefusals) {
-    Owned src = random_image(5, 4, 32, 3);
+TEST(Alter, EveryModeMatchesPerPixelCurvesAndExtremeShiftsWrap) {
+    const int shifts[][3] = {{0, 0, 0}, {127, -127, 40}, {-5, 90, -60}, {200, -300, 128}};
+    uint32_t seed = 1;
+    for (uint32_t mode : {0u, 1u, 2u, 3u, 4u, 5u, 6u, 100u, 0xFFFFFFFFu})
+        for (auto [dR, dG, dB] : shifts) {
+            const auto at = [&](int d, uint32_t c, int sh) { return curve(mode, d, ltouc(chan(c, sh) + d)); };
+            const auto ref = [&](const Image *s) {
+                return per_pixel(s, [&](uint32_t c, int, int) {
+                    return rgba(at(dB, c, 0), at(dG, c, 8), at(dR, c, 16), chan(c, 24));
+                });
+            };
+            expect_like_reference([&](Image *s, Image **d) { return PX_IMG_Alter(s, d, dR, dG, dB, mode); }, ref,
+                                  seed += 50);
+        }
+    Owned px = filled(2, 1, 24, rgba(10, 20, 30, 255));
+    SetPixelColor(px.get(), 1, 0, rgba(0, 0, 0, 255));
     Slot dst;
-    Image *kept = dst.image = malloc_Image(5, 4, 32);
-    for (Effect effect : {PX_IMG_Negative, PX_IMG_WARM_YELLOW, PX_IMG_COLD_PUPRLE, PX_IMG_Classical_Photograph,
-                          PX_IMG_Repristination, PX_IMG_Line, my}) {
-        EXPECT_NE(effect(src.get(), &dst), 0u);
-        EXPECT_EQ(effect(nullptr, &dst) + effect(src.get(), nullptr), 0u);
-    }
-    EXPECT_EQ(dst.get(), kept);
+    // Sums wrap as 32-bit sums: 0 + INT_MAX clamps to 255, 10 + INT_MAX wraps negative to 0.
+    ASSERT_EQ(PX_IMG_Alter(px.get(), &dst, INT32_MAX, INT32_MAX, INT32_MAX, 0), 1u);
+    EXPECT_EQ(GetPixelColor(dst.get(), 0, 0), rgba(0, 0, 0, 255));
+    EXPECT_EQ(GetPixelColor(dst.get(), 1, 0), rgba(255, 255, 255, 255));
+    for (uint32_t mode = 0; mode < 7; ++mode)
+        EXPECT_EQ(PX_IMG_Alter(px.get(), &dst, INT32_MIN, INT32_MAX, INT32_MIN + 1, mode), 1u);
+}
+
+TEST(LightAndContrast, BlockCopiesAndClears) {
+    Owned src = random_image(5, 3, 24, 8);
+    Slot dst;
+    ASSERT_EQ(PX_IMG_Ballance(src.get(), &dst, 0), 1u); // block bytes, padding included
+    EXPECT_EQ(std::memcmp(dst->bits, src->bits, src->pitch * 3), 0);
+    ASSERT_EQ(PX_IMG_Light_Alter(src.get(), &dst, 0, 1), 1u); // every byte cleared
+    EXPECT_EQ(std::vector<uint8_t>(dst->bits, dst->bits + dst->pitch * 3), std::vector<uint8_t>(dst->pitch * 3));
+}
+
+TEST(Lambency, MatchesTheImageChain) {
+    expect_like_reference(PX_IMG_Lambency, ref_lambency, 1);
+    // A hand-made 4-bit record: the working image and a new result are 8-bit.
+    std::vector<uint8_t> nibbles(4 * 5);
+    std::iota(nibbles.begin(), nibbles.end(), uint8_t(0x3A));
+    Image packed{7, 5, 4, nibbles.data(), 4, 0};
+    Slot dst;
+    ASSERT_EQ(PX_IMG_Lambency(&packed, &dst), 1u);
+    EXPECT_EQ(diff(dst.get(), ref_lambency(&packed).get()), "");
 }
