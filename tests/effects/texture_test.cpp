@@ -73,7 +73,9 @@ TEST(Texture, OilMatchesWindowRescanAndCopiesTheBorder) {
                 Slot dst;
                 const bool fits = 2 * r < w && 2 * r < h;
                 ASSERT_EQ(imOil(src.get(), &dst, r), fits ? 1u : 0u);
-                if (fits) EXPECT_EQ(diff(dst.get(), ref_oil(src.get(), r).get()), "") << w << "x" << h << "@" << bc;
+                if (fits) {
+                    EXPECT_EQ(diff(dst.get(), ref_oil(src.get(), r).get()), "") << w << "x" << h << "@" << bc;
+                }
             }
     Owned src = random_image(6, 9, 24, 4);
     Slot dst;
