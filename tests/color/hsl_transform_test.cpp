@@ -25,19 +25,16 @@ Owned plane_route(const Image *src, const Image *existing, int amount, int compo
 } // namespace
 
 TEST(BaseTran, HueWrapsBy255AndLevelsClamp) {
-    struct Case {
-        int32_t (*fn)(Image *, int32_t);
-        int value, amount, want;
-    };
-    const Case cases[] = {
-        {BaseTran_Hue, 10, 200, 10},        {BaseTran_Hue, 254, 0, 254}, {BaseTran_Hue, 3, 99, 1},
-        {BaseTran_Hue, 7, 1000, 255},       {BaseTran_Hue, 0, 0, 0},     {BaseTran_LS, 100, INT32_MIN, 0},
-        {BaseTran_LS, 100, INT32_MAX, 255}, {BaseTran_LS, 100, 150, 227}};
-    for (const Case &c : cases) { // 265 - 255; -1 + 255; step -255 / 100 = -2; low byte of 2302 + 1; ...
+    // {hue (1) or level (0), value, amount, result}: 265 - 255; -1 + 255; step
+    // -255 / 100 = -2; the low byte of 2302 + 1; ...
+    const int cases[][4] = {{1, 10, 200, 10},         {1, 254, 0, 254},  {1, 3, 99, 1},
+                            {1, 7, 1000, 255},        {1, 0, 0, 0},      {0, 100, INT32_MIN, 0},
+                            {0, 100, INT32_MAX, 255}, {0, 100, 150, 227}};
+    for (auto [hue, value, amount, want] : cases) {
         Owned p = make(2, 1, 8);
-        p->bits[0] = uint8_t(c.value);
-        ASSERT_EQ(c.fn(p.get(), c.amount), 1);
-        EXPECT_EQ(p->bits[0], c.want) << c.value << " " << c.amount;
+        p->bits[0] = uint8_t(value);
+        ASSERT_EQ((hue ? BaseTran_Hue : BaseTran_LS)(p.get(), amount), 1);
+        EXPECT_EQ(p->bits[0], want) << value << " " << amount;
         EXPECT_EQ(p->bits[2], 255); // only the first width bytes of a row
     }
     Owned rgb = random_image(3, 2, 24, 2), before = clone(rgb.get());

@@ -13,13 +13,6 @@ using namespace pxtest;
 
 namespace {
 
-std::vector<int> drops(const uint8_t *t) {
-    std::vector<int> at;
-    for (int i = 1; i < 256; ++i)
-        if (t[i] < t[i - 1]) at.push_back(i);
-    return at;
-}
-
 // The level map an 8-bit filter applies, read off a picture of every level.
 std::vector<int> map_of(const std::function<int32_t(Image *)> &fn) {
     Owned ramp = make(16, 16, 8);
@@ -31,28 +24,22 @@ std::vector<int> map_of(const std::function<int32_t(Image *)> &fn) {
 
 } // namespace
 
-TEST(CurveTables, ValuesAndNonMonotoneSpots) {
+TEST(CurveTables, WeightedSums) {
     const std::pair<const uint8_t *, int64_t> tables[] = {
         {ZANTOMOPI, 6047599}, {ZANTOFILTERBK, 4145935}, {ZANTOFILTER, 6930454}};
     for (auto [t, want] : tables) {
-        int64_t sum = 0; // weighted, so that a moved entry shows
+        int64_t sum = 0; // weighted, so that a moved or changed entry shows
         for (int i = 0; i < 256; ++i)
             sum += int64_t(i + 1) * t[i];
         EXPECT_EQ(sum, want);
     }
-    EXPECT_TRUE(drops(ZANTOMOPI).empty());
-    EXPECT_EQ(drops(ZANTOFILTERBK), (std::vector<int>{35, 253, 254, 255}));
-    EXPECT_EQ(drops(ZANTOFILTER), (std::vector<int>{248, 249, 250, 254, 255}));
-    EXPECT_EQ(ZANTOFILTERBK[255] + ZANTOFILTER[253] + ZANTOMOPI[65], 228 + 255 + 87);
 }
 
 TEST(ColorFilter, LevelMaps) {
     // colour (R in bits 0-7) -> shift; luminance 127 and 128 change nothing
     const std::pair<uint32_t, int> shifts[] = {{0x000000, -44}, {0xFFFFFF, 47}, {0x0000FF, -17}, {0x00FF00, 8},
                                                {0xFF0000, -33}, {0x7F7F7F, 0},  {0x808080, 0}};
-    for (const auto &shift : shifts) {
-        const uint32_t colour = shift.first;
-        const int delta = shift.second;
+    for (auto [colour, delta] : shifts) {
         std::vector<int> want(256);
         for (int v = 0; v < 256; ++v)
             want[v] = std::min(255, std::max(0, v + delta));
