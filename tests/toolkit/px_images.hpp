@@ -61,12 +61,8 @@ inline int32_t neighbour(const PXImage *im, int32_t y, int32_t x, int32_t dy, in
 
 inline void put_sample(PXImage *im, int32_t y, int32_t x, int32_t c, int32_t v) {
     const size_t p = size_t(y) * im->width + x;
-    if (im->bitcount == 16) {
-        im->data[2 * p] = uint8_t(v);
-        im->data[2 * p + 1] = uint8_t(v >> 8);
-    } else {
-        im->data[p * (im->bitcount / 8) + c] = uint8_t(v);
-    }
+    if (im->bitcount == 16) im->data[2 * p + 1] = uint8_t(v >> 8);
+    im->data[im->bitcount == 16 ? 2 * p : p * (im->bitcount / 8) + c] = uint8_t(v);
 }
 
 } // namespace pxtest
