@@ -1,5 +1,6 @@
-// Kernel convolution against a straightforward accessor version on random
-// pictures of every format, the fixed-kernel effects and the matrixX table.
+// Kernel convolution and box smoothing against a straightforward accessor
+// version on random pictures of every format, the fixed-kernel effects and
+// the matrixX table.
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -7,6 +8,8 @@
 #include <cmath>
 #include <random>
 #include <vector>
+
+#include "color/box_filter.hpp"
 
 #include "support/test_images.hpp"
 
@@ -25,8 +28,9 @@ uint32_t finish(uint32_t sum, int32_t divisor, int32_t offset) {
 }
 
 // Filter into d, pixel by pixel with the accessors (32-bit wrapping sums);
-// 8-bit pictures as one channel with a mask, colour ones with the grey mix.
-void reference_filter(const Image *src, const Params &p, const Image *mask, Image *d) {
+// 8-bit pictures as one channel with a mask, colour ones with the grey mix;
+// box smoothing filters the alpha byte too.
+void reference_filter(const Image *src, const Params &p, const Image *mask, Image *d, bool box = false) {
     int32_t w = d->width, h = d->height;
     if (mask && mask->bitCount == 8) w = std::min(w, mask->width), h = std::min(h, mask->height);
     const int32_t half = p.size / 2, last = p.size - half - 1;
@@ -37,18 +41,18 @@ void reference_filter(const Image *src, const Params &p, const Image *mask, Imag
                 SetPixelIndex(d, x, y, GetPixelIndex(src, x, y));
                 continue;
             }
-            uint32_t s[3] = {0, 0, 0}, c = GetPixelColor(d, x, y); // no taps: alpha kept
+            uint32_t s[4] = {0, 0, 0, 0}, c = GetPixelColor(d, x, y); // no taps: alpha kept
             for (int dy = -half; dy <= last; ++dy)
                 for (int dx = -half; dx <= last; ++dx) {
                     c = gray ? GetPixelIndex(src, x + dx, y + dy) : GetPixelColor(src, x + dx, y + dy);
-                    for (int i = 0; i < 3; ++i)
+                    for (int i = 0; i < 3 + box; ++i)
                         s[i] += uint32_t(p.kernel[size_t((dy + half) * p.size + dx + half)]) * ((c >> (8 * i)) & 255);
                 }
             for (uint32_t &v : s)
                 v = finish(v, gray && p.divisor == 0 ? 1 : p.divisor, p.offset);
             if (gray) SetPixelIndex(d, x, y, int32_t(s[0]));
             if (!gray && p.gray >= 1) s[0] = s[1] = s[2] = (s[0] + 2 * s[1] + s[2]) >> 2;
-            if (!gray) SetPixelColor(d, x, y, s[0] | s[1] << 8 | s[2] << 16 | (c & 0xFF000000u));
+            if (!gray) SetPixelColor(d, x, y, s[0] | s[1] << 8 | s[2] << 16 | (box ? s[3] << 24 : c & 0xFF000000u));
         }
 }
 
@@ -64,6 +68,15 @@ Params random_params(std::mt19937 &rng, int32_t size) {
 
 int32_t run(Image *src, const Params &p, const Image *mask, Image *dst) {
     return Filter(src, p.kernel.empty() ? nullptr : p.kernel.data(), p.size, p.divisor, p.offset, mask, dst, p.gray);
+}
+
+// In place: the filtered working image is copied over the picture.
+Owned reference_box(const Image *src, int32_t size, int32_t offset) {
+    Owned work = make(src->width, src->height, int32_t(src->bitCount)), out = clone(src);
+    reference_filter(src, {std::vector<int32_t>(size_t(size) * size, 1), size, size * size, offset, 0}, nullptr,
+                     work.get(), true);
+    PX_Img_Copy(out.get(), work.get());
+    return out;
 }
 
 } // namespace
@@ -143,4 +156,50 @@ TEST(MatrixX, NormalisedGaussiansRoundedToFloat) {
             EXPECT_EQ(matrixX[r - 1][j], j > 2 * r ? 0.0f : float(std::exp(-((j - r) * (j - r)) / twoSigma2) / total))
                 << r << " " << j;
     }
+}
+
+TEST(FilterFast, MatchesFullBoxSumsAndRefusesBadSizes) {
+    const int32_t sizes[][2] = {{1, 1}, {1, 7}, {7, 1}, {2, 2}, {5, 4}, {11, 13}};
+    uint32_t seed = 1;
+    for (int32_t bc : kBitCounts)
+        for (auto [w, h] : sizes)
+            for (int32_t size : {1, 2, 3, 4, 5, 8, 15}) {
+                const int32_t offset = int32_t(seed % 3) * 25 - 25;
+                Owned img = random_image(w, h, bc, seed++);
+                Owned want = reference_box(img.get(), size, offset);
+                ASSERT_EQ(Filter_fast(img.get(), size, offset), 1);
+                ASSERT_EQ(diff(img.get(), want.get()), "") << bc << " " << w << "x" << h << " size " << size;
+            }
+    // Large sizes (64-bit sums above 2901): the running sums against full sums.
+    for (int32_t bc : {8, 24, 32})
+        for (int32_t size : {31, 2901, 2902, 100000}) {
+            Owned a = random_image(9, 7, bc, seed++), b = clone(a.get());
+            ASSERT_EQ(pxfx::box_filter(a.get(), size, 3, true) + pxfx::box_filter(b.get(), size, 3, false), 2);
+            EXPECT_EQ(diff(a.get(), b.get()), "") << bc << " size " << size;
+        }
+    Owned ramp = make(2, 1, 8);
+    ramp->bits[0] = 0;
+    ramp->bits[1] = 200;
+    ASSERT_EQ(Filter_fast(ramp.get(), 4000, 0), 1); // columns -2000..1999: 1999 read 200
+    EXPECT_EQ(ramp->bits[0], 200 * 1999 / 4000);
+    Owned img = random_image(6, 5, 24, 3), before = clone(img.get());
+    for (int32_t size : {0, -3, INT32_MIN, pxfx::kMaxBoxSize + 1})
+        EXPECT_EQ(Filter_fast(img.get(), size, 0) + Filter_fast(nullptr, 3, 0), 0);
+    EXPECT_EQ(diff(img.get(), before.get()), "");
+}
+
+TEST(Smooth, StrengthSlotsAndInPlace) {
+    Owned src = random_image(9, 8, 32, 5);
+    Slot out, gray;
+    ASSERT_EQ(PX_IMG_Smooth(src.get(), &out, 5), 1); // size 0: a plain copy
+    EXPECT_EQ(diff(out.get(), src.get()), "");
+    Image *kept = gray.image = malloc_Image(3, 3, 8); // an existing result is used as it stands
+    ASSERT_EQ(PX_IMG_Smooth(src.get(), &gray, 30), 1);
+    EXPECT_EQ(gray.get(), kept);
+    Owned want = reference_box(src.get(), 10, 0);
+    ASSERT_EQ(PX_IMG_Smooth(src.get(), nullptr, 150), 1); // in place
+    EXPECT_EQ(diff(src.get(), want.get()), "");
+    Image hollow = *src, *hp = &hollow;
+    hollow.bits = nullptr;
+    EXPECT_EQ(PX_IMG_Smooth(&hollow, &out, 50) + PX_IMG_Smooth(src.get(), &hp, 50), 0);
 }
