@@ -71,8 +71,8 @@ TEST(MyResample2, InterpolatesRowsWithRounding) {
         ASSERT_EQ(got->height, 3 * f + 1);
         for (int32_t y = 0; y < got->height; ++y)
             for (int32_t x = 0; x < 17; ++x) {
-                const int32_t a = GetPixelIndex(src.get(), x, y / f), b = GetPixelIndex(src.get(), x, y / f + 1);
-                const int32_t k = y % f;
+                const int32_t a = GetPixelIndex(src.get(), x, y / f), b = GetPixelIndex(src.get(), x, y / f + 1),
+                              k = y % f;
                 ASSERT_EQ(GetPixelIndex(got.get(), x, y), (a * (f - k) + b * k + (f + 1) / 2) / f) << f << "," << y;
             }
     }
