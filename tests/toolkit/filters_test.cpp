@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
 #include <cmath>
 
 #include "toolkit/px_images.hpp"
@@ -63,11 +64,7 @@ TEST(Filters, SharpenSmoothAndEdgesMatchBruteForceWindows) {
                                           : brute(src.get(), size, size == 7 ? 49 : 0, [&](const std::vector<int> &w) {
                                                 return limit(src.get(), weighted(w, k) >> (strength == -3 ? 2 : 0));
                                             });
-                const int smoothSize = strength < 20   ? 3
-                                       : strength < 40 ? 5
-                                       : strength < 60 ? 7
-                                       : strength < 80 ? 5
-                                                       : 7;
+                const int smoothSize = std::array{3, 5, 7, 5, 7}[std::clamp(strength, 0, 80) / 20]; // mean, then median
                 PX smooth = brute(src.get(), smoothSize, 0, [&](std::vector<int> w) {
                     if (strength < 60) return weighted(w, std::vector<int>(w.size(), 1)) / int(w.size());
                     std::sort(w.begin(), w.end());
@@ -106,24 +103,20 @@ TEST(Sort, PartitionExchangeOnAdversarialInputs) {
 }
 
 TEST(Binarize, OtsuThresholdPerFormat) {
-    PX twoLevel = px_random(8, 8, 8, 3);
-    for (size_t i = 0; i < 64; ++i)
-        twoLevel->data[i] = twoLevel->data[i] & 1 ? 255 : 0;
-    PX before = px_clone(twoLevel.get()), rgba = px_random(3, 3, 32, 1);
-    ASSERT_EQ(PXImage_GrayToBinarization(twoLevel.get()), 1);
-    EXPECT_EQ(bytes(twoLevel.get()), bytes(before.get()));
-    EXPECT_EQ(PXImage_GrayToBinarization(rgba.get()), 0);
-
-    // Gray levels 40 and 200 among unrelated bits (T = 40): the 16-bit middle field, 24-bit byte 1.
-    PX words = px_random(4, 4, 16, 7), rgb = px_random(4, 4, 24, 7);
+    // Gray levels 40 and 200 (T = 40): 8-bit samples, and among unrelated bits the
+    // 16-bit middle field and 24-bit byte 1.
+    PX gray = px_make(4, 4, 8), words = px_random(4, 4, 16, 7), rgb = px_random(4, 4, 24, 7);
+    PX rgba = px_random(3, 3, 32, 1);
     for (int i = 0; i < 16; ++i) {
         const int g = i % 2 ? 200 : 40, s = words->data[2 * i] | words->data[2 * i + 1] << 8;
         put_sample(words.get(), i / 4, i % 4, 0, (s & 0xF81F) | (g >> 2) << 5);
-        rgb->data[3 * i + 1] = uint8_t(g);
+        gray->data[i] = rgb->data[3 * i + 1] = uint8_t(g);
     }
-    ASSERT_EQ(PXImage_GrayToBinarization(words.get()) + PXImage_GrayToBinarization(rgb.get()), 2);
+    ASSERT_EQ(PXImage_GrayToBinarization(words.get()) + PXImage_GrayToBinarization(rgb.get()) +
+                  PXImage_GrayToBinarization(gray.get()) + PXImage_GrayToBinarization(rgba.get()),
+              3);
     for (int i = 0; i < 16; ++i) {
-        EXPECT_EQ(neighbour(words.get(), i / 4, i % 4, 0, 0, 0), i % 2 ? 65535 : 0);
+        EXPECT_EQ(neighbour(words.get(), i / 4, i % 4, 0, 0, 0) + gray->data[i], i % 2 ? 65535 + 255 : 0);
         for (int c = 0; c < 3; ++c)
             EXPECT_EQ(rgb->data[3 * i + c], i % 2 ? 255 : 0);
     }
@@ -168,7 +161,6 @@ TEST(Paint, TwoToneFromTheStretchedGreenPlane) {
     for (size_t i = 0; i < 64; ++i)
         plane[i] = uint8_t(i < 32 ? 20 + i % 4 * 10 : 200 + i % 5);
     auto grey = plane, blue = plane;
-    ASSERT_EQ(ProbabilityDensityValue(plane.data(), 8, 8), 50);
     ASSERT_EQ(EffectPaint_GrayRowData(grey.data(), 8, 8) + EffectPaint_BlueRowData(blue.data(), 8, 8), 2);
     for (size_t i = 0; i < 64; ++i) {
         const int v = plane[i];
