@@ -61,8 +61,7 @@ TEST(Crop, RoundsWidthUpAndRunsIntoFollowingRows) {
     PX src = px_random(20, 6, 8, 5);
     PXRect r{6, 5, 14, 1}; // nine columns, rows 1..5, copies run past the row end
     PX out(PXImage_Crop(src.get(), &r));
-    ASSERT_TRUE(out);
-    EXPECT_EQ(out->width * 100 + out->height, 1605);
+    ASSERT_TRUE(out && out->width == 16 && out->height == 5);
     for (int k = 0; k < 5; ++k)
         for (int j = 0; j < 16; ++j) {
             const size_t from = size_t(1 + k) * 20 + 6 + j;
@@ -81,8 +80,7 @@ TEST(Rotate, QuarterTurnsMapPixelsAndClearPadding) {
         const int w = 10, h = 5, bpp = bits / 8;
         PX src = px_random(w, h, bits, 11);
         PX r90(PXImage_Rotate90(src.get())), r270(PXImage_Rotate270(src.get())), r180(PXImage_Rotate180(src.get()));
-        ASSERT_TRUE(r90 && r270 && r180);
-        EXPECT_EQ(r90->width * 100 + r90->height, 810);
+        ASSERT_TRUE(r90 && r270 && r180 && r90->width == 8 && r90->height == 10);
         for (int b = 0; b < bpp; ++b)
             for (int i = 0; i < w; ++i)
                 for (int j = 0; j < w; ++j) {
@@ -101,8 +99,7 @@ TEST(Zoom, InAveragesWithRoundingOutDecimatesAndHoldsTheLastColumn) {
         const int w = 5, h = 4, ch = bits == 24 ? 3 : 1;
         PX src = px_random(w, h, bits, 21);
         PX out(PXImage_ZoomIn(src.get()));
-        ASSERT_TRUE(out);
-        ASSERT_EQ(out->width, 2 * w);
+        ASSERT_TRUE(out && out->width == 2 * w);
         for (int y = 0; y < 2 * h; ++y)
             for (int x = 0; x < 2 * w; ++x)
                 for (int c = 0; c < ch; ++c) {
@@ -115,8 +112,7 @@ TEST(Zoom, InAveragesWithRoundingOutDecimatesAndHoldsTheLastColumn) {
     }
     PX src = px_random(5, 5, 24, 4), thin = px_random(1, 9, 8, 4);
     PX out(PXImage_ZoomOut(src.get()));
-    ASSERT_TRUE(out);
-    EXPECT_EQ(out->width * 100 + out->height, 802);
+    ASSERT_TRUE(out && out->width == 8 && out->height == 2);
     for (int y = 0; y < 2; ++y)
         for (int x = 0; x < 8; ++x)
             EXPECT_EQ(0, std::memcmp(out->data + (y * 8 + x) * 3, src->data + (2 * y * 5 + std::min(2 * x, 4)) * 3, 3));
