@@ -27,8 +27,8 @@ Owned plane_route(const Image *src, const Image *existing, int amount, int compo
 }
 
 using Conv = uint32_t (*)(uint32_t);
-const Conv kForward[] = {nullptr, RGBtoHSL, RGBtoYUV, RGBtoYIQ, RGBtoXYZ};
-const Conv kBackward[] = {nullptr, HSLtoRGB, YUVtoRGB, YIQtoRGB, XYZtoRGB};
+const Conv kConv[][2] = {
+    {nullptr, nullptr}, {RGBtoHSL, HSLtoRGB}, {RGBtoYUV, YUVtoRGB}, {RGBtoYIQ, YIQtoRGB}, {RGBtoXYZ, XYZtoRGB}};
 
 // Every third level of each byte, alpha varying: the grid of the model.
 uint32_t grid_hash(Conv fn) {
@@ -46,7 +46,7 @@ void reference_split(const Image *src, int mode, Owned planes[4]) {
     for (int y = 0; y < src->height; ++y)
         for (int x = 0; x < src->width; ++x) {
             uint32_t c = GetPixelColor(src, x, y);
-            if (mode >= 1 && mode <= 4) c = kForward[mode](c);
+            if (mode >= 1 && mode <= 4) c = kConv[mode][0](c);
             for (int i = 0; i < 4; ++i) // bytes 2, 1, 0, 3
                 SetPixelIndex(planes[i].get(), x, y, int32_t((c >> (i == 3 ? 24 : 16 - 8 * i)) & 255));
         }
@@ -58,7 +58,7 @@ Owned reference_combine(const Image *p1, const Image *p2, const Image *p3, const
         for (int x = 0; x < p1->width; ++x) {
             uint32_t c = GetPixelIndex(p3, x, y) | GetPixelIndex(p2, x, y) << 8 | GetPixelIndex(p1, x, y) << 16 |
                          (pa ? uint32_t(GetPixelIndex(pa, x, y)) << 24 : 0u);
-            SetPixelColor(out.get(), x, y, mode >= 1 && mode <= 4 ? kBackward[mode](c) : c);
+            SetPixelColor(out.get(), x, y, mode >= 1 && mode <= 4 ? kConv[mode][1](c) : c);
         }
     return out;
 }
@@ -137,10 +137,10 @@ TEST(Transform, EqualsThePlaneRoute) {
     for (int32_t bc : kBitCounts)
         for (int component : {0, 1, 2, 5})
             for (int amount : {0, 37, 100, 163, 200}) {
-                Owned src = random_image(7, 5, bc, seed++), want;
                 // At 163 an existing image of another size and format is kept and filled.
-                Owned other = amount == 163 ? random_image(5, 6, bc == 24 ? 32 : 24, seed) : nullptr;
-                want = plane_route(src.get(), other.get(), amount, component);
+                Owned src = random_image(7, 5, bc, seed++),
+                      other = amount == 163 ? random_image(5, 6, bc == 24 ? 32 : 24, seed) : nullptr,
+                      want = plane_route(src.get(), other.get(), amount, component);
                 Slot out;
                 Image *kept = out.image = other.release();
                 ASSERT_EQ(PX_IMG_Transform(src.get(), &out, amount, component), 1);
