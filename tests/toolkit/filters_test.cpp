@@ -122,7 +122,7 @@ TEST(Binarize, OtsuThresholdPerFormat) {
 TEST(Clip, PhotoShowsThroughDarkHolesInsideTheWindow) {
     PX frame = px_random(720, 566, 24, 4);
     for (size_t i = 2; i < px_size(frame.get()); i += 3)
-        if (frame->data[i] < 40) frame->data[i] = uint8_t(frame->data[i] % 7); // some holes
+        if (frame->data[i] < 40) frame->data[i] = uint8_t(frame->data[i] % 8); // some holes, and level 7
     for (int bits : {8, 24}) {
         PX photo = px_random(700, 300, bits, 6); // shorter than the window
         PX out(PXImage_Effect_Clip(photo.get(), frame.get()));
