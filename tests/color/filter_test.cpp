@@ -54,12 +54,10 @@ void reference_filter(const Image *src, const Params &p, const Image *mask, Imag
 }
 
 Params random_params(std::mt19937 &rng, int32_t size) {
-    const int32_t divisors[] = {0, 1, 9, -3};
+    const int32_t divisors[] = {0, 1, 9, -3}, huge[] = {INT32_MIN, INT32_MAX, 0x40000000}; // huge: sums wrap
     Params p{{}, size, divisors[rng() % 4], int32_t(rng() % 60) - 20, int32_t(rng() % 3) - 1};
     for (int32_t i = 0; i < size * size; ++i)
-        p.kernel.push_back(rng() % 3 == 0    ? 0
-                           : rng() % 30 == 0 ? INT32_MIN + int32_t(rng() % 3) * 0x60000000 // sums wrap
-                                             : int32_t(rng() % 21) - 8);
+        p.kernel.push_back(rng() % 3 == 0 ? 0 : rng() % 30 == 0 ? huge[rng() % 3] : int32_t(rng() % 21) - 8);
     return p;
 }
 
