@@ -1,7 +1,11 @@
 // Colour-space conversions against golden hashes of an independent model
 // (conversions_golden.py) and named values; Split and Combine against
-// straightforward accessor versions.
+// straightforward accessor versions; hue, saturation and lightness shifts:
+// the plane maps, and the picture pass against the plane route (Split, shift
+// one plane, Combine, copy).
 #include <gtest/gtest.h>
+
+#include <climits>
 
 #include "color/colorspace.hpp"
 #include "support/test_images.hpp"
@@ -10,9 +14,21 @@ using namespace pxtest;
 
 namespace {
 
+Owned plane_route(const Image *src, const Image *existing, int amount, int component) {
+    Slot h, s, l, a;
+    EXPECT_EQ(Split(src, &h, &s, &l, &a, 1), 1);
+    if (component == 0) BaseTran_Hue(h.get(), amount);
+    if (component == 1 || component == 2) BaseTran_LS(component == 1 ? s.get() : l.get(), amount);
+    Owned c(Combine(h.get(), s.get(), l.get(), a.get(), 1));
+    if (existing == nullptr && c->bitCount == src->bitCount) return c;
+    Owned out = existing ? clone(existing) : make(src->width, src->height, int32_t(src->bitCount));
+    PX_Img_Copy(out.get(), c.get());
+    return out;
+}
+
 using Conv = uint32_t (*)(uint32_t);
-const Conv kForward[] = {nullptr, RGBtoHSL, RGBtoYUV, RGBtoYIQ, RGBtoXYZ};
-const Conv kBackward[] = {nullptr, HSLtoRGB, YUVtoRGB, YIQtoRGB, XYZtoRGB};
+const Conv kConv[][2] = {
+    {nullptr, nullptr}, {RGBtoHSL, HSLtoRGB}, {RGBtoYUV, YUVtoRGB}, {RGBtoYIQ, YIQtoRGB}, {RGBtoXYZ, XYZtoRGB}};
 
 // Every third level of each byte, alpha varying: the grid of the model.
 uint32_t grid_hash(Conv fn) {
@@ -30,7 +46,7 @@ void reference_split(const Image *src, int mode, Owned planes[4]) {
     for (int y = 0; y < src->height; ++y)
         for (int x = 0; x < src->width; ++x) {
             uint32_t c = GetPixelColor(src, x, y);
-            if (mode >= 1 && mode <= 4) c = kForward[mode](c);
+            if (mode >= 1 && mode <= 4) c = kConv[mode][0](c);
             for (int i = 0; i < 4; ++i) // bytes 2, 1, 0, 3
                 SetPixelIndex(planes[i].get(), x, y, int32_t((c >> (i == 3 ? 24 : 16 - 8 * i)) & 255));
         }
@@ -42,7 +58,7 @@ Owned reference_combine(const Image *p1, const Image *p2, const Image *p3, const
         for (int x = 0; x < p1->width; ++x) {
             uint32_t c = GetPixelIndex(p3, x, y) | GetPixelIndex(p2, x, y) << 8 | GetPixelIndex(p1, x, y) << 16 |
                          (pa ? uint32_t(GetPixelIndex(pa, x, y)) << 24 : 0u);
-            SetPixelColor(out.get(), x, y, mode >= 1 && mode <= 4 ? kBackward[mode](c) : c);
+            SetPixelColor(out.get(), x, y, mode >= 1 && mode <= 4 ? kConv[mode][1](c) : c);
         }
     return out;
 }
@@ -58,17 +74,12 @@ TEST(Conversions, MatchIndependentModel) {
     for (int32_t d = 1; d <= 510; ++d)
         for (int32_t n = -131071; n < 131072; n += (n > -600 && n < 600) ? 1 : 89)
             ASSERT_EQ(pxfx::colour::div_small(n, d), n / d) << n << " / " << d;
-}
-
-TEST(Conversions, HueToRGB) {
-    // Hues above 255 fold back by 255; a falling span and results wrap modulo 65536.
-    EXPECT_EQ(HueToRGB(10, 200, 256), HueToRGB(10, 200, 1));
-    EXPECT_EQ(HueToRGB(10, 200, 169), 10 + (190 * 6 + 126) / 255);
+    // HueToRGB: a falling span (never met by HSLtoRGB) and results wrap modulo 65536.
     EXPECT_EQ(HueToRGB(200, 10, 41), uint16_t(200 - (190 * 246 - 126) / 255));
     EXPECT_EQ(HueToRGB(0, 65535, 41), uint16_t((65535 * 246 + 126) / 255));
 }
 
-TEST(Planes, SplitAndCombineMatchAccessorVersions) {
+TEST(Planes, SplitAndCombineMatchAccessorVersionsSizeRulesAndSlots) {
     const int32_t sizes[][2] = {{1, 1}, {1, 5}, {5, 1}, {3, 2}, {7, 9}};
     uint32_t seed = 1;
     for (int32_t bc : kBitCounts)
@@ -80,18 +91,11 @@ TEST(Planes, SplitAndCombineMatchAccessorVersions) {
                 reference_split(src.get(), mode, want);
                 for (int i = 0; i < 4; ++i)
                     EXPECT_EQ(diff(p[i].get(), want[i].get()), "") << bc << " " << mode << " plane " << i;
-                for (const Image *alpha : {p[3].get(), static_cast<Image *>(nullptr)}) {
-                    Owned got(Combine(p[0].get(), p[1].get(), p[2].get(), alpha, mode));
-                    Owned ref = reference_combine(p[0].get(), p[1].get(), p[2].get(), alpha, mode);
-                    EXPECT_EQ(diff(got.get(), ref.get()), "") << bc << " " << mode;
-                    if (mode == 7 && bc >= 24 && (alpha != nullptr) == (bc == 32)) {
-                        EXPECT_EQ(diff(got.get(), src.get()), ""); // plain planes give the picture back
-                    }
-                }
+                const Image *alpha = (h + mode) % 2 ? p[3].get() : nullptr; // with and without alpha
+                Owned got(Combine(p[0].get(), p[1].get(), p[2].get(), alpha, mode));
+                EXPECT_EQ(diff(got.get(), reference_combine(p[0].get(), p[1].get(), p[2].get(), alpha, mode).get()), "")
+                    << bc << " " << mode;
             }
-}
-
-TEST(Planes, SizeRulesAndSlots) {
     Owned p1 = random_image(6, 5, 8, 1), narrow = random_image(5, 5, 8, 2), low = random_image(6, 2, 8, 3);
     Owned tiny = random_image(2, 2, 8, 4), wide = random_image(6, 5, 24, 5);
     EXPECT_EQ(Combine(p1.get(), narrow.get(), p1.get(), nullptr, 0), nullptr);
@@ -108,4 +112,47 @@ TEST(Planes, SizeRulesAndSlots) {
     reference_split(s1.get(), 2, want);
     ASSERT_EQ(Split(s1.get(), &s1, &s2, &s3, nullptr, 2), 1);
     EXPECT_EQ(diff(s1.get(), want[0].get()), "");
+}
+
+TEST(BaseTran, HueWrapsBy255AndLevelsClamp) {
+    // {hue (1) or level (0), value, amount, result}: 265 - 255; -1 + 255; step
+    // -255 / 100 = -2; the low byte of 2302 + 1; ...
+    const int cases[][4] = {{1, 10, 200, 10},         {1, 254, 0, 254},  {1, 3, 99, 1},
+                            {1, 7, 1000, 255},        {1, 0, 0, 0},      {0, 100, INT32_MIN, 0},
+                            {0, 100, INT32_MAX, 255}, {0, 100, 150, 227}};
+    for (auto [hue, value, amount, want] : cases) {
+        Owned p = make(2, 1, 8);
+        p->bits[0] = uint8_t(value);
+        ASSERT_EQ((hue ? BaseTran_Hue : BaseTran_LS)(p.get(), amount), 1);
+        EXPECT_EQ(p->bits[0], want) << value << " " << amount;
+        EXPECT_EQ(p->bits[2], 255); // only the first width bytes of a row
+    }
+    Owned rgb = random_image(3, 2, 24, 2), before = clone(rgb.get());
+    EXPECT_EQ(BaseTran_LS(rgb.get(), 0) + BaseTran_Hue(rgb.get(), 0) + BaseTran_Hue(nullptr, 0), 0);
+    EXPECT_EQ(diff(rgb.get(), before.get()), "");
+}
+
+TEST(Transform, EqualsThePlaneRoute) {
+    uint32_t seed = 10;
+    for (int32_t bc : kBitCounts)
+        for (int component : {0, 1, 2, 5})
+            for (int amount : {0, 37, 100, 163, 200}) {
+                // At 163 an existing image of another size and format is kept and filled.
+                Owned src = random_image(7, 5, bc, seed++),
+                      other = amount == 163 ? random_image(5, 6, bc == 24 ? 32 : 24, seed) : nullptr,
+                      want = plane_route(src.get(), other.get(), amount, component);
+                Slot out;
+                Image *kept = out.image = other.release();
+                ASSERT_EQ(PX_IMG_Transform(src.get(), &out, amount, component), 1);
+                EXPECT_TRUE(kept == nullptr || out.get() == kept);
+                ASSERT_EQ(diff(out.get(), want.get()), "") << bc << " c" << component << " a" << amount;
+            }
+    Owned src = random_image(6, 4, 32, 3);
+    Slot out;
+    Image hollow = *src, *hp = &hollow;
+    hollow.bits = nullptr;
+    EXPECT_EQ(PX_IMG_Transform(nullptr, &out, 100, 0) + PX_IMG_Transform(src.get(), nullptr, 100, 0) +
+                  PX_IMG_Transform(&hollow, &out, 100, 0) + PX_IMG_Transform(src.get(), &hp, 100, 0),
+              0);
+    EXPECT_EQ(hp, &hollow);
 }

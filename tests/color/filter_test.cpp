@@ -1,5 +1,6 @@
-// Kernel convolution against a straightforward accessor version on random
-// pictures of every format, the fixed-kernel effects and the matrixX table.
+// Kernel convolution and box smoothing against a straightforward accessor
+// version on random pictures of every format, the fixed-kernel effects and
+// the matrixX table.
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -7,6 +8,8 @@
 #include <cmath>
 #include <random>
 #include <vector>
+
+#include "color/box_filter.hpp"
 
 #include "support/test_images.hpp"
 
@@ -19,108 +22,96 @@ struct Params {
     int32_t size, divisor, offset, gray;
 };
 
-uint32_t finish(uint32_t sum, int32_t divisor, int32_t offset) {
-    const int64_t q = divisor != 0 ? int64_t(int32_t(sum)) / divisor : int32_t(sum);
-    return uint32_t(std::clamp<int64_t>(q + offset, 0, 255));
-}
+const int32_t kSizes[][2] = {{1, 1}, {1, 7}, {7, 1}, {2, 3}, {5, 4}, {13, 9}};
 
-// Filter into d, pixel by pixel with the accessors (32-bit wrapping sums).
-void reference_filter(const Image *src, const Params &p, const Image *mask, Image *d) {
+// Filter into d, pixel by pixel with the accessors (32-bit wrapping sums);
+// 8-bit pictures as one channel with a mask, colour ones with the grey mix;
+// box smoothing filters the alpha byte too.
+void reference_filter(const Image *src, const Params &p, const Image *mask, Image *d, bool box = false) {
     int32_t w = d->width, h = d->height;
     if (mask && mask->bitCount == 8) w = std::min(w, mask->width), h = std::min(h, mask->height);
-    const int32_t half = p.size / 2, last = p.size - half - 1;
-    auto weight = [&](int dx, int dy) { return uint32_t(p.kernel[size_t((dy + half) * p.size + dx + half)]); };
-    for (int32_t y = 0; y < h; ++y)
+    const int32_t half = p.size / 2, last = p.size - half - 1, gray = d->bitCount == 8;
+    for (int32_t y = 0; y < h && d->bitCount != 16; ++y)
         for (int32_t x = 0; x < w; ++x) {
-            if (d->bitCount == 8) {
-                if (mask && y < mask->height && x < int32_t(mask->pitch) && mask->bits[y * mask->pitch + x] == 0) {
-                    SetPixelIndex(d, x, y, GetPixelIndex(src, x, y));
-                    continue;
-                }
-                uint32_t sum = 0;
-                for (int dy = -half; dy <= last; ++dy)
-                    for (int dx = -half; dx <= last; ++dx)
-                        sum += weight(dx, dy) * GetPixelIndex(src, x + dx, y + dy);
-                SetPixelIndex(d, x, y, int32_t(finish(sum, p.divisor == 0 ? 1 : p.divisor, p.offset)));
-            } else if (d->bitCount == 24 || d->bitCount == 32) {
-                uint32_t s[3] = {0, 0, 0}, c = GetPixelColor(d, x, y); // no taps: alpha kept
-                for (int dx = -half; dx <= last; ++dx)
-                    for (int dy = -half; dy <= last; ++dy) {
-                        c = GetPixelColor(src, x + dx, y + dy);
-                        for (int i = 0; i < 3; ++i)
-                            s[i] += weight(dx, dy) * ((c >> (8 * i)) & 255);
-                    }
-                for (uint32_t &v : s)
-                    v = finish(v, p.divisor, p.offset);
-                if (p.gray >= 1) s[0] = s[1] = s[2] = (s[0] + 2 * s[1] + s[2]) >> 2;
-                SetPixelColor(d, x, y, s[0] | s[1] << 8 | s[2] << 16 | (c & 0xFF000000u));
+            if (gray && mask && y < mask->height && x < int32_t(mask->pitch) && mask->bits[y * mask->pitch + x] == 0) {
+                SetPixelIndex(d, x, y, GetPixelIndex(src, x, y));
+                continue;
             }
+            uint32_t s[4] = {0, 0, 0, 0}, c = GetPixelColor(d, x, y); // no taps: alpha kept
+            for (int dy = -half; dy <= last; ++dy)
+                for (int dx = -half; dx <= last; ++dx) {
+                    c = gray ? GetPixelIndex(src, x + dx, y + dy) : GetPixelColor(src, x + dx, y + dy);
+                    for (int i = 0; i < 3 + box; ++i)
+                        s[i] += uint32_t(p.kernel[size_t((dy + half) * p.size + dx + half)]) * ((c >> (8 * i)) & 255);
+                }
+            const int64_t div = gray && p.divisor == 0 ? 1 : p.divisor; // the sums are signed
+            for (uint32_t &v : s)
+                v = uint32_t(std::clamp<int64_t>((div ? int32_t(v) / div : int32_t(v)) + p.offset, 0, 255));
+            if (gray) SetPixelIndex(d, x, y, int32_t(s[0]));
+            if (!gray && p.gray >= 1) s[0] = s[1] = s[2] = (s[0] + 2 * s[1] + s[2]) >> 2;
+            if (!gray) SetPixelColor(d, x, y, s[0] | s[1] << 8 | s[2] << 16 | (box ? s[3] << 24 : c & 0xFF000000u));
         }
 }
 
 Params random_params(std::mt19937 &rng, int32_t size) {
-    Params p{{}, size, 0, 0, 0};
+    const int32_t divisors[] = {0, 1, 9, -3}, huge[] = {INT32_MIN, INT32_MAX, 0x40000000}; // huge: sums wrap
+    Params p{{}, size, divisors[rng() % 4], int32_t(rng() % 60) - 20, int32_t(rng() % 3) - 1};
     for (int32_t i = 0; i < size * size; ++i)
-        p.kernel.push_back(rng() % 3 == 0 ? 0 : int32_t(rng() % 21) - 8);
-    const int32_t divisors[] = {0, 1, 9, -3};
-    p.divisor = divisors[rng() % 4];
-    p.offset = int32_t(rng() % 60) - 20;
-    p.gray = int32_t(rng() % 3) - 1;
+        p.kernel.push_back(rng() % 3 == 0 ? 0 : rng() % 30 == 0 ? huge[rng() % 3] : int32_t(rng() % 21) - 8);
     return p;
+}
+
+int32_t run(Image *src, const Params &p, const Image *mask, Image *dst) {
+    return Filter(src, p.kernel.empty() ? nullptr : p.kernel.data(), p.size, p.divisor, p.offset, mask, dst, p.gray);
+}
+
+// In place: the working image (white where nothing is written) is copied over the picture.
+Owned in_place(const Image *src, const Params &p, const Image *mask, bool box = false) {
+    Owned work = make(src->width, src->height, int32_t(src->bitCount)), out = clone(src);
+    reference_filter(src, p, mask, work.get(), box);
+    PX_Img_Copy(out.get(), work.get());
+    return out;
+}
+
+Owned reference_box(const Image *src, int32_t size, int32_t offset) {
+    return in_place(src, {std::vector<int32_t>(size_t(size) * size, 1), size, size * size, offset, 0}, nullptr, true);
 }
 
 } // namespace
 
-TEST(Filter, MatchesAccessorVersion) {
-    const int32_t sizes[][2] = {{1, 1}, {1, 6}, {6, 1}, {2, 3}, {7, 5}, {13, 9}};
+TEST(Filter, MatchesAccessorVersionAliasingAndRefusals) {
     std::mt19937 rng(5);
     uint32_t seed = 1;
     for (int32_t sbc : kBitCounts)
-        for (auto [w, h] : sizes)
-            for (int32_t size : {1, 2, 3, 4, 5, 9}) {
+        for (auto [w, h] : kSizes)
+            for (int32_t size : {0, 1, 2, 3, 4, 5, 9}) { // size 0: no taps, the clamped offset
                 const Params p = random_params(rng, size);
                 Owned src = random_image(w, h, sbc, seed++);
+                SCOPED_TRACE(std::to_string(sbc) + " bits " + std::to_string(w) + "x" + std::to_string(h));
                 // Into a destination of every format, and of a larger size.
                 for (int32_t dbc : kBitCounts) {
-                    Owned dst = random_image(w + (dbc == sbc) * 3, h + (dbc == sbc), dbc, seed++);
-                    Owned want = clone(dst.get());
+                    Owned dst = random_image(w + (dbc == sbc) * 3, h + (dbc == sbc), dbc, seed++),
+                          want = clone(dst.get());
                     reference_filter(src.get(), p, nullptr, want.get());
-                    ASSERT_EQ(Filter(src.get(), p.kernel.data(), size, p.divisor, p.offset, nullptr, dst.get(), p.gray),
-                              1);
-                    ASSERT_EQ(diff(dst.get(), want.get()), "")
-                        << sbc << "->" << dbc << " " << w << "x" << h << " k" << size;
+                    ASSERT_EQ(run(src.get(), p, nullptr, dst.get()), 1);
+                    ASSERT_EQ(diff(dst.get(), want.get()), "") << "to " << dbc << " bits, k" << size;
                 }
                 // In place, with masks: the working image (white outside the mask area) is copied back.
                 const int32_t maskBits = int32_t(size % 3) * 8; // none, 8 or 16 bits
                 Owned mask = maskBits ? random_image(w / 2 + 1, h + 1, maskBits, seed++) : nullptr;
                 if (mask) std::fill(mask->bits, mask->bits + 3, uint8_t(0));
-                Owned work = make(w, h, sbc), want = clone(src.get());
-                reference_filter(src.get(), p, mask.get(), work.get());
-                PX_Img_Copy(want.get(), work.get());
-                ASSERT_EQ(Filter(src.get(), p.kernel.data(), size, p.divisor, p.offset, mask.get(), nullptr, p.gray),
-                          1);
-                ASSERT_EQ(diff(src.get(), want.get()), "") << sbc << " in place, mask " << maskBits;
+                Owned want = in_place(src.get(), p, mask.get());
+                ASSERT_EQ(run(src.get(), p, mask.get(), nullptr), 1);
+                ASSERT_EQ(diff(src.get(), want.get()), "") << "in place, mask " << maskBits << ", k" << size;
             }
-}
-
-TEST(Filter, WrappingNoTapsAliasingAndRefusals) {
-    Owned src = random_image(3, 2, 32, 40), dst = make(3, 2, 32), want = make(3, 2, 32);
-    const Params wrap{{INT32_MAX, INT32_MIN, 0x40000000, -7}, 2, -1, 100, 0};
-    reference_filter(src.get(), wrap, nullptr, want.get());
-    ASSERT_EQ(Filter(src.get(), wrap.kernel.data(), 2, -1, 100, nullptr, dst.get(), 0), 1);
-    EXPECT_EQ(diff(dst.get(), want.get()), "");
-    SetPixelColor(dst.get(), 1, 1, 0x12345678); // no taps: the clamped offset, alpha kept
-    ASSERT_EQ(Filter(src.get(), nullptr, 0, 0, 300, nullptr, dst.get(), 0), 1);
-    EXPECT_EQ(GetPixelColor(dst.get(), 1, 1), 0x12FFFFFFu);
     // A destination sharing the source's pixels is filtered from a snapshot.
     const Params upLeft{{1, 0, 0, 0, 0, 0, 0, 0, 0}, 3, 1, 0, 0};
     Owned same = random_image(6, 5, 8, 4), shifted = make(6, 5, 8);
     reference_filter(same.get(), upLeft, nullptr, shifted.get());
-    ASSERT_EQ(Filter(same.get(), upLeft.kernel.data(), 3, 1, 0, nullptr, same.get(), 0), 1);
+    ASSERT_EQ(run(same.get(), upLeft, nullptr, same.get()), 1);
     EXPECT_EQ(diff(same.get(), shifted.get()), "");
-    EXPECT_EQ(Filter(nullptr, &upLeft.kernel[0], 1, 1, 0, nullptr, nullptr, 0) +
-                  Filter(src.get(), nullptr, 3, 1, 0, nullptr, nullptr, 0) +
-                  Filter(src.get(), &upLeft.kernel[0], 50000, 1, 0, nullptr, nullptr, 0),
+    EXPECT_EQ(run(nullptr, upLeft, nullptr, nullptr) + run(same.get(), {{}, 3, 1, 0, 0}, nullptr, nullptr) +
+                  run(same.get(), {{1}, 50000, 1, 0, 0}, nullptr, nullptr),
               0);
 }
 
@@ -135,28 +126,60 @@ TEST(KernelEffects, MatchFilterWithTheirKernels) {
         for (int i = 0; i < 4; ++i) {
             Owned src = random_image(9, 6, bc, seed++), want = make(9, 6, bc);
             Slot out;
-            out.image = malloc_Image(9, 6, bc == 8 ? 24 : 8); // wrong format: replaced
-            ASSERT_EQ(fns[i](src.get(), &out), 1);
+            out.image = malloc_Image(9, 6, bc == 8 ? 24 : 8);                   // wrong format: replaced
+            ASSERT_EQ(fns[i](src.get(), &out) - fns[i](src.get(), nullptr), 1); // a null slot is refused
             reference_filter(src.get(), params[i], nullptr, want.get());
             EXPECT_EQ(diff(out.get(), want.get()), "") << i << " @" << bc;
-            EXPECT_EQ(fns[i](src.get(), nullptr), 0);
         }
 }
 
-TEST(MatrixX, NormalisedGaussians) {
-    EXPECT_NEAR(matrixX[0][0], 0.010868f, 6e-7);
-    EXPECT_NEAR(matrixX[0][1], 0.978265f, 6e-7);
-    EXPECT_NEAR(matrixX[9][0], 0.001332f, 6e-7);
-    EXPECT_NEAR(matrixX[9][10], 0.119871f, 6e-7);
+TEST(MatrixX, NormalisedGaussiansRoundedToFloat) {
     for (int r = 1; r <= 10; ++r) {
-        double sum = 0, total = 0;
+        const double twoSigma2 = 2 * (r / 3.0) * (r / 3.0);
+        double total = 0;
         for (int i = -r; i <= r; ++i)
-            total += std::exp(-(i * i) / (2 * (r / 3.0) * (r / 3.0)));
-        for (int j = 0; j < 21; ++j) { // nearest floats to the double values, zero-padded
-            sum += matrixX[r - 1][j];
-            const double w = j > 2 * r ? 0.0 : std::exp(-((j - r) * (j - r)) / (2 * (r / 3.0) * (r / 3.0))) / total;
-            EXPECT_EQ(matrixX[r - 1][j], float(w)) << r << " " << j;
-        }
-        EXPECT_NEAR(sum, 1.0, 1e-6) << r;
+            total += std::exp(-(i * i) / twoSigma2);
+        for (int j = 0; j < 21; ++j) // zero-padded after 2r + 1 entries
+            EXPECT_EQ(matrixX[r - 1][j], j > 2 * r ? 0.0f : float(std::exp(-((j - r) * (j - r)) / twoSigma2) / total))
+                << r << " " << j;
     }
+}
+
+TEST(FilterFast, MatchesFullBoxSumsAndRefusesBadSizesAsDoesSmooth) {
+    uint32_t seed = 1;
+    for (int32_t bc : kBitCounts)
+        for (auto [w, h] : kSizes)
+            for (int32_t size : {1, 2, 3, 4, 5, 8, 15}) {
+                const int32_t offset = int32_t(seed % 3) * 25 - 25;
+                Owned img = random_image(w, h, bc, seed++), want = reference_box(img.get(), size, offset);
+                ASSERT_EQ(Filter_fast(img.get(), size, offset), 1);
+                ASSERT_EQ(diff(img.get(), want.get()), "") << bc << " " << w << "x" << h << " size " << size;
+            }
+    // Large sizes (64-bit sums above 2901): the running sums against full sums.
+    for (int32_t bc : {8, 24, 32})
+        for (int32_t size : {31, 2901, 2902, 100000}) {
+            Owned a = random_image(9, 7, bc, seed++), b = clone(a.get());
+            ASSERT_EQ(pxfx::box_filter(a.get(), size, 3, true) + pxfx::box_filter(b.get(), size, 3, false), 2);
+            EXPECT_EQ(diff(a.get(), b.get()), "") << bc << " size " << size;
+        }
+    Owned ramp = make(2, 1, 8); // 0 then 255
+    ramp->bits[0] = 0;
+    ASSERT_EQ(Filter_fast(ramp.get(), 4000, 0), 1); // columns -2000..1999: 1999 read 255
+    EXPECT_EQ(ramp->bits[0], 255 * 1999 / 4000);
+    Owned img = random_image(6, 5, 24, 3), before = clone(img.get());
+    for (int32_t size : {0, -3, INT32_MIN, pxfx::kMaxBoxSize + 1})
+        EXPECT_EQ(Filter_fast(img.get(), size, 0) + Filter_fast(nullptr, 3, 0), 0);
+    EXPECT_EQ(diff(img.get(), before.get()), "");
+    // PX_IMG_Smooth: a box of min(strength, 100) / 10, slots and in place.
+    Owned src = random_image(9, 8, 32, 5), want = reference_box(src.get(), 10, 0);
+    Slot out, gray;
+    Image *kept = gray.image = malloc_Image(3, 3, 8); // an existing result is used as it stands
+    ASSERT_EQ(PX_IMG_Smooth(src.get(), &out, 5) + PX_IMG_Smooth(src.get(), &gray, 30), 2);
+    EXPECT_EQ(diff(out.get(), src.get()), ""); // size 0: a plain copy
+    EXPECT_EQ(gray.get(), kept);
+    ASSERT_EQ(PX_IMG_Smooth(src.get(), nullptr, 150), 1); // in place
+    EXPECT_EQ(diff(src.get(), want.get()), "");
+    Image hollow = *src, *hp = &hollow;
+    hollow.bits = nullptr;
+    EXPECT_EQ(PX_IMG_Smooth(&hollow, &out, 50) + PX_IMG_Smooth(src.get(), &hp, 50), 0);
 }

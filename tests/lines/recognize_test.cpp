@@ -1,8 +1,10 @@
 // Straightening along tilted boundaries, RecognizeYUV's limits and delivery,
-// and the vertical resampler against its formula.
+// the vertical resampler against its formula, and the run finder and the
+// interval helpers on hand-made lists.
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <climits>
 #include <vector>
 
 #include "lines/lines_internal.hpp"
@@ -11,6 +13,26 @@
 using namespace pxtest;
 
 namespace {
+
+using Ints = std::vector<int32_t>;
+
+// CheckMaxSame's result with the run it reports.
+Ints longest(const Ints &labels) {
+    int32_t first = -9, last = -9;
+    const int32_t m = CheckMaxSame(labels.data(), static_cast<int32_t>(labels.size()), &first, &last);
+    return {m, first, last};
+}
+
+Ints combine(Ints v, int32_t minGap) {
+    v.resize(2 * static_cast<size_t>(CombineMinSpace(v.data(), static_cast<int32_t>(v.size() / 2), minGap)));
+    return v;
+}
+
+// CheckLapOver's result with the interval it leaves in start and end.
+Ints lap(const Ints &list, int32_t s, int32_t e) {
+    const int32_t r = CheckLapOver(list.data(), static_cast<int32_t>(list.size() / 2), &s, &e);
+    return {r, s, e};
+}
 
 // Dark (20) above the boundary row top + x / run, bright (230) from it down.
 Owned tilted(int32_t w, int32_t h, int32_t run = 8, int32_t top = 30) {
@@ -21,12 +43,6 @@ Owned tilted(int32_t w, int32_t h, int32_t run = 8, int32_t top = 30) {
     return im;
 }
 
-std::vector<int32_t> boundary(const Image *im) {
-    std::vector<int32_t> line(static_cast<size_t>(im->width));
-    pxfx::lines::detect_boundary(im, line.data());
-    return line;
-}
-
 } // namespace
 
 TEST(Straighten, FollowsTheStripBoundariesAndReadsClamped) {
@@ -34,17 +50,18 @@ TEST(Straighten, FollowsTheStripBoundariesAndReadsClamped) {
     // and 31 of column 65 form an edge, the line moves by the mean distance
     // from row 48 + 6 to it over columns 65..144, 11.5.
     Owned im = tilted(200, 100);
+    std::vector<int32_t> l(700);
     for (int32_t shift : {0, 12}) {
-        const std::vector<int32_t> line = boundary(im.get());
+        pxfx::lines::detect_boundary(im.get(), l.data());
         for (int32_t c = 0; c < 200; ++c)
-            ASSERT_EQ(line[c], 38 + shift + (c - 65) / 8) << c;
+            ASSERT_EQ(l[c], 38 + shift + (c - 65) / 8) << c;
         im->bits[31 * im->pitch + 65] = 230;
     }
     // Steep, nearly level, and reaching above the picture at the left end.
     const int32_t cases[][4] = {{200, 100, 8, 30}, {700, 60, 200, 20}, {200, 150, 2, -10}};
     for (auto [w, h, run, top] : cases) {
         Owned im = tilted(w, h, run, top), got = make(w, h, 8), want = make(w, h, 8);
-        const std::vector<int32_t> l = boundary(im.get());
+        pxfx::lines::detect_boundary(im.get(), l.data());
         pxfx::lines::straighten(im.get(), l.data(), got.get());
         for (int32_t r = 0; r < std::min(h - l[0], h - l[w - 1]); ++r)
             for (int32_t c = 0; c < w; ++c)
@@ -76,12 +93,48 @@ TEST(MyResample2, InterpolatesRowsWithRounding) {
         ASSERT_EQ(got->height, 3 * f + 1);
         for (int32_t y = 0; y < got->height; ++y)
             for (int32_t x = 0; x < 17; ++x) {
-                const int32_t a = GetPixelIndex(src.get(), x, y / f), b = GetPixelIndex(src.get(), x, y / f + 1);
-                const int32_t k = y % f;
+                const int32_t a = GetPixelIndex(src.get(), x, y / f), b = GetPixelIndex(src.get(), x, y / f + 1),
+                              k = y % f;
                 ASSERT_EQ(GetPixelIndex(got.get(), x, y), (a * (f - k) + b * k + (f + 1) / 2) / f) << f << "," << y;
             }
     }
     EXPECT_EQ(MyResample2(src.get(), 1), nullptr);
     EXPECT_EQ(MyResample2(src.get(), 50), nullptr);
     EXPECT_EQ(MyResample2(make(4, 4, 24).get(), 2), nullptr);
+}
+
+TEST(CheckMaxSame, RunsStartAtTheFirstLabelValue) {
+    // Index 0 (the value of labels[0]) starts: the 1s never match it, the 0
+    // at index 4 does; the last element ends a run uncounted.
+    EXPECT_EQ(longest({0, 1, 1, 1, 0, 2, 2, 2, 2, 2, 3}), (Ints{4, 5, 10}));
+    EXPECT_EQ(longest({1, -1, -1, -1, 2, 2}), (Ints{0, -9, -9})); // -1 never counts
+    // A first value that is no index starts at index 0.
+    EXPECT_EQ(longest({-3, -3, -3, 0}), (Ints{2, 0, 3}));
+    int32_t first = -9;
+    EXPECT_EQ(CheckMaxSame(Ints{1, 1, 1}.data(), 3, &first, nullptr), 1);
+    EXPECT_EQ(first, -9);
+    EXPECT_EQ(CheckMaxSame(nullptr, 5, nullptr, nullptr), 0);
+}
+
+TEST(CombineMinSpace, MergesCloseIntervalsAndDropsShortOnes) {
+    EXPECT_EQ(combine({0, 10, 12, 15, 30, 31, 40, 60}, 5), (Ints{0, 15, 40, 60}));
+    // minGap 0 means 2; an absorbed interval's end is taken even when smaller.
+    EXPECT_EQ(combine({0, 20, 3, 8, 40, 45, 46, 47}, 0), (Ints{0, 8, 40, 47}));
+    EXPECT_EQ(combine({INT_MIN, INT_MAX, 5, 6}, 3), (Ints{INT_MIN, 6})); // exact lengths
+    EXPECT_EQ(CombineMinSpace(nullptr, 2, 3), 0);
+}
+
+TEST(CheckLapOver, CrossingIntervalWinsElseTheNextOneIsReported) {
+    const Ints list = {0, 10, 20, 30, 40, 50};
+    EXPECT_EQ(lap(list, 5, 25), (Ints{1, 20, 30}));
+    // Nothing crosses the end: the first interval after the query is chosen,
+    // with a negative overlap.
+    EXPECT_EQ(lap(list, 12, 15), (Ints{0, 20, 30}));
+    EXPECT_EQ(lap(list, 20, 19), (Ints{1, 20, 30})); // overlap -1 against half -1
+    EXPECT_EQ(lap(list, 60, 70), (Ints{0, 0, 0}));
+    // An interval from the query's end that does not pass it stops the walk.
+    EXPECT_EQ(lap({25, 25, 30, 40}, 0, 25), (Ints{0, 0, 0}));
+    int32_t s = 1, e = 2;
+    EXPECT_EQ(CheckLapOver(nullptr, 3, &s, &e) + CheckLapOver(list.data(), 3, nullptr, &e), 0);
+    EXPECT_EQ(s + e, 0);
 }

@@ -1,8 +1,14 @@
-// Exposure, Otsu threshold, white balance and the channel operations.
+// Exposure, Otsu threshold, white balance and the channel operations; the
+// curve tables and the curve-table colour filters against per-sample maps
+// written straight from their rules.
 #include <gtest/gtest.h>
 
+#include <climits>
 #include <cmath>
+#include <functional>
+#include <vector>
 
+#include "support/test_images.hpp"
 #include "toolkit/px_images.hpp"
 
 using namespace pxtest;
@@ -26,67 +32,43 @@ int curve(int v, int low, int high) {
 
 TEST(Exposure, PercentileStretchAndBrightRefusal) {
     for (int bits : {8, 24}) {
-        PX im = percentile_image(bits), orig = px_clone(im.get());
+        PX im = percentile_image(bits);
+        for (int i = 0; i < 1000 && bits == 24; ++i) // a bright first channel is left alone
+            im->data[3 * i] = uint8_t(201 + i % 50);
+        PX orig = px_clone(im.get());
         ASSERT_EQ(PXImage_AutoExposure(im.get()), 1);
         for (size_t i = 0; i < px_size(im.get()); ++i)
-            ASSERT_EQ(im->data[i], curve(orig->data[i], 20, 180)) << i;
+            ASSERT_EQ(im->data[i], bits == 24 && i % 3 == 0 ? orig->data[i] : curve(orig->data[i], 20, 180)) << i;
     }
-    PX fixed = percentile_image(8);
-    ASSERT_EQ(PXImage_AutoExposure_1(fixed.get()), 1);
-    EXPECT_EQ(fixed->data[5], int(std::pow(20 / 255.0, 0.4) * 255.0));
-    EXPECT_EQ(fixed->data[6], int(std::pow(100 / 255.0, 0.4) * 255.0));
-
-    PX bright = px_make(10, 10, 8, 201);
-    EXPECT_EQ(PXImage_AutoExposure(bright.get()), 0);
-    EXPECT_EQ(PXImage_AutoExposure_1(bright.get()), 0);
+    PX fixed = percentile_image(8), bright = px_make(10, 10, 8, 201), flat = px_make(6, 6, 8, 100);
+    ASSERT_EQ(PXImage_AutoExposure_1(fixed.get()), 1); // a fixed low of 0 and high of 255
+    EXPECT_EQ(fixed->data[5] * 1000 + fixed->data[6], curve(20, 0, 255) * 1000 + curve(100, 0, 255));
+    EXPECT_EQ(PXImage_AutoExposure(bright.get()) + PXImage_AutoExposure_1(bright.get()), 0);
     EXPECT_EQ(bytes(bright.get()), std::vector<uint8_t>(100, 201));
-    PX mixed = percentile_image(24); // a bright first channel is left alone
-    for (int i = 0; i < 1000; ++i)
-        mixed->data[3 * i] = uint8_t(201 + i % 50);
-    PX orig = px_clone(mixed.get());
-    ASSERT_EQ(PXImage_AutoExposure(mixed.get()), 1);
-    for (int i = 0; i < 3000; ++i)
-        ASSERT_EQ(mixed->data[i], i % 3 ? curve(orig->data[i], 20, 180) : orig->data[i]) << i;
-
-    PX flat = px_make(6, 6, 8, 100); // low = 100, high = 101
-    EXPECT_EQ(PXImage_AutoExposure(flat.get()), 1);
+    EXPECT_EQ(PXImage_AutoExposure(flat.get()), 1); // low = 100, high = 101
     EXPECT_EQ(bytes(flat.get()), std::vector<uint8_t>(36, 0));
 }
 
 TEST(Exposure, SixteenBitTableCoversOnlyLowLevels) {
-    PX img = px_make(50, 2, 16);
-    for (int i = 0; i < 100; ++i) { // samples 0..99, then 40 of them lifted past 255
-        const int v = i < 60 ? i : 256 + i;
-        img->data[2 * i] = uint8_t(v);
-        img->data[2 * i + 1] = uint8_t(v >> 8);
-    }
+    PX img = px_make(50, 2, 16), odd = px_random(3, 3, 32, 1);
+    for (int i = 0; i < 100; ++i) // samples 0..99, then 40 of them lifted past 255
+        put_sample(img.get(), i / 50, i % 50, 0, i < 60 ? i : 256 + i);
     ASSERT_EQ(PXImage_AutoExposure(img.get()), 1);
-    // low = 0; high = 256 + 99 = 355, kept as 99.
-    for (int i = 0; i < 100; ++i) {
-        const int got = img->data[2 * i] | img->data[2 * i + 1] << 8;
-        const int want = i < 60 ? std::min(65535, int(std::pow(i / 99.0, 0.4) * 65535.0)) : 0;
-        EXPECT_EQ(got, want) << i;
-    }
-    EXPECT_EQ(PXImage_AutoExposure(nullptr), 0);
-    PX odd = px_random(3, 3, 32, 1);
-    EXPECT_EQ(PXImage_AutoExposure_1(odd.get()), 0);
+    for (int i = 0; i < 100; ++i) // low = 0; high = 256 + 99 = 355, kept as 99.
+        EXPECT_EQ(neighbour(img.get(), i / 50, i % 50, 0, 0, 0),
+                  i < 60 ? std::min(65535, int(std::pow(i / 99.0, 0.4) * 65535.0)) : 0)
+            << i;
+    EXPECT_EQ(PXImage_AutoExposure(nullptr) + PXImage_AutoExposure_1(odd.get()), 0);
 }
 
-TEST(Otsu, ThresholdsOfKnownHistograms) {
-    auto plane = [](std::initializer_list<std::pair<int, int>> levels) {
-        std::vector<uint8_t> p;
-        for (auto [v, count] : levels)
-            p.insert(p.end(), size_t(count), uint8_t(v));
-        return p;
-    };
-    const auto halves = plane({{50, 8}, {200, 8}}), quarter = plane({{10, 4}, {100, 12}});
-    const auto ends = plane({{0, 5}, {255, 11}}), top = plane({{10, 4}, {240, 4}, {255, 8}});
-    EXPECT_EQ(ProbabilityDensityValue(halves.data(), 4, 4), 50);
-    EXPECT_EQ(ProbabilityDensityValue(quarter.data(), 8, 2), 10);
-    EXPECT_EQ(ProbabilityDensityValue(ends.data(), 16, 1), 120);
-    EXPECT_EQ(ProbabilityDensityValue(top.data(), 4, 4), 240); // level 255 is left out of the upper mean
-    EXPECT_EQ(ProbabilityDensityValue(nullptr, 4, 4), 120);
-    EXPECT_EQ(ProbabilityDensityValue(halves.data(), 0, 4), 120);
+// Otsu's split with level 255 left out of the upper mean; 120 when there is nothing to split.
+TEST(Otsu, TopLevelAndDegenerateInputs) {
+    const uint8_t top[16] = {10, 10, 10, 10, 240, 240, 240, 240, 255, 255, 255, 255, 255, 255, 255, 255},
+                  ends[16] = {0, 0, 0, 0, 0, 255, 255, 255, 255, 255, 255, 255, 255, 255, 255, 255};
+    EXPECT_EQ(ProbabilityDensityValue(top, 4, 4), 240);
+    EXPECT_EQ(ProbabilityDensityValue(ends, 16, 1) + ProbabilityDensityValue(nullptr, 4, 4) +
+                  ProbabilityDensityValue(top, 0, 4),
+              3 * 120);
 }
 
 // Literal white balance with the column walk stopped after three columns.
@@ -124,11 +106,11 @@ PX ref_balance(const PXImage *src, int x, int y) {
 
 TEST(WhiteBalance, MatchesLiteralVersionAtEdgesAndCorners) {
     for (int bits : {8, 24})
-        for (uint32_t seed = 1; seed <= 3; ++seed) {
+        for (int seed = 1; seed <= 4; ++seed) {
             const int w = 9, h = 7;
-            PX src = px_random(w, h, bits, seed);
-            for (size_t i = 0; i < px_size(src.get()); ++i) // lift some references into the gate
-                src->data[i] = uint8_t(std::max<int>(src->data[i], int(seed) * 60));
+            PX src = px_random(w, h, bits, uint32_t(seed));
+            for (size_t i = 0; i < px_size(src.get()); ++i) // lift some references into the gate, then all above
+                src->data[i] = uint8_t(std::max<int>(src->data[i], seed < 4 ? seed * 60 : 253));
             const PXPoint pts[] = {{4, 3}, {0, 0}, {w - 1, h - 1}, {w + 5, -3}, {-7, h + 2}, {w - 2, 0}};
             for (const PXPoint &pt : pts) {
                 PX img = px_clone(src.get());
@@ -137,25 +119,92 @@ TEST(WhiteBalance, MatchesLiteralVersionAtEdgesAndCorners) {
                     << bits << " bits at " << pt.x << "," << pt.y;
             }
         }
-    PX white = px_make(5, 5, 24, 253);
-    const PXPoint mid{2, 2};
-    ASSERT_EQ(PXImage_AutoWhiteBalance(white.get(), &mid), 1);
-    EXPECT_EQ(bytes(white.get()), std::vector<uint8_t>(75, 250));
-    EXPECT_EQ(PXImage_AutoWhiteBalance(white.get(), nullptr), 0);
+    EXPECT_EQ(PXImage_AutoWhiteBalance(px_make(5, 5, 24).get(), nullptr), 0);
 }
 
 TEST(Channels, InversionAndGreenCopy) {
     PX rgba = px_random(4, 3, 32, 10), a0 = px_clone(rgba.get());
     PX rgb = px_random(4, 3, 24, 9), r0 = px_clone(rgb.get());
     EXPECT_EQ(PXImage_BlueEnhancement(rgba.get()), 0);
-    ASSERT_EQ(PXImage_BlueEnhancement(rgb.get()), 1);
-    ASSERT_EQ(PXImage_GreenChannel(rgba.get()), 1);
-    for (int i = 0; i < 36; ++i)
-        EXPECT_EQ(rgb->data[i], 255 - r0->data[i]);
-    for (int i = 0; i < 12; ++i) {
-        const uint8_t *p = rgba->data + 4 * i, *q = a0->data + 4 * i;
-        EXPECT_TRUE(p[0] == q[1] && p[1] == q[1] && p[2] == q[1] && p[3] == q[3]);
+    ASSERT_EQ(PXImage_BlueEnhancement(rgb.get()) + PXImage_GreenChannel(rgba.get()), 2);
+    for (int i = 0; i < 48; ++i) { // green into blue, green and red; alpha kept
+        EXPECT_EQ(rgba->data[i], a0->data[i % 4 == 3 ? i : i - i % 4 + 1]) << i;
+        EXPECT_EQ(i < 36 ? rgb->data[i] : 0, i < 36 ? 255 - r0->data[i] : 0) << i;
     }
+}
+
+// The level map an 8-bit filter applies, read off a picture of every level.
+std::vector<int> map_of(const std::function<int32_t(Image *)> &fn) {
+    Owned ramp = make(16, 16, 8);
+    for (int v = 0; v < 256; ++v)
+        ramp->bits[v / 16 * 16 + v % 16] = uint8_t(v);
+    EXPECT_EQ(fn(ramp.get()), 1);
+    return std::vector<int>(ramp->bits, ramp->bits + 256);
+}
+
+// Sum of (i + 1) * t[i] over 256 entries: a moved or changed entry shows.
+template <class T> int64_t weighted_sum(const T *t) {
+    int64_t sum = 0;
+    for (int i = 0; i < 256; ++i)
+        sum += int64_t(i + 1) * t[i];
+    return sum;
+}
+
+TEST(CurveTables, WeightedSums) {
+    const std::pair<const uint8_t *, int64_t> tables[] = {
+        {ZANTOMOPI, 6047599}, {ZANTOFILTERBK, 4145935}, {ZANTOFILTER, 6930454}};
+    for (auto [t, want] : tables)
+        EXPECT_EQ(weighted_sum(t), want);
+}
+
+TEST(ColorFilter, LevelMaps) {
+    // colour (R in bits 0-7) -> shift; luminance 127 and 128 change nothing
+    const std::pair<uint32_t, int> shifts[] = {{0x000000, -44}, {0xFFFFFF, 47}, {0x0000FF, -17}, {0x00FF00, 8},
+                                               {0xFF0000, -33}, {0x7F7F7F, 0},  {0x808080, 0}};
+    for (auto [colour, delta] : shifts) {
+        std::vector<int> want(256);
+        for (int v = 0; v < 256; ++v)
+            want[v] = std::min(255, std::max(0, v + delta));
+        EXPECT_EQ(map_of([&](Image *i) { return ColorFilter(i, colour, nullptr); }), want) << colour;
+    }
+    // ColorFilter1 bows a circle through both ends by the strength and
+    // inverts it when darkening: its maps as weighted sums.
+    const std::pair<int, int64_t> bowed[] = {{0, 3625129},   {1, 3625129},   {60, 3821173}, {127, 3968242},
+                                             {129, 6914945}, {200, 7016953}, {255, 7132103}};
+    for (auto [level, want] : bowed) {
+        const int d = std::abs(level - 128), e = 127 - d;
+        const uint8_t *curve = level > 128 ? ZANTOFILTER : ZANTOFILTERBK;
+        std::vector<int> blend(256);
+        for (int i = 0; i < 256; ++i)
+            blend[i] = ((e * i + d * curve[i] + 63) / 127) & 255;
+        EXPECT_EQ(weighted_sum(map_of([&](Image *i) { return ColorFilter1(i, level); }).data()), want) << level;
+        EXPECT_EQ(map_of([&](Image *i) { return ColorFilter_zanto(i, level); }), blend) << level;
+    }
+}
+
+TEST(ColorFilter, TintMasksAndRefusals) {
+    Owned mask = random_image(7, 11, 8, 99), gray = random_image(13, 9, 8, 1), rgb = random_image(13, 9, 24, 2);
+    Owned gray0 = clone(gray.get()), rgb0 = clone(rgb.get());
+    mask->bits[0] = 0;
+    ASSERT_EQ(ColorFilter(gray.get(), 0, mask.get()) + ColorFilter24(rgb.get(), 0xFF0080, mask.get()), 2);
+    for (int y = 0; y < 9; ++y)
+        for (int x = 0; x < 13; ++x) {
+            const bool sel = x < 7 && GetPixelIndex(mask.get(), x, y) != 0;
+            const int v = GetPixelIndex(gray0.get(), x, y);
+            EXPECT_EQ(GetPixelIndex(gray.get(), x, y), sel ? std::max(0, v - 44) : v);
+            const uint32_t c = GetPixelColor(rgb0.get(), x, y), target[3] = {0xFF, 0x00, 0x80};
+            for (int k = 0; k < 3; ++k) { // pixel bytes blue, green, red against colour bits 16-23, 8-15, 0-7
+                const uint32_t b = (c >> 8 * k) & 255;
+                EXPECT_EQ((GetPixelColor(rgb.get(), x, y) >> 8 * k) & 255, sel ? (210 * b + 45 * target[k]) / 255 : b);
+            }
+        }
+    Owned before = clone(gray.get()); // refusals leave the picture alone
+    for (int level : {128, -1, 256, INT32_MIN})
+        EXPECT_EQ(ColorFilter1(gray.get(), level) + ColorFilter_zanto(gray.get(), level), 0);
+    EXPECT_EQ(ColorFilter1(rgb.get(), 200) + ColorFilter_zanto(rgb.get(), 200) + ColorFilter_zanto(nullptr, 200), 0);
+    EXPECT_EQ(ColorFilter(rgb.get(), 0, nullptr) + ColorFilter(gray.get(), 0, rgb.get()), 0);
+    EXPECT_EQ(ColorFilter24(gray.get(), 0, nullptr) + ColorFilter24(rgb.get(), 0, rgb.get()), 0);
+    EXPECT_EQ(diff(gray.get(), before.get()), "");
 }
 
 } // namespace

@@ -20,11 +20,10 @@ using PX = std::unique_ptr<PXImage, PXDeleter>;
 inline size_t px_size(const PXImage *im) { return size_t(im->width) * im->height * (im->bitcount / 8); }
 
 inline PX px_make(int32_t w, int32_t h, int32_t bits, uint8_t fill = 0) {
-    auto *im = static_cast<PXImage *>(PX_malloc(sizeof(PXImage)));
-    *im = {w, h, bits, nullptr};
-    im->data = static_cast<uint8_t *>(PX_malloc(px_size(im)));
-    std::memset(im->data, fill, px_size(im));
-    return PX(im);
+    PX im(static_cast<PXImage *>(PX_malloc(sizeof(PXImage))));
+    *im = {w, h, bits, static_cast<uint8_t *>(PX_malloc(size_t(w) * h * (bits / 8)))};
+    std::memset(im->data, fill, px_size(im.get()));
+    return im;
 }
 
 inline PX px_random(int32_t w, int32_t h, int32_t bits, uint32_t seed) {
@@ -61,12 +60,8 @@ inline int32_t neighbour(const PXImage *im, int32_t y, int32_t x, int32_t dy, in
 
 inline void put_sample(PXImage *im, int32_t y, int32_t x, int32_t c, int32_t v) {
     const size_t p = size_t(y) * im->width + x;
-    if (im->bitcount == 16) {
-        im->data[2 * p] = uint8_t(v);
-        im->data[2 * p + 1] = uint8_t(v >> 8);
-    } else {
-        im->data[p * (im->bitcount / 8) + c] = uint8_t(v);
-    }
+    if (im->bitcount == 16) im->data[2 * p + 1] = uint8_t(v >> 8);
+    im->data[im->bitcount == 16 ? 2 * p : p * (im->bitcount / 8) + c] = uint8_t(v);
 }
 
 } // namespace pxtest
