@@ -38,26 +38,19 @@ inline Owned ref_mask(const Image *src) {
             const int b = ch(c, 0), g = ch(c, 8), r = ch(c, 16);
             SetPixelIndex(m.get(), x, y, r >= g && r >= b && r > 49 ? g : 0);
         }
-    for (int32_t y = 0; y < h; ++y) {
-        int32_t run = 0;
-        for (int32_t x = 0; x < w; ++x) {
-            if (GetPixelIndex(m.get(), x, y) != 0 && x < w - 1) {
-                ++run;
-            } else {
-                if (run >= 1 && run <= 19)
-                    for (int32_t i = x - run; i < x; ++i)
-                        SetPixelIndex(m.get(), i, y, 0);
-                run = 0;
+    for (int32_t y = 0; y < h; ++y) // skin runs of 1 to 19 go; the last column ends a run
+        for (int32_t x = 0, run = 0; x < w; ++x, ++run)
+            if (GetPixelIndex(m.get(), x, y) == 0 || x == w - 1) {
+                for (int32_t i = x - run; i < x && run <= 19; ++i)
+                    SetPixelIndex(m.get(), i, y, 0);
+                run = -1;
             }
-        }
-    }
     for (int32_t y = 5; y < h - 6; ++y)
         for (int32_t x = 5; x < w - 6; ++x) {
-            bool zero = false;
-            for (int32_t dy = -5; dy <= 5 && !zero; ++dy)
-                for (int32_t dx = -5; dx <= 5 && !zero; ++dx)
-                    zero = GetPixelIndex(m.get(), x + dx, y + dy) == 0;
-            if (zero) SetPixelIndex(m.get(), x, y, 1);
+            int zeros = 0;
+            for (int32_t d = 0; d < 121; ++d)
+                zeros += GetPixelIndex(m.get(), x + d % 11 - 5, y + d / 11 - 5) == 0;
+            if (zeros) SetPixelIndex(m.get(), x, y, 1);
         }
     for (int32_t y = 1; y < h - 1; ++y)
         for (int32_t x = 1; x < w - 1; ++x)
