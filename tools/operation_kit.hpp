@@ -32,7 +32,7 @@ template <class Fn> Image *in_place(const Image *in, Fn &&change) {
 // A coordinate at `percent` of a picture's width (or height).
 inline int32_t at(const Image *in, double percent, bool across) {
     const int32_t n = across ? in->width : in->height;
-    const int32_t v = static_cast<int32_t>(percent * n / 100.0);
+    const int32_t v = saturate(percent * n / 100.0);
     return v >= n ? n - 1 : v;
 }
 

@@ -28,10 +28,19 @@ struct Param {
     std::string_view help;
 };
 
+// v truncated toward zero and held to the 32-bit range (NaN gives 0), so that
+// any value, even one outside a parameter's range, converts safely.
+inline int32_t saturate(double v) {
+    if (!(v == v)) return 0;
+    if (v <= -2147483648.0) return INT32_MIN;
+    if (v >= 2147483647.0) return INT32_MAX;
+    return static_cast<int32_t>(v);
+}
+
 // Parameter values in the order of Operation::params.
 struct Args {
     std::vector<double> values;
-    int32_t i(size_t k) const { return static_cast<int32_t>(values[k]); }
+    int32_t i(size_t k) const { return saturate(values[k]); }
     float f(size_t k) const { return static_cast<float>(values[k]); }
 };
 

@@ -320,7 +320,8 @@ void add_retouch(std::vector<Operation> &t) {
                  kColour,
                  [](const Image *in, const Args &a) {
                      const int32_t x = at(in, a.values[0], true), y = at(in, a.values[1], false), r = a.i(2);
-                     const int32_t xs[3] = {x - r, x, x + r}, ys[3] = {y, y + r / 4, y};
+                     const int32_t xs[3] = {saturate(double(x) - r), x, saturate(double(x) + r)};
+                     const int32_t ys[3] = {y, saturate(double(y) + r / 4), y};
                      return in_place(in, [&](Image *p) { return alg_QuHeiYanQuan_1(p, xs, ys, 3, r, a.i(3)) == 1; });
                  }});
 }

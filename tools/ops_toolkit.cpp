@@ -14,9 +14,12 @@ namespace {
 
 constexpr uint32_t kPacked = kGray8 | kWord16 | kBgr24; // formats most toolkit operations take
 
+// Largest result, in pixels, that the resizing entries make (256 megapixels).
+constexpr int64_t kMaxResult = int64_t{1} << 28;
+
 // A rectangle from percentages of the picture (bottom-up: top is the larger row).
 PXRect rect_of(const PXImage *p, const Args &a, size_t first) {
-    auto px = [&](size_t k, int32_t n) { return static_cast<int32_t>(a.values[first + k] * (n - 1) / 100.0); };
+    auto px = [&](size_t k, int32_t n) { return saturate(a.values[first + k] * (n - 1) / 100.0); };
     return {px(0, p->width), px(1, p->height), px(2, p->width), px(3, p->height)};
 }
 
@@ -61,8 +64,9 @@ void add_toolkit(std::vector<Operation> &t) {
                   {"height", false, 5, 400, 150, "percent of the height"}},
                  kPacked,
                  [](const Image *in, const Args &a) {
-                     const int32_t w = std::max(1, static_cast<int32_t>(in->width * a.values[0] / 100));
-                     const int32_t h = std::max(1, static_cast<int32_t>(in->height * a.values[1] / 100));
+                     const int32_t w = std::max(1, saturate(in->width * a.values[0] / 100));
+                     const int32_t h = std::max(1, saturate(in->height * a.values[1] / 100));
+                     if (static_cast<int64_t>(w) * h > kMaxResult) return static_cast<Image *>(nullptr);
                      return packed_new(in, [&](const PXImage *p) { return PXImage_Resize(p, w, h); });
                  },
                  false});
@@ -73,8 +77,9 @@ void add_toolkit(std::vector<Operation> &t) {
                  {{"scale", false, 0.25, 4, 1.5, "source coordinate = destination coordinate / scale"}},
                  kGray8,
                  [](const Image *in, const Args &a) {
-                     const int32_t w = std::max(1, static_cast<int32_t>(in->width * a.values[0]));
-                     const int32_t h = std::max(1, static_cast<int32_t>(in->height * a.values[0]));
+                     const int32_t w = std::max(1, saturate(in->width * a.values[0]));
+                     const int32_t h = std::max(1, saturate(in->height * a.values[0]));
+                     if (static_cast<int64_t>(w) * h > kMaxResult) return static_cast<Image *>(nullptr);
                      PXImage *src = kit::to_packed(in);
                      PXImage dst = {w, h, 8, static_cast<uint8_t *>(PX_malloc(static_cast<size_t>(w) * h))};
                      Image *out = nullptr;
