@@ -31,8 +31,6 @@ template <class Sum, class At> Sum clamped_sum(int64_t a, int64_t b, int32_t n, 
     return s;
 }
 
-int32_t clamp_index(int64_t i, int32_t n) { return static_cast<int32_t>(std::clamp<int64_t>(i, 0, n - 1)); }
-
 // mean = sum / size^2 (truncating) + offset, clamped; through a table of every
 // possible sum when that table is small.
 template <class Sum> struct Mean {
@@ -64,8 +62,8 @@ void row_means(const Sum *col, int32_t w, const Box &box, const Mean<Sum> &mean,
         out[k] = mean(s[k]);
     }
     for (int32_t x = 1; x < w; ++x) {
-        const Sum *in = col + Bpp * clamp_index(box.last(x), w);
-        const Sum *gone = col + Bpp * clamp_index(box.first(x) - 1, w);
+        const Sum *in = col + Bpp * clamp_coord(box.last(x), w);
+        const Sum *gone = col + Bpp * clamp_coord(box.first(x) - 1, w);
         for (int k = 0; k < Bpp; ++k) {
             s[k] += in[k] - gone[k];
             out[Bpp * x + k] = mean(s[k]);
@@ -83,8 +81,8 @@ void running_box(const Image *src, Image *dst, const Box &box, const Mean<Sum> &
     }
     row_means<Sum, Bpp>(col, w, box, mean, row_ptr(dst, 0));
     for (int32_t y = 1; y < h; ++y) {
-        const uint8_t *in = row_ptr(src, clamp_index(box.last(y), h));
-        const uint8_t *gone = row_ptr(src, clamp_index(box.first(y) - 1, h));
+        const uint8_t *in = row_ptr(src, clamp_coord(box.last(y), h));
+        const uint8_t *gone = row_ptr(src, clamp_coord(box.first(y) - 1, h));
         for (size_t j = 0; j < n; ++j)
             col[j] += static_cast<Sum>(in[j]) - static_cast<Sum>(gone[j]);
         row_means<Sum, Bpp>(col, w, box, mean, row_ptr(dst, y));

@@ -10,8 +10,6 @@ using namespace pxfx;
 
 namespace {
 
-int32_t clamp_coord(int32_t v, int32_t n) { return v < 0 ? 0 : (v >= n ? n - 1 : v); }
-
 bool inside(const Image *im, int32_t x, int32_t y) { return x >= 0 && y >= 0 && x < im->width && y < im->height; }
 
 // Converting copy: walks dst, reading src with clamping. A 32-bit destination

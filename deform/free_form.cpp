@@ -38,7 +38,7 @@ bool inside(const DeformationPair &p, int32_t w, int32_t h) {
 // coordinates; (0, 0) when the weights vanish.
 PXPoint centroid(double s, double sx, double sy) {
     if (s < 1e-6) return {0, 0};
-    return {trunc_i32(sx / s + 0.5), trunc_i32(sy / s + 0.5)};
+    return {trunc_sat<int32_t>(sx / s + 0.5), trunc_sat<int32_t>(sy / s + 0.5)};
 }
 
 struct Warp {

@@ -37,7 +37,8 @@ Coord inside_source(const Circle &c, int32_t x, int32_t y, int64_t dx, int64_t d
     if (c.mode >= 4) return {static_cast<int64_t>(x) + (x & 31) - 16, y};
     const double theta = std::atan2(static_cast<double>(dy), static_cast<double>(dx));
     if (c.mode == kCylinder)
-        return {trunc_i32(std::fabs(theta * c.width / kTurn)), trunc_i32(std::fabs(r * c.height / c.radius))};
+        return {trunc_sat<int32_t>(std::fabs(theta * c.width / kTurn)),
+                trunc_sat<int32_t>(std::fabs(r * c.height / c.radius))};
     double rr = r * r / c.radius; // punch, and every negative mode
     double th = theta;
     if (c.mode == kPinch) {
@@ -46,8 +47,8 @@ Coord inside_source(const Circle &c, int32_t x, int32_t y, int64_t dx, int64_t d
         rr = r;
         th = theta + r / c.factor;
     }
-    return {c.cx + static_cast<int64_t>(trunc_i32(rr * std::cos(th))),
-            c.cy - static_cast<int64_t>(trunc_i32(rr * std::sin(th)))};
+    return {c.cx + static_cast<int64_t>(trunc_sat<int32_t>(rr * std::cos(th))),
+            c.cy - static_cast<int64_t>(trunc_sat<int32_t>(rr * std::sin(th)))};
 }
 
 template <class S, class D> void circle_transform(const Image *src, Image *dst, const Circle &c) {

@@ -42,8 +42,6 @@ template <class F> void mosaic(const Image *src, Image *dst, int64_t n) {
     }
 }
 
-int32_t clamp_coord(int64_t v, int32_t n) { return v < 0 ? 0 : (v >= n ? n - 1 : static_cast<int32_t>(v)); }
-
 // Each pixel takes the colour at (x + a, y + b), clamped, for two draws a, b
 // of PX_rand(range) in that order; a is reset to 0 when either is negative.
 template <class F> void aquarelle(const Image *src, Image *dst, int32_t range) {

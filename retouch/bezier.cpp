@@ -3,15 +3,9 @@
 
 #include <cstdint>
 
-namespace {
+#include "core/internal/math.hpp"
 
-// Truncation toward zero, saturated to the 32-bit range (NaN gives 0).
-int32_t to_int(float v) {
-    if (!(v == v)) return 0;
-    if (v >= 2147483648.0f) return INT32_MAX;
-    if (v <= -2147483648.0f) return INT32_MIN;
-    return static_cast<int32_t>(v);
-}
+namespace {
 
 // One coordinate: power-basis coefficients in single precision, the first two
 // formed in double.
@@ -21,7 +15,7 @@ int32_t coordinate(int32_t p0, int32_t p1, int32_t p2, int32_t p3, float t) {
     const float a = static_cast<float>(static_cast<int64_t>(p3) - p0) - c - b;
     const float t2 = t * t;
     const float t3 = t2 * t;
-    return to_int(a * t3 + b * t2 + c * t + static_cast<float>(p0));
+    return pxfx::trunc_sat<int32_t>(a * t3 + b * t2 + c * t + static_cast<float>(p0));
 }
 
 } // namespace

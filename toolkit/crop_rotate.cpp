@@ -17,8 +17,6 @@ bool geometry_input_ok(const PXImage *src) {
     return px_usable(src) && (src->bitcount == 8 || src->bitcount == 16 || src->bitcount == 24);
 }
 
-int32_t clamp_coord(int32_t v, int32_t n) { return v < 0 ? 0 : (v >= n ? n - 1 : v); }
-
 constexpr int32_t kTile = 32;
 
 // Quarter turn of a w x h picture into rows of `outWidth` pixels. With

@@ -11,6 +11,7 @@
 #include <limits>
 
 #include "core/internal/image_check.hpp"
+#include "core/internal/math.hpp"
 
 namespace pxfx::packed {
 
@@ -61,18 +62,6 @@ inline PXImage *px_new(int64_t width, int64_t height, int32_t bitcount) {
     im->height = static_cast<int32_t>(height);
     im->bitcount = bitcount;
     return im;
-}
-
-// Float to integer conversion by truncation that saturates at the limits of
-// T and maps NaN to 0 (the behaviour of the ARM conversion instructions),
-// so no value is undefined.
-template <class T, class F> inline T trunc_sat(F v) {
-    if (std::isnan(v)) return 0;
-    constexpr F lo = static_cast<F>(std::numeric_limits<T>::min());
-    constexpr F hi = static_cast<F>(std::numeric_limits<T>::max());
-    if (v <= lo) return std::numeric_limits<T>::min();
-    if (v >= hi) return std::numeric_limits<T>::max();
-    return static_cast<T>(v);
 }
 
 // 16-bit samples are little-endian words.

@@ -20,8 +20,6 @@ struct Tap {
     float w, omw;   // weight of i1 and 1 - weight
 };
 
-int32_t clamp_index(int64_t v, int32_t n) { return v < 0 ? 0 : (v >= n ? n - 1 : static_cast<int32_t>(v)); }
-
 } // namespace
 
 bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
@@ -32,7 +30,7 @@ bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, 
         const float fx = static_cast<float>(j) / rx;
         const int32_t x0 = trunc_sat<int32_t>(fx);
         const float wx = fx - static_cast<float>(x0);
-        cols[j] = {clamp_index(x0, srcWidth), clamp_index(int64_t{x0} + 1, srcWidth), wx, 1.0f - wx};
+        cols[j] = {clamp_coord(x0, srcWidth), clamp_coord(int64_t{x0} + 1, srcWidth), wx, 1.0f - wx};
     }
     // Horizontally interpolated source rows, cached in two slots by row
     // parity: consecutive output rows mostly reuse one or both.
@@ -55,7 +53,7 @@ bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, 
     for (int32_t i = 0; i < dstHeight; ++i) {
         const float fy = static_cast<float>(i) / ry;
         const int32_t y0 = trunc_sat<int32_t>(fy);
-        const int32_t Y0 = clamp_index(y0, srcHeight), Y1 = clamp_index(int64_t{y0} + 1, srcHeight);
+        const int32_t Y0 = clamp_coord(y0, srcHeight), Y1 = clamp_coord(int64_t{y0} + 1, srcHeight);
         // The vertical weight comes from the clamped row, so it exceeds 1
         // where the clamp held.
         const float wy = fy - static_cast<float>(Y0);

@@ -13,22 +13,20 @@ namespace {
 constexpr int32_t kNoThreshold = 120;
 constexpr int32_t kWhiteLevel = 250;
 
-int64_t clamp_index(int64_t v, int64_t n) { return v < 0 ? 0 : (v >= n ? n - 1 : v); }
-
 // Rounded mean of nine samples, (2 sum + 9) / 18, whatever the number of
 // samples visited: three rows from y - 1 and a column walk from x - 1 while
 // the column is at most x + 1, each index clamped and the next one the
 // clamped index + 1. The walk stops after three columns, which ends it at the
 // right edge where the clamped column would stay at or below x + 1 for ever.
 // `at(row, column)` returns the sample, 0 outside the picture's block.
-template <class At> int32_t reference(int64_t x, int64_t y, int64_t w, int64_t h, At at) {
+template <class At> int32_t reference(int64_t x, int64_t y, int32_t w, int32_t h, At at) {
     int32_t sum = 0;
     int64_t r = y - 1;
     for (int32_t i = 0; i < 3; ++i) {
-        const int64_t R = clamp_index(r, h);
+        const int64_t R = clamp_coord(r, h);
         int64_t c = x - 1;
         for (int32_t j = 0; j < 3 && c <= x + 1; ++j) {
-            const int64_t C = clamp_index(c, w);
+            const int64_t C = clamp_coord(c, w);
             sum += at(R, C);
             c = C + 1;
         }
@@ -55,7 +53,8 @@ int32_t balance_colour(PXImage *img, const PXPoint *pt) {
     if (!plane) return 0;
     uint8_t table[3][256];
     for (int32_t b = 0; b < 3; ++b) {
-        const int32_t ref = reference(pt->x, pt->y, w, h, [&](int64_t r, int64_t c) { return d[(r * w + c) * 3 + b]; });
+        const int32_t ref = reference(pt->x, pt->y, img->width, img->height,
+                                      [&](int64_t r, int64_t c) { return d[(r * w + c) * 3 + b]; });
         for (size_t i = 0; i < pixels; ++i)
             plane[i] = d[3 * i + b];
         const int32_t threshold =
@@ -75,7 +74,7 @@ int32_t balance_colour(PXImage *img, const PXPoint *pt) {
 int32_t balance_gray(PXImage *img, const PXPoint *pt) {
     const int64_t w = img->width, h = img->height, n = w * h;
     uint8_t *d = img->data;
-    const int32_t ref = reference(pt->x, pt->y, w, h, [&](int64_t r, int64_t c) {
+    const int32_t ref = reference(pt->x, pt->y, img->width, img->height, [&](int64_t r, int64_t c) {
         const int64_t k = r * w + c * 3 + 1;
         return k < n ? d[k] : 0;
     });

@@ -2,13 +2,30 @@
 // functions of core/math.cpp are thin wrappers over these.
 #pragma once
 
+#include <cmath>
 #include <cstdint>
+#include <limits>
 
 namespace pxfx {
 
 constexpr uint8_t clamp_u8(int32_t v) { return v > 255 ? 255 : (v < 0 ? 0 : static_cast<uint8_t>(v)); }
 
 template <class T> constexpr T clamp_to(T v, T lo, T hi) { return v < lo ? lo : (v > hi ? hi : v); }
+
+// A coordinate held to 0 .. n - 1 (n > 0), as the pixel readers clamp.
+constexpr int32_t clamp_coord(int64_t v, int32_t n) { return v < 0 ? 0 : (v >= n ? n - 1 : static_cast<int32_t>(v)); }
+
+// Floating-point value truncated toward zero into T, saturating at T's limits
+// and giving 0 for NaN (what the ARM conversion instructions do), so that no
+// conversion is undefined. Values whose truncation fits convert as a cast.
+template <class T, class F> inline T trunc_sat(F v) {
+    if (std::isnan(v)) return 0;
+    constexpr F lo = static_cast<F>(std::numeric_limits<T>::min());
+    constexpr F hi = static_cast<F>(std::numeric_limits<T>::max());
+    if (v <= lo) return std::numeric_limits<T>::min();
+    if (v >= hi) return std::numeric_limits<T>::max();
+    return static_cast<T>(v);
+}
 
 // Bit-by-bit square root over 32 bits, rounded to the nearest integer.
 constexpr uint32_t isqrt_round(uint32_t x) {

@@ -20,6 +20,8 @@
 #include <cstddef>
 #include <cstdint>
 
+#include "core/internal/math.hpp"
+
 namespace pxfx {
 
 inline constexpr uint32_t kOpaque = 0xFF000000u;
@@ -146,8 +148,7 @@ template <class F> struct Sampler {
     const Image *im;
     int32_t w, h;
     explicit Sampler(const Image *image) : im(image), w(image->width), h(image->height) {}
-    static int32_t clamp(int32_t v, int32_t n) { return v < 0 ? 0 : (v >= n ? n - 1 : v); }
-    uint32_t at(int32_t x, int32_t y) const { return F::load(F::crow(im, clamp(y, h)), clamp(x, w)); }
+    uint32_t at(int32_t x, int32_t y) const { return F::load(F::crow(im, clamp_coord(y, h)), clamp_coord(x, w)); }
 };
 
 } // namespace pxfx
