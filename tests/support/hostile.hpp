@@ -1,0 +1,258 @@
+// Hostile-input contracts. One table entry per exported picture function says
+// which bit counts it accepts, how many pictures it reads and what it returns
+// on failure; the checks below feed it every kind of broken record, pictures
+// of mismatched sizes, extreme parameters and failing allocations.
+//
+// A function "refuses" when it returns its failure result, leaves its result
+// slot empty and changes none of its inputs (records and pixel bytes). Every
+// record, good or broken, points at a block of exactly the bytes it claims
+// (or at a small block when the claim is huge), so a function that reads
+// without checking is caught by the sanitizers.
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <climits>
+#include <cstring>
+#include <functional>
+#include <memory>
+#include <random>
+#include <string>
+#include <vector>
+
+#include "support/alloc_failures.hpp"
+#include "support/test_images.hpp"
+
+namespace pxtest::hostile {
+
+// A caller's record with the block it points at.
+template <class R> struct Held {
+    std::string what;
+    R record{};
+    std::vector<uint8_t> block;
+    // Record and pixel bytes, to prove a call changed nothing.
+    std::vector<uint8_t> snapshot() const {
+        std::vector<uint8_t> s(sizeof(R));
+        std::memcpy(s.data(), &record, sizeof(R));
+        s.insert(s.end(), block.begin(), block.end());
+        return s;
+    }
+};
+template <class R> using HeldPtr = std::unique_ptr<Held<R>>;
+
+inline std::vector<uint8_t> noise(size_t bytes, uint32_t seed) {
+    std::vector<uint8_t> v(bytes);
+    std::mt19937 rng(seed);
+    for (auto &b : v)
+        b = static_cast<uint8_t>(rng() >> 24);
+    return v;
+}
+
+// Rows padded to 4 bytes, as malloc_Image lays them out (4 bytes for bit counts
+// without a row size).
+inline uint32_t padded_pitch(int64_t width, uint32_t bitCount) {
+    const uint64_t bits = static_cast<uint64_t>(width > 0 ? width : 1) * (bitCount ? bitCount : 8);
+    return static_cast<uint32_t>(((bits + 31) / 32) * 4);
+}
+
+inline HeldPtr<Image> held(std::string what, int32_t w, int32_t h, uint32_t bitCount, uint32_t pitch, size_t bytes,
+                           uint32_t seed) {
+    auto r = std::make_unique<Held<Image>>();
+    r->what = std::move(what);
+    r->block = noise(bytes, seed);
+    r->record = Image{w, h, bitCount, bytes ? r->block.data() : nullptr, pitch, 0};
+    return r;
+}
+
+inline HeldPtr<PXImage> held(std::string what, int32_t w, int32_t h, int32_t bitCount, size_t bytes, uint32_t seed) {
+    auto r = std::make_unique<Held<PXImage>>();
+    r->what = std::move(what);
+    r->block = noise(bytes, seed);
+    r->record = PXImage{w, h, bitCount, bytes ? r->block.data() : nullptr};
+    return r;
+}
+
+// A usable picture of w x h at a bit count, filled with noise.
+template <class R> HeldPtr<R> good(int32_t w, int32_t h, int32_t bitCount, uint32_t seed) {
+    if constexpr (std::is_same_v<R, Image>) {
+        const uint32_t pitch = padded_pitch(w, bitCount);
+        return held("good", w, h, bitCount, pitch, size_t(pitch) * h, seed);
+    } else {
+        return held("good", w, h, bitCount, size_t(w) * h * std::max(1, (bitCount + 7) / 8), seed);
+    }
+}
+
+inline constexpr int32_t kBitCountsTried[] = {0, 1, 4, 8, 12, 16, 24, 32, 48};
+
+// Every broken record for a function working on the given bit counts: null
+// pixels, zero, negative and overflowing sizes, pitches below a row, and each
+// bit count it does not accept.
+template <class R> std::vector<HeldPtr<R>> broken(const std::vector<int32_t> &formats) {
+    const int32_t bc = formats.front();
+    std::vector<HeldPtr<R>> v;
+    for (int32_t other : kBitCountsTried)
+        if (std::find(formats.begin(), formats.end(), other) == formats.end()) {
+            v.push_back(good<R>(9, 7, other, 1));
+            v.back()->what = "bit count " + std::to_string(other);
+        }
+    if constexpr (std::is_same_v<R, Image>) {
+        const uint32_t row = padded_pitch(9, bc);
+        v.push_back(held("null pixels", 9, 7, bc, row, 0, 0));
+        v.push_back(held("zero width", 0, 7, bc, row, size_t(row) * 7, 2));
+        v.push_back(held("negative height", 9, -7, bc, row, 64, 3));
+        v.push_back(held("INT_MIN width", INT_MIN, 7, bc, row, 64, 4));
+        v.push_back(held("block over 2^32 bytes", 65536, 65536, bc, padded_pitch(65536, bc), 64, 5));
+        v.push_back(held("INT_MAX height", 9, INT_MAX, bc, row, 64, 6));
+        if (bc >= 8) v.push_back(held("pitch below a row", 9, 7, bc, 9 * bc / 8 - 1, size_t(9 * bc / 8 - 1) * 7, 7));
+        v.push_back(held("zero pitch", 9, 7, bc, 0, 64, 8));
+    } else {
+        const size_t bytes = size_t(9) * 7 * std::max(1, (bc + 7) / 8);
+        v.push_back(held("null pixels", 9, 7, bc, 0, 0));
+        v.push_back(held("zero width", 0, 7, bc, bytes, 2));
+        v.push_back(held("negative height", 9, -7, bc, 64, 3));
+        v.push_back(held("INT_MIN width", INT_MIN, 7, bc, 64, 4));
+        v.push_back(held("block over 2^32 bytes", 65536, 65536, bc, 64, 5));
+        v.push_back(held("INT_MAX height", 9, INT_MAX, bc, 64, 6));
+    }
+    return v;
+}
+
+// What a table entry's call sees.
+template <class R> struct Call {
+    R *a = nullptr;   // first picture
+    R *b = nullptr;   // second picture (two-picture functions)
+    R *out = nullptr; // the picture the function returned or put in the slot
+    R **slot = &out;  // the result slot handed to the function
+    int32_t p = 0;    // the parameter under test
+};
+
+// The failure result of functions that return nothing.
+inline constexpr int64_t kNoResult = INT64_MIN;
+
+template <class R> struct Contract {
+    const char *name;
+    std::vector<int32_t> formats;           // bit counts of the first picture it works on
+    std::function<int64_t(Call<R> &)> call; // runs the function, returns its result
+    int64_t failure = 0;                    // its failure result (kNoResult for void functions)
+    int pictures = 1;                       // pictures it reads: a, then b
+    std::vector<int32_t> formats_b;         // bit counts of b (empty: as a)
+    bool slot = true;                       // a null result slot is refused
+    bool mismatch_fails = false;            // pictures of different sizes are refused
+    bool keeps_result_on_failure = false;   // a failed working allocation leaves the prepared result
+    int32_t typical = 3;                    // an ordinary parameter value
+};
+
+inline constexpr int32_t kExtremes[] = {INT_MIN, -70000, -256, -1, 0, 1, 2, 255, 256, 70000, INT_MAX};
+
+template <class R> void release(R *&im) {
+    if constexpr (std::is_same_v<R, Image>) {
+        free_Image(&im, 0);
+    } else {
+        PXImage_Free(im);
+        im = nullptr;
+    }
+}
+
+template <class R> struct Runner {
+    const Contract<R> &c;
+    // Calls the function and releases its result; returns the result and
+    // whether a picture came back.
+    std::pair<int64_t, bool> run(R *a, R *b, int32_t p, bool nullSlot = false) {
+        Call<R> call{a, b};
+        call.p = p;
+        if (nullSlot) call.slot = nullptr;
+        const int64_t r = c.call(call);
+        const bool made = call.out != nullptr;
+        release(call.out);
+        return {r, made};
+    }
+    void expect_refused(R *a, R *b, bool nullSlot, const std::vector<const Held<R> *> &inputs, const std::string &why) {
+        std::vector<std::vector<uint8_t>> before;
+        for (auto *h : inputs)
+            before.push_back(h->snapshot());
+        const auto [r, made] = run(a, b, c.typical, nullSlot);
+        if (c.failure != kNoResult) {
+            EXPECT_EQ(r, c.failure) << c.name << ": " << why;
+        }
+        EXPECT_FALSE(made) << c.name << ": " << why;
+        for (size_t i = 0; i < inputs.size(); ++i)
+            EXPECT_TRUE(inputs[i]->snapshot() == before[i]) << c.name << ": " << why << " changed an input";
+    }
+    int32_t format_b(int32_t fa) const { return c.formats_b.empty() ? fa : c.formats_b.front(); }
+};
+
+// Null records, broken records in every picture position and (where refused)
+// a null slot or pictures of different sizes: each refused.
+template <class R> void expect_refusals(const Contract<R> &c) {
+    Runner<R> run{c};
+    const int32_t fa = c.formats.front(), fb = run.format_b(fa);
+    auto a = good<R>(9, 7, fa, 11), b = good<R>(9, 7, fb, 12);
+    R *second = c.pictures > 1 ? &b->record : nullptr;
+    run.expect_refused(nullptr, second, false, {b.get()}, "null first picture");
+    for (auto &bad : broken<R>(c.formats))
+        run.expect_refused(&bad->record, second, false, {bad.get(), b.get()}, bad->what);
+    if (c.pictures > 1) {
+        run.expect_refused(&a->record, nullptr, false, {a.get()}, "null second picture");
+        for (auto &bad : broken<R>(c.formats_b.empty() ? c.formats : c.formats_b))
+            run.expect_refused(&a->record, &bad->record, false, {a.get(), bad.get()}, "second: " + bad->what);
+        if (c.mismatch_fails) {
+            auto odd = good<R>(5, 11, fb, 13);
+            run.expect_refused(&a->record, &odd->record, false, {a.get(), odd.get()}, "pictures of different sizes");
+        }
+    }
+    if (c.slot) run.expect_refused(&a->record, second, true, {a.get(), b.get()}, "null slot");
+}
+
+// Every accepted bit count at awkward sizes, with the parameter at extremes
+// and pictures of different sizes: nothing to check but that memory stays
+// whole (the sanitizer build) and the call returns.
+template <class R> void expect_extremes_survive(const Contract<R> &c) {
+    Runner<R> run{c};
+    const std::pair<int32_t, int32_t> sizes[] = {{1, 1}, {2, 5}, {9, 7}};
+    for (int32_t fa : c.formats) {
+        const int32_t fb = c.formats_b.empty() ? fa : c.formats_b.front();
+        for (auto [w, h] : sizes) {
+            auto a = good<R>(w, h, fa, 21), b = good<R>(w, h, fb, 22);
+            for (int32_t p : kExtremes)
+                run.run(&a->record, c.pictures > 1 ? &b->record : nullptr, p);
+        }
+        if (c.pictures > 1) {
+            auto a = good<R>(9, 7, fa, 23), b = good<R>(4, 12, fb, 24);
+            run.run(&a->record, &b->record, c.typical);
+            run.run(&b->record, &a->record, c.typical);
+        }
+    }
+}
+
+// Each allocation of an ordinary call failing in turn: the call fails with its
+// failure result, returns no picture and leaves its inputs as they were, or
+// gets by without the allocation. Leaks are the leak sanitizer's to find.
+template <class R> void expect_allocation_failures_handled(const Contract<R> &c) {
+    if (!pxfx::alloc::injection_available()) return;
+    Runner<R> run{c};
+    const int32_t fa = c.formats.front();
+    auto a = good<R>(9, 7, fa, 31), b = good<R>(9, 7, run.format_b(fa), 32);
+    sweep_allocation_failures([&] {
+        const auto sa = a->snapshot(), sb = b->snapshot();
+        const auto [r, made] = run.run(&a->record, c.pictures > 1 ? &b->record : nullptr, c.typical);
+        if (c.failure != kNoResult && r == c.failure) {
+            if (!c.keeps_result_on_failure) {
+                EXPECT_FALSE(made) << c.name;
+            }
+            EXPECT_TRUE(a->snapshot() == sa && b->snapshot() == sb) << c.name << ": failed but changed an input";
+        }
+    });
+}
+
+// All three checks for every entry of a table.
+template <class R> void check_contracts(const std::vector<Contract<R>> &table) {
+    for (const auto &c : table) {
+        SCOPED_TRACE(c.name);
+        expect_refusals(c);
+        expect_extremes_survive(c);
+        expect_allocation_failures_handled(c);
+    }
+}
+
+} // namespace pxtest::hostile
