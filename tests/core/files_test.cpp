@@ -7,6 +7,9 @@
 #include <iterator>
 #include <vector>
 
+#include <sys/stat.h>
+#include <unistd.h>
+
 #include "support/test_images.hpp"
 
 using namespace pxtest;
@@ -76,8 +79,28 @@ TEST(Files, SaveBmpWritesHeadersPaletteAndRowsAsStored) {
     EXPECT_EQ(saveBmp(path("h.bmp").c_str(), &hollow) + saveBmp(path("h.bmp").c_str(), nullptr), 0);
     EXPECT_TRUE(read(path("h.bmp")).empty());
     EXPECT_EQ(saveBmp(path("none/x.bmp").c_str(), im.get()), 0);
+    EXPECT_EQ(saveBmp(dir.c_str(), im.get()), 0);                               // a directory
+    EXPECT_EQ(saveBmp(("/tmp/" + std::string(251, 'c')).c_str(), im.get()), 0); // 256 bytes
     EXPECT_EQ(saveBmp((dir + std::string(300, 'c')).c_str(), im.get()), 0);
     std::remove(path("a.bmp").c_str());
+}
+
+TEST(Files, FilesWithoutPermissionAreRefused) {
+    const std::string locked = path("locked");
+    std::ofstream(locked) << "secret";
+    ASSERT_EQ(chmod(locked.c_str(), 0), 0);
+    Owned im = make(2, 2, 24);
+    // Root may read and write any file, so the calls run in a child process
+    // that first gives up root.
+    EXPECT_EXIT(
+        {
+            if (geteuid() == 0 && setuid(65534) != 0) std::_Exit(2);
+            int32_t size = 77;
+            const bool unread = PX_ReadMemFile(locked.c_str(), &size) == nullptr && size == 77;
+            std::_Exit(unread && saveBmp(locked.c_str(), im.get()) == 0 ? 0 : 1);
+        },
+        ::testing::ExitedWithCode(0), "");
+    std::remove(locked.c_str());
 }
 
 TEST(Fixtures, BundledPicturesLoadAndRoundTripThroughSaveBmp) {
