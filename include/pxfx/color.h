@@ -114,7 +114,8 @@ PXFX_API int32_t Filter(Image *src, const int32_t *kernel, int32_t size, int32_t
                         const Image *mask, Image *dst, int32_t gray);
 /* 3 x 3 mean into *out (reused when its width, height and bit count match,
  * else replaced). Result of Filter, or 0 for a null src or out, or a src
- * without pixels. The three below follow the same rules. */
+ * without pixels; when Filter's working memory cannot be had, 0 with the
+ * prepared result left in *out. The three below follow the same rules. */
 PXFX_API int32_t PX_IMG_Blur(const Image *src, Image **out);
 /* 3 x 3 soften (centre weight 8, divisor 16) into *out. */
 PXFX_API int32_t PX_IMG_Soften(const Image *src, Image **out);

@@ -35,7 +35,8 @@ PXFX_API uint32_t PX_IMG_Photocopy(Image *src, Image **dst);
 /* Pencil sketch: colour dodge of gray with its blurred negative, darkened along
  * edges; alpha 0. 1 or 0 (a work-buffer failure leaves the prepared result). */
 PXFX_API uint32_t PX_IMG_Sketch(Image *src, Image **dst);
-/* Pencil sketch without the edge term; alpha 0. 1 or 0. */
+/* Pencil sketch without the edge term; alpha 0. 1 or 0 (a work-buffer failure
+ * leaves the prepared result). */
 PXFX_API uint32_t PX_IMG_Sketch_1(Image *src, Image **dst);
 /* Kernel sum at (col, row) of a byte plane, the kernel read column by column;
  * column `width` is read (the next row's first byte), so the plane must be
