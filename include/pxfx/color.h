@@ -6,7 +6,9 @@
  * Packed colours are B in bits 0-7, G 8-15, R 16-23, A 24-31 for RGB. The other
  * spaces keep their first component in bits 16-23, the second in 8-15 and the
  * third in 0-7; alpha passes through. Mode numbers: 1 HSL, 2 YUV, 3 YIQ, 4 XYZ,
- * anything else plain RGB.
+ * anything else plain RGB. Pictures of any bit count are read as GetPixelColor
+ * reads them (unknown bit counts read as opaque black) unless a function says
+ * otherwise.
  */
 #ifndef PXFX_COLOR_H
 #define PXFX_COLOR_H

@@ -8,6 +8,11 @@
  * released and replaced by malloc_Image(width, height, bitCount) (filled with
  * 255). The caller owns the result. A null source gives 0 in every effect of
  * this library. Source and result must be different images.
+ *
+ * Sources of any bit count are accepted unless an effect says otherwise: they
+ * are read as GetPixelColor reads them (bit counts other than 1, 4, 8, 16, 24
+ * and 32 read as opaque black), and a new result has the bit count that
+ * malloc_Image gives for the source's (8 for 1, 4, 12, ...).
  */
 #ifndef PXFX_EFFECTS_H
 #define PXFX_EFFECTS_H
