@@ -142,9 +142,10 @@ PXFX_API int32_t Filter_fast(Image *image, int32_t size, int32_t offset);
 /* Box smoothing by a strength: size min(strength, 100) / 10, nothing for a
  * strength of 3 or less (a plain copy). With out null src itself is smoothed;
  * else src is copied into *out (created when null; an existing image is used
- * whatever its size and bit count) and *out smoothed. Returns 1, or 0 when
- * src has no pixels, *out holds a record without pixels, or *out cannot be
- * made. */
+ * whatever its size and bit count) and *out smoothed (a picture of fewer
+ * than 8 bits is left as it is, as Filter_fast leaves it). Returns 1, or 0
+ * when src has no pixels, *out holds a record without pixels, or *out cannot
+ * be made. */
 PXFX_API int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength);
 
 #ifdef __cplusplus

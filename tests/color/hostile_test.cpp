@@ -50,8 +50,9 @@ TEST(Hostile, ColourPictures) {
 }
 
 TEST(Hostile, HueMasksAndDestinations) {
-    // The packed-colour conversions meet every byte value, 0 and 255 included,
-    // in the model comparison of the conversion tests.
+    // RGBtoHSL, HSLtoRGB, RGBtoYUV, YUVtoRGB, RGBtoYIQ, YIQtoRGB, RGBtoXYZ and
+    // XYZtoRGB meet every byte value, 0 and 255 included, in the model
+    // comparison of the conversion tests; matrixX is checked there too.
     for (uint16_t v : {0, 1, 255, 256, 65535})
         (void)(HueToRGB(v, 65535 - v, v) + HueToRGB(65535 - v, v, 65535 - v));
     // A mask without pixels or with bad geometry is ignored; such a dst is refused.
@@ -59,6 +60,7 @@ TEST(Hostile, HueMasksAndDestinations) {
     auto src = good<Image>(9, 7, 8, 41);
     Owned want = make(9, 7, 8), got = make(9, 7, 8);
     ASSERT_EQ(Filter(&src->record, k3, 3, 16, 0, nullptr, want.get(), 0), 1);
+    EXPECT_EQ(Filter(&src->record, k3, 3, 16, 0, nullptr, make(4, 12, 8).get(), 0), 1); // any dst shape
     for (auto &bad : broken<Image>({8}))
         if (bad->what.rfind("bit count", 0) != 0) { // other bit counts select, or are not written
             ASSERT_EQ(Filter(&src->record, k3, 3, 16, 0, &bad->record, got.get(), 0), 1) << bad->what;

@@ -1,4 +1,5 @@
-// Hostile input for every effect.
+// Hostile input for every effect (temp_ex, on a raw plane, has its null,
+// empty and off-plane cases beside its other tests).
 #include "support/hostile.hpp"
 
 using namespace pxtest::hostile;
