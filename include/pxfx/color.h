@@ -145,7 +145,9 @@ PXFX_API int32_t Filter_fast(Image *image, int32_t size, int32_t offset);
  * whatever its size and bit count) and *out smoothed (a picture of fewer
  * than 8 bits is left as it is, as Filter_fast leaves it). Returns 1, or 0
  * when src has no pixels, *out holds a record without pixels, or *out cannot
- * be made. */
+ * be made; also 0 when the smoothing's working image cannot be made: src is
+ * then unchanged, an *out made by the call released (null), an existing *out
+ * left holding the plain copy. */
 PXFX_API int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength);
 
 #ifdef __cplusplus

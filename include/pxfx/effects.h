@@ -86,7 +86,9 @@ PXFX_API uint32_t PX_IMG_Ballance(Image *src, Image **dst, int32_t contrast);
  * would, then screen-blended over the source; alpha is the source's. The
  * halving and contrast steps are applied in the same pass as the blend (with
  * the rounding of the intermediate format), so the only working image is the
- * blurred one, released on every path. 1 or 0. */
+ * blurred one, released on every path. The blur is made before the result
+ * slot is touched: when its memory cannot be had, 0 with nothing changed.
+ * 1 or 0. */
 PXFX_API uint32_t PX_IMG_Lambency(Image *src, Image **dst);
 
 /* ---- Textures --------------------------------------------------------------------- */
