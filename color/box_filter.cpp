@@ -153,19 +153,24 @@ int32_t Filter_fast(Image *image, int32_t size, int32_t offset) { return box_fil
 int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength) {
     if (!has_pixels(src)) return 0;
     Image *target = const_cast<Image *>(src);
+    bool made = false;
     if (out != nullptr) {
         if (*out == nullptr) {
             *out = malloc_Image(src->width, src->height, static_cast<int32_t>(src->bitCount));
             if (*out == nullptr) return 0;
+            made = true;
         } else if (!has_pixels(*out)) {
             return 0;
         }
         target = *out;
         PX_Img_Copy(target, src);
     }
-    if (strength <= 3) return 1;
-    Filter_fast(target, std::min(strength, 100) / 10, 0);
-    return 1;
+    const int32_t size = strength <= 3 ? 0 : std::min(strength, 100) / 10;
+    // Sizes of 0 and pictures below 8 bits are left as they are; any other
+    // refusal of the box filter is its working image failing.
+    if (size == 0 || target->bitCount < 8 || Filter_fast(target, size, 0) == 1) return 1;
+    if (made) free_Image(out, 0);
+    return 0;
 }
 
 } // extern "C"

@@ -59,8 +59,14 @@ void PX_free(void *block) {
     if (block != nullptr) std::free(block);
 }
 
-void *PX_memcpy(void *dst, const void *src, size_t count) { return std::memcpy(dst, src, count); }
+void *PX_memcpy(void *dst, const void *src, size_t count) {
+    if (dst == nullptr || src == nullptr || count == 0) return dst;
+    return std::memcpy(dst, src, count);
+}
 
-void *PX_memset(void *dst, int32_t value, size_t count) { return std::memset(dst, value, count); }
+void *PX_memset(void *dst, int32_t value, size_t count) {
+    if (dst == nullptr || count == 0) return dst;
+    return std::memset(dst, value, count);
+}
 
 } // extern "C"

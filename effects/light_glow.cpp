@@ -144,10 +144,10 @@ uint32_t PX_IMG_Ballance(Image *src, Image **dst, int32_t contrast) {
 uint32_t PX_IMG_Lambency(Image *src, Image **dst) {
     if (dst == nullptr || !has_pixels(src)) return 0;
     ImagePtr blur = make_image(src->width, src->height, static_cast<int32_t>(src->bitCount));
-    if (!blur) return 0;
+    // Blurred first: when its working memory cannot be had, nothing is touched.
+    if (!blur || Filter(src, kGlowKernel, 3, 16, 0, nullptr, blur.get(), 0) == 0) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
-    Filter(src, kGlowKernel, 3, 16, 0, nullptr, blur.get(), 0);
     // The blurred image has the source's format, or 8 bits for a source of
     // any other bit count (as malloc_Image makes it).
     with_format(src->bitCount, [&](auto f) {

@@ -125,6 +125,12 @@ int32_t GetMaxHtoThrod2(const uint32_t hist[256], int32_t total) {
 
 int32_t BinImg(Image *img, Image **out) {
     if (!is_plane(img)) return 0;
+    // The marking's scratch comes first, so that a failure touches nothing.
+    Buffer<int32_t> scratch;
+    if (img->height > 1) {
+        scratch = lines::line_scratch(img);
+        if (!scratch) return 0;
+    }
     Image *dst = img;
     if (out != nullptr && *out != img) {
         free_Image(out, 0);
@@ -133,7 +139,8 @@ int32_t BinImg(Image *img, Image **out) {
     }
     lines::band_threshold(img, dst);
     lines::remove_isolated_dots(dst);
-    return DetectLines(dst);
+    if (scratch) lines::mark_line_bands(dst, scratch.get());
+    return 1;
 }
 
 } // extern "C"

@@ -6,6 +6,7 @@
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "lines/lines_internal.hpp"
 
 using namespace pxfx;
 
@@ -75,14 +76,18 @@ int32_t CheckMaxSame(const int32_t *labels, int32_t n, int32_t *first, int32_t *
     return best;
 }
 
-int32_t DetectLines(Image *img) {
-    if (!is_plane(img)) return 0;
+} // extern "C"
+
+namespace pxfx::lines {
+
+Buffer<int32_t> line_scratch(const Image *img) {
+    return alloc_buffer<int32_t>(checked_size(static_cast<uint64_t>(img->height - 1), 3));
+}
+
+void mark_line_bands(Image *img, int32_t *scratch) {
     const int32_t height = img->height;
     const int32_t h1 = height - 1, cols = img->width - 10, q = img->width >> 2;
-    if (h1 <= 0) return 1;
-    Buffer<int32_t> scratch = alloc_buffer<int32_t>(checked_size(static_cast<uint64_t>(h1), 3));
-    if (!scratch) return 0;
-    int32_t *a = scratch.get(), *b = a + h1, *c = b + h1;
+    int32_t *a = scratch, *b = a + h1, *c = b + h1;
 
     // Vertical changes per row in the central half.
     int32_t maxChanges = 0;
@@ -160,6 +165,18 @@ int32_t DetectLines(Image *img) {
     }
 
     mark_rows(img, a, c, h1, cols > 0 ? cols : 0);
+}
+
+} // namespace pxfx::lines
+
+extern "C" {
+
+int32_t DetectLines(Image *img) {
+    if (!is_plane(img)) return 0;
+    if (img->height == 1) return 1;
+    Buffer<int32_t> scratch = lines::line_scratch(img);
+    if (!scratch) return 0;
+    lines::mark_line_bands(img, scratch.get());
     return 1;
 }
 

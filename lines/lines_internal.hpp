@@ -38,4 +38,11 @@ void band_threshold(const Image *src, Image *dst);
 // A 1 between two pixels that are not 1 becomes 255.
 void remove_isolated_dots(Image *img);
 
+// Scratch of the line-band marking of a plane of two rows or more (three
+// words per row but one); empty when it cannot be had.
+Buffer<int32_t> line_scratch(const Image *img);
+
+// Marks the line bands of a binarised plane of two rows or more in place.
+void mark_line_bands(Image *img, int32_t *scratch);
+
 } // namespace pxfx::lines

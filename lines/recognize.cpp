@@ -151,7 +151,7 @@ int32_t RecognizeYUV(Image *img, Image **out) {
     lines::detect_boundary(img, line.get());
     lines::straighten(img, line.get(), res.get());
     line.reset();
-    BinImg(res.get(), nullptr);
+    if (BinImg(res.get(), nullptr) == 0) return 0;
     return lines::deliver(img, out, std::move(res));
 }
 
@@ -182,7 +182,10 @@ Image *MyResample2(Image *img, int32_t factor) {
     }
     // The last row lies exactly on the last source row.
     std::memcpy(row_ptr(res, res->height - 1), row_ptr(img, h - 1), static_cast<size_t>(w));
-    RecognizeYUV(res, nullptr);
+    // A plane below the straightening's minimum size is returned as it is; a
+    // straightening that runs out of memory fails the call.
+    if (RecognizeYUV(res, nullptr) == 0 && w >= lines::kMinRecognizeWidth && res->height >= lines::kMinRecognizeHeight)
+        free_Image(&res, 0);
     return res;
 }
 

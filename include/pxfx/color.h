@@ -6,7 +6,9 @@
  * Packed colours are B in bits 0-7, G 8-15, R 16-23, A 24-31 for RGB. The other
  * spaces keep their first component in bits 16-23, the second in 8-15 and the
  * third in 0-7; alpha passes through. Mode numbers: 1 HSL, 2 YUV, 3 YIQ, 4 XYZ,
- * anything else plain RGB.
+ * anything else plain RGB. Pictures of any bit count are read as GetPixelColor
+ * reads them (unknown bit counts read as opaque black) unless a function says
+ * otherwise.
  */
 #ifndef PXFX_COLOR_H
 #define PXFX_COLOR_H
@@ -114,7 +116,8 @@ PXFX_API int32_t Filter(Image *src, const int32_t *kernel, int32_t size, int32_t
                         const Image *mask, Image *dst, int32_t gray);
 /* 3 x 3 mean into *out (reused when its width, height and bit count match,
  * else replaced). Result of Filter, or 0 for a null src or out, or a src
- * without pixels. The three below follow the same rules. */
+ * without pixels; when Filter's working memory cannot be had, 0 with the
+ * prepared result left in *out. The three below follow the same rules. */
 PXFX_API int32_t PX_IMG_Blur(const Image *src, Image **out);
 /* 3 x 3 soften (centre weight 8, divisor 16) into *out. */
 PXFX_API int32_t PX_IMG_Soften(const Image *src, Image **out);
@@ -139,9 +142,12 @@ PXFX_API int32_t Filter_fast(Image *image, int32_t size, int32_t offset);
 /* Box smoothing by a strength: size min(strength, 100) / 10, nothing for a
  * strength of 3 or less (a plain copy). With out null src itself is smoothed;
  * else src is copied into *out (created when null; an existing image is used
- * whatever its size and bit count) and *out smoothed. Returns 1, or 0 when
- * src has no pixels, *out holds a record without pixels, or *out cannot be
- * made. */
+ * whatever its size and bit count) and *out smoothed (a picture of fewer
+ * than 8 bits is left as it is, as Filter_fast leaves it). Returns 1, or 0
+ * when src has no pixels, *out holds a record without pixels, or *out cannot
+ * be made; also 0 when the smoothing's working image cannot be made: src is
+ * then unchanged, an *out made by the call released (null), an existing *out
+ * left holding the plain copy. */
 PXFX_API int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength);
 
 #ifdef __cplusplus

@@ -87,9 +87,9 @@ PXFX_API int32_t PX_Img_CopyAlpha(Image *dst, const Image *src);
 PXFX_API void *PX_malloc(size_t size);
 /* free; null is ignored. */
 PXFX_API void PX_free(void *block);
-/* memcpy. */
+/* memcpy; copies nothing when count is 0 or either pointer is null. Returns dst. */
 PXFX_API void *PX_memcpy(void *dst, const void *src, size_t count);
-/* memset. */
+/* memset; writes nothing when count is 0 or dst is null. Returns dst. */
 PXFX_API void *PX_memset(void *dst, int32_t value, size_t count);
 /* fopen of a copy of the name; null for a null name or one of 256 bytes or more. */
 PXFX_API FILE *PX_fopen(const char *fileName, const char *mode);

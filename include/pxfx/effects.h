@@ -8,6 +8,11 @@
  * released and replaced by malloc_Image(width, height, bitCount) (filled with
  * 255). The caller owns the result. A null source gives 0 in every effect of
  * this library. Source and result must be different images.
+ *
+ * Sources of any bit count are accepted unless an effect says otherwise: they
+ * are read as GetPixelColor reads them (bit counts other than 1, 4, 8, 16, 24
+ * and 32 read as opaque black), and a new result has the bit count that
+ * malloc_Image gives for the source's (8 for 1, 4, 12, ...).
  */
 #ifndef PXFX_EFFECTS_H
 #define PXFX_EFFECTS_H
@@ -35,7 +40,8 @@ PXFX_API uint32_t PX_IMG_Photocopy(Image *src, Image **dst);
 /* Pencil sketch: colour dodge of gray with its blurred negative, darkened along
  * edges; alpha 0. 1 or 0 (a work-buffer failure leaves the prepared result). */
 PXFX_API uint32_t PX_IMG_Sketch(Image *src, Image **dst);
-/* Pencil sketch without the edge term; alpha 0. 1 or 0. */
+/* Pencil sketch without the edge term; alpha 0. 1 or 0 (a work-buffer failure
+ * leaves the prepared result). */
 PXFX_API uint32_t PX_IMG_Sketch_1(Image *src, Image **dst);
 /* Kernel sum at (col, row) of a byte plane, the kernel read column by column;
  * column `width` is read (the next row's first byte), so the plane must be
@@ -80,7 +86,9 @@ PXFX_API uint32_t PX_IMG_Ballance(Image *src, Image **dst, int32_t contrast);
  * would, then screen-blended over the source; alpha is the source's. The
  * halving and contrast steps are applied in the same pass as the blend (with
  * the rounding of the intermediate format), so the only working image is the
- * blurred one, released on every path. 1 or 0. */
+ * blurred one, released on every path. The blur is made before the result
+ * slot is touched: when its memory cannot be had, 0 with nothing changed.
+ * 1 or 0. */
 PXFX_API uint32_t PX_IMG_Lambency(Image *src, Image **dst);
 
 /* ---- Textures --------------------------------------------------------------------- */

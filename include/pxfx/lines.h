@@ -33,13 +33,14 @@ PXFX_API int32_t RecognizeYUV(Image *img, Image **out);
 PXFX_API void ImgDecode(Image *img, Image **out);
 /* Vertical linear resampling by factor (2..49), then RecognizeYUV on it; new image or null.
  * The last row, which lies exactly on the last source row, is a copy of it.
- * When RecognizeYUV refuses the resampled plane it is returned as it is. */
+ * When RecognizeYUV refuses the resampled plane for its size it is returned
+ * as it is; when RecognizeYUV runs out of memory the result is null. */
 PXFX_API Image *MyResample2(Image *img, int32_t factor);
 /* Band thresholding in bands of 37 rows, dot removal and line marking. 1 or 0.
  * With out not null the slot's image is released and replaced by a new plane
  * that receives the work (the input when that allocation fails); a slot that
- * already holds img works in place instead. Returns DetectLines' result, so 0
- * also when its scratch memory cannot be had. */
+ * already holds img works in place instead. The scratch memory of the line
+ * marking is obtained first: when it cannot be had, 0 with nothing touched. */
 PXFX_API int32_t BinImg(Image *img, Image **out);
 /* Marks line bands of a binarised plane with band codes, in place. 1 or 0.
  * A plane of one row has nothing to mark (1). Returns 0, leaving the plane

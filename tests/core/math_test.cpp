@@ -43,9 +43,7 @@ TEST(IntegerMath, DistancesAndClamp) {
     EXPECT_EQ(FastDistance2D(3, 4), 6);
     EXPECT_EQ(FastDistance2D(-100, 0), 100);
     EXPECT_EQ(FastDistance2D(100, -100), 200 - 50 - 25 + 6);
-    (void)FastDistance2D(INT32_MIN, INT32_MIN);
     EXPECT_EQ(ltouc(300) << 16 | ltouc(-7) << 8 | ltouc(128), 0xFF0080);
-    EXPECT_EQ(ltouc(INT32_MIN), 0);
 }
 
 TEST(IntegerMath, TableTrigonometry) {

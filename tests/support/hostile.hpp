@@ -33,9 +33,9 @@ template <class R> struct Held {
     std::vector<uint8_t> block;
     // Record and pixel bytes, to prove a call changed nothing.
     std::vector<uint8_t> snapshot() const {
-        std::vector<uint8_t> s(sizeof(R));
+        std::vector<uint8_t> s(sizeof(R) + block.size());
         std::memcpy(s.data(), &record, sizeof(R));
-        s.insert(s.end(), block.begin(), block.end());
+        std::copy(block.begin(), block.end(), s.begin() + sizeof(R));
         return s;
     }
 };

@@ -1,0 +1,76 @@
+// Hostile input for every core function: the picture functions through the
+// contract table, record creation, memory wrappers and integer math at their
+// extremes.
+#include "support/hostile.hpp"
+
+using namespace pxtest::hostile;
+using C = Call<Image>;
+
+TEST(Hostile, PixelAccessAndCopies) {
+    // Readers and copies take any bit count (unknown ones read as opaque black).
+    const std::vector<int32_t> any = {8, 0, 1, 4, 12, 16, 24, 32, 48}, indexed = {8, 1, 4},
+                               colour = {8, 1, 4, 16, 24, 32};
+    check_contracts<Image>({
+        {.name = "GetPixelIndex",
+         .formats = indexed,
+         .call = [](C &c) { return int64_t(GetPixelIndex(c.a, c.p, c.p)); },
+         .slot = false},
+        {.name = "GetPixelColor",
+         .formats = any,
+         .call = [](C &c) { return int64_t(GetPixelColor(c.a, c.p, ~c.p)); },
+         .slot = false},
+        {.name = "GetPixelGray",
+         .formats = any,
+         .call = [](C &c) { return int64_t(GetPixelGray(c.a, ~c.p, c.p)); },
+         .slot = false},
+        {.name = "SetPixelIndex",
+         .formats = indexed,
+         .call = [](C &c) { return SetPixelIndex(c.a, c.p, c.p, c.p), kNoResult; },
+         .failure = kNoResult,
+         .slot = false},
+        {.name = "SetPixelColor",
+         .formats = colour,
+         .call = [](C &c) { return SetPixelColor(c.a, c.p, c.p, 0x12345678u), kNoResult; },
+         .failure = kNoResult,
+         .slot = false},
+        {.name = "PX_Img_Copy",
+         .formats = any,
+         .call = [](C &c) { return int64_t(PX_Img_Copy(c.a, c.b)); },
+         .pictures = 2,
+         .slot = false},
+        {.name = "PX_Img_CopyAlpha",
+         .formats = {32},
+         .call = [](C &c) { return int64_t(PX_Img_CopyAlpha(c.a, c.b)); },
+         .pictures = 2,
+         .slot = false,
+         .mismatch_fails = true},
+    });
+}
+
+TEST(Hostile, RecordsMemoryAndMath) {
+    const int32_t ws[] = {0, 5, -5, 5, 100000, INT_MAX, INT_MAX, INT_MIN},
+                  hs[] = {5, 0, 5, INT_MIN, 100000, 1, INT_MAX, 1};
+    for (int32_t bc : {8, 32, INT_MIN})
+        for (int i = 0; i < 8; ++i)
+            EXPECT_EQ(malloc_Image(ws[i], hs[i], bc), nullptr) << ws[i] << "x" << hs[i] << "@" << bc;
+    Image *none = nullptr;
+    free_Image(nullptr, 0);
+    free_Image(&none, 1);
+    EXPECT_EQ(PX_malloc(0), nullptr);
+    PX_free(nullptr);
+    EXPECT_EQ(PX_memcpy(nullptr, nullptr, 0), nullptr);
+    EXPECT_EQ(PX_memset(nullptr, 0, 0), nullptr);
+    for (int32_t v : kExtremes) {
+        EXPECT_LE(xxgluSqrtFx(uint32_t(v)), 65536u);
+        EXPECT_EQ(ltouc(v), std::clamp(v, 0, 255));
+        EXPECT_LE(std::abs(int64_t(tsin(v))) + std::abs(int64_t(tcos(v))), 141422) << v;
+        const int64_t r = PX_rand(v);
+        EXPECT_TRUE(v == 0 ? r > -(int64_t(1) << 31) : std::abs(r) < std::abs(int64_t(v))) << v << ": " << r;
+        for (int32_t u : kExtremes) {
+            (void)Distance2D(v, u);
+            (void)FastDistance2D(v, u);
+            const int32_t angle = tatan2(v, u);
+            EXPECT_TRUE(angle >= 0 && angle <= 360) << v << "," << u << ": " << angle;
+        }
+    }
+}
