@@ -138,8 +138,9 @@ int32_t alg_Img_Blending(Image *src, Image **out) {
     Image *tinted = nullptr;
     alg_Blending(src, nullptr, 0, 0, PXTint{201, 189, 203}, 0, &tinted);
     ImagePtr owned(tinted);
-    Image *target = out == nullptr ? (has_pixels(src) ? src : nullptr) : acquire_result(src, out);
-    if (target == nullptr || !owned) return 0;
+    if (!owned) return 0;
+    Image *target = out == nullptr ? src : acquire_result(src, out);
+    if (target == nullptr) return 0;
     PX_Img_Copy(target, owned.get());
     return 1;
 }

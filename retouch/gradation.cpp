@@ -79,7 +79,7 @@ struct LocalScreen {
 };
 
 template <class FS, class FD>
-bool auto_levels(const Image *src, Image *out, const int32_t map[256], int32_t amount, LocalScreen &t) {
+void auto_levels(const Image *src, Image *out, const int32_t map[256], int32_t amount, LocalScreen &t, uint32_t *rows) {
     for (int32_t i = 0; i < 256; ++i)
         t.map[i] = static_cast<uint8_t>(map[i]);
     for (int32_t n = 0; n < 256; ++n)
@@ -89,9 +89,7 @@ bool auto_levels(const Image *src, Image *out, const int32_t map[256], int32_t a
         for (int32_t v = 0; v < 256; ++v)
             t.blend[s][v] = static_cast<uint8_t>((amount * s + (100 - amount) * v) / 100);
     const int32_t w = src->width, h = src->height;
-    Buffer<uint32_t> rows = alloc_buffer<uint32_t>(checked_size(static_cast<uint64_t>(w) + 2, 3));
-    if (!rows) return false;
-    uint32_t *up = rows.get(), *cur = up + (w + 2), *down = cur + (w + 2);
+    uint32_t *up = rows, *cur = up + (w + 2), *down = cur + (w + 2);
     load_row<FS>(src, 0, cur);
     load_row<FS>(src, h > 1 ? 1 : 0, down);
     for (int32_t i = 0; i < w + 2; ++i)
@@ -120,7 +118,6 @@ bool auto_levels(const Image *src, Image *out, const int32_t map[256], int32_t a
             for (int32_t i = 0; i < w + 2; ++i)
                 down[i] = cur[i];
     }
-    return true;
 }
 
 template <class F> void green_and_dark_histograms(const Image *src, int64_t green[256], int64_t dark[256]) {
@@ -184,6 +181,11 @@ void MakeMapping(int32_t table[256], float lowFraction, float highThreshold) {
 }
 
 int32_t ImageAutoGradationProcess(const Image *src, Image **dst, int32_t amount) {
+    if (dst == nullptr || !has_pixels(src)) return 0;
+    // Working memory comes first, so its failure leaves the slot as it was.
+    Buffer<LocalScreen> tables = alloc_buffer<LocalScreen>(1);
+    Buffer<uint32_t> rows = alloc_buffer<uint32_t>(checked_size(static_cast<uint64_t>(src->width) + 2, 3));
+    if (!tables || !rows) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
     amount = clamp_to(amount, 0, 100);
@@ -191,13 +193,10 @@ int32_t ImageAutoGradationProcess(const Image *src, Image **dst, int32_t amount)
     with_format(src->bitCount, [&](auto f) { channel_histogram<decltype(f)>(src, hist); });
     int32_t map[256];
     make_mapping(hist, 0.0005f, 0.0005f, map);
-    Buffer<LocalScreen> tables = alloc_buffer<LocalScreen>(1);
-    if (!tables) return 0;
-    bool ok = false;
     with_formats(src, out, [&](auto fs, auto fd) {
-        ok = auto_levels<decltype(fs), decltype(fd)>(src, out, map, amount, tables[0]);
+        auto_levels<decltype(fs), decltype(fd)>(src, out, map, amount, tables[0], rows.get());
     });
-    return ok ? 1 : 0;
+    return 1;
 }
 
 void ImageAutoGradationProcess1(const Image *src, Image **dst, int32_t, int32_t gammaFlag) {

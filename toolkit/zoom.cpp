@@ -142,27 +142,33 @@ int32_t PXImage_ROI_Zoom(const PXImage *src, PXImage *dst, const PXRect *rect, d
     const auto gatherWidth = static_cast<int64_t>(gw), gatherHeight = static_cast<int64_t>(gh);
     const auto startRow = static_cast<int64_t>(row0);
     if (checked_size(static_cast<uint64_t>(gatherWidth), static_cast<uint64_t>(gatherHeight)) == 0) return 0;
+    // All four planes are interpolated before the target is written, so a
+    // failure leaves it unchanged. Plane b of the gather reads source byte b
+    // only, so a target sharing the source's block gives the same result.
     const size_t outSize = checked_size(static_cast<uint64_t>(rectWidth), static_cast<uint64_t>(rectHeight));
     const size_t planeSize = static_cast<size_t>(src->width) * static_cast<size_t>(src->height);
+    if (checked_size(outSize, 4) == 0) return 0;
     Buffer<uint8_t> plane = alloc_buffer<uint8_t>(planeSize);
-    Buffer<uint8_t> out = alloc_buffer<uint8_t>(outSize);
+    Buffer<uint8_t> out = alloc_buffer<uint8_t>(outSize * 4);
     if (!plane || !out) return 0;
     const auto rw = static_cast<int32_t>(rectWidth), rh = static_cast<int32_t>(rectHeight);
     const float ry = static_cast<float>(src->height) / static_cast<float>(rh);
     const float rx = static_cast<float>(src->width) / static_cast<float>(rw);
-    const int64_t dw = dst->width, dstPixels = dw * dst->height;
     for (int32_t b = 0; b < 4; ++b) {
         gather_plane(src, startRow, x, gatherWidth, b, plane.get());
-        if (!interpolate_plane(plane.get(), src->width, src->height, 1, out.get(), rw, rh, 1, ry, rx)) return 0;
-        // Rows of the target run on into the next row past the row end, as
-        // in the packed block; pixels past the block end are not written.
+        if (!interpolate_plane(plane.get(), src->width, src->height, 1, out.get() + outSize * b, rw, rh, 1, ry, rx))
+            return 0;
+    }
+    // Rows of the target run on into the next row past the row end, as in
+    // the packed block; pixels past the block end are not written.
+    const int64_t dw = dst->width, dstPixels = dw * dst->height;
+    for (int32_t b = 0; b < 4; ++b)
         for (int64_t r = 0; r < rh; ++r)
             for (int64_t c = 0; c < rw; ++c) {
                 const int64_t p = (y + r) * dw + x + c;
                 if (p >= dstPixels) break;
-                dst->data[p * 4 + b] = out[static_cast<size_t>(r * rw + c)];
+                dst->data[p * 4 + b] = out[outSize * b + static_cast<size_t>(r * rw + c)];
             }
-    }
     return 1;
 }
 

@@ -8,8 +8,10 @@
  *  - Every conversion of a double to an integer truncates toward zero and, for
  *    values beyond the 32-bit range, saturates, with NaN giving 0 (as the ARM
  *    conversion instructions do); in-range values convert exactly.
- *  - A 1- or 4-bit source gets an 8-bit result (malloc_Image's rule); its
- *    pixels are converted as GetPixelColor / SetPixelColor do.
+ *  - Any bit count is accepted. A source of a bit count other than 16, 24 or
+ *    32 gets an 8-bit result (malloc_Image's rule); its pixels are converted
+ *    as GetPixelColor / SetPixelColor do (bit counts without a pixel layout
+ *    read as gray 0 and are never written).
  *  - Platform dependence: the polar transforms use atan2, sin and cos and the
  *    free-form warp exp and log from the platform's libm; a libm whose results
  *    differ in the last bit can move a pixel. sqrt is exact everywhere, so the

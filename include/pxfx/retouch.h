@@ -8,6 +8,11 @@
  * the brushes keep a prepared whole-picture image between dabs; its `tag`
  * records the tint or strength it was made with. The caller owns every image
  * left in a slot and releases it with free_Image.
+ *
+ * Functions that name no bit count accept any: pixels are read and written as
+ * GetPixelColor / SetPixelColor do (a bit count without a pixel layout reads as
+ * gray 0 and is never written); result images of sources other than 16, 24 and
+ * 32 bits are 8-bit (malloc_Image's rule).
  */
 #ifndef PXFX_RETOUCH_H
 #define PXFX_RETOUCH_H
@@ -34,7 +39,8 @@ PXFX_API int32_t CreateFaceMaskImg(const Image *src, Image **mask);
  * 1; 0 for a source without pixels or a null slot. The temporary mask is released. */
 PXFX_API int32_t SmileDetect(const Image *src, Image **dst, int32_t unused);
 /* Brightens small dark spots on the skin into *dst. 1; 0 for a source without pixels,
- * a null slot or a failed allocation. Without a skin mask the source is copied. */
+ * a null slot or a failed allocation (the slot then holds the prepared result image, its
+ * pixels not written). Without a skin mask the source is copied. */
 PXFX_API int32_t alg_Img_smooth_1(const Image *src, Image **dst);
 /* alg_Img_smooth_1 followed by LightUP on the result. */
 PXFX_API void alg_Img_smooth(const Image *src, Image **dst);
@@ -63,7 +69,8 @@ PXFX_API void BuildTable(uint8_t table[256], float gamma);
  * both cuts at 0 (every entry 0); a null table is ignored. */
 PXFX_API void MakeMapping(int32_t table[256], float lowFraction, float highThreshold);
 /* Auto levels blended with a local screen by amount (0..100) into *dst; alpha is the
- * source's. 1; 0 for a source without pixels, a null slot or a failed allocation. */
+ * source's. 1; 0 for a source without pixels, a null slot or a failed allocation of the
+ * working memory (taken before the slot is touched, so the slot is then left alone). */
 PXFX_API int32_t ImageAutoGradationProcess(const Image *src, Image **dst, int32_t amount);
 /* Auto levels of the darker half with an optional 5/6 gamma (identity when gammaFlag
  * is 0) into *dst; alpha is the source's. */
@@ -83,7 +90,8 @@ PXFX_API void thresholdBlur(int32_t unused1, int32_t unused2, int32_t size, int3
 
 /* Soft round paste of src into dst at (cx, cy) with radius r. 1, or 0 for images without
  * pixels or r = 0. The source is read in the destination's layout; pixels it does not
- * hold (rows past its height, columns past its pitch) are left unchanged. */
+ * hold (rows past its height, columns past its pitch) are left unchanged. A destination
+ * of a bit count other than 8, 24 or 32 is left unchanged with result 1. */
 PXFX_API int32_t PointArea_Copy(Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t r);
 /* Lighten-only round paste with a rim darkened by level. 1, or 0 for images without
  * pixels or r = 0; a source smaller than dst is read as in PointArea_Copy. */
@@ -96,7 +104,9 @@ PXFX_API int32_t PX_Mimic(Image *picture, int32_t srcX, int32_t srcY, const Imag
  * (also when the planes cannot be combined; the slot is then empty). */
 PXFX_API int32_t alg_Blending(Image *picture, void *unused, int32_t cx, int32_t cy, PXTint tint, int32_t r,
                               Image **cache);
-/* Whole-picture tint into *out, or in place when out is null. 1 or 0. */
+/* Whole-picture tint into *out, or in place when out is null. 1 or 0; when the tint
+ * cannot be made (a picture alg_Blending refuses, or failed working memory) the output
+ * slot is left alone. */
 PXFX_API int32_t alg_Img_Blending(Image *src, Image **out);
 /* Smoothing brush: pastes a box-smoothed copy (cached in *cache when given). 1 or 0. */
 PXFX_API int32_t alg_smooth(Image *picture, int32_t unused, int32_t cx, int32_t cy, int32_t r, int32_t strength,

@@ -88,7 +88,8 @@ PXFX_API PXImage *PXImage_ZoomOut(const PXImage *src);
  * and plane bytes the gather does not reach, read as 0; target rows run on into the next row past
  * the row end, and pixels past the target block are not written. 0 also for a rectangle
  * with non-positive width or height, a non-finite or negative scale, or w' or h' outside
- * 1 .. 2^31 - 1. */
+ * 1 .. 2^31 - 1, and with dst unchanged when the working memory (the source's width x height
+ * bytes, 4 bytes per rectangle pixel, each at most 2^31 - 1 bytes) cannot be had. */
 PXFX_API int32_t PXImage_ROI_Zoom(const PXImage *src, PXImage *dst, const PXRect *rect, double scale, int32_t x,
                                   int32_t y);
 /* 1 when two 8-, 24- or 32-bit images differ by at most half a level on average.
@@ -143,7 +144,8 @@ PXFX_API int32_t PXImage_GreenChannel(PXImage *img);
  * 16-bit images are filtered as whole samples clamped to 0..65535; other bit counts return 1
  * unchanged; 0 for strength 0 or when working memory is missing. */
 PXFX_API int32_t PXImage_Sharpen(PXImage *img, int32_t strength);
-/* Mean or median smoothing in place, chosen by strength. 1 or 0.
+/* Mean or median smoothing in place, chosen by strength. 1 or 0 (strength 0, missing
+ * working memory); bit counts other than 8, 16 and 24 return 1 unchanged.
  * Below 20 (negative included): 3x3 mean; 20..39: 5x5 mean; 40..59: 7x7 mean; 60..79: 5x5
  * median; 80 and above: 7x7 median (element size^2 / 2 of the sorted window). */
 PXFX_API int32_t PXImage_Smooth(PXImage *img, int32_t strength);

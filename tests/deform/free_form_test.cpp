@@ -95,6 +95,4 @@ TEST(FreeForm, OnePairIdentityTranslationAndIgnoredPairs) {
         for (int i = 0; i < 4; ++i)
             pairs[i].dstX += 3, pairs[i].dstY += 2;
     }
-    EXPECT_EQ(DeformationImage(src.get(), nullptr, 2, &dst) + DeformationImage(src.get(), pairs, 0x80000000u, &dst), 0);
-    EXPECT_EQ(DeformationFunc(src.get(), make(19, 15, 32).get(), pairs, 4), 0);
 }

@@ -77,5 +77,4 @@ TEST(Polar, MirroredIdentityRibsAndOutsideColour) {
         EXPECT_EQ(GetPixelColor(dst.get(), x, 1), GetPixelColor(src.get(), sx, 1)) << x;
     for (float f : {NAN, INFINITY, 1e-45f}) // odd factors convert without overflow
         EXPECT_EQ(CircleTransform(src.get(), &dst, 2, INT32_MAX, f), 1u);
-    EXPECT_EQ(Bathroom_Transform(nullptr, &dst) + Punch_Transform(src.get(), nullptr), 0u);
 }

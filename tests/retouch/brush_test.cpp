@@ -103,8 +103,6 @@ TEST(CachedBrushes, TintBrushKeysOnItsLevels) {
     Slot out;
     ASSERT_EQ(alg_Img_Blending(pic.get(), &out), 1);
     EXPECT_EQ(diff(out.get(), tinted(pic.get(), 201, 189, 203).get()), "");
-    Owned gray = random_image(8, 8, 8, 1);
-    EXPECT_EQ(alg_Blending(gray.get(), nullptr, 0, 0, tint, 3, &cache), 0);
 }
 
 TEST(CachedBrushes, SmoothingBrushKeysOnStrength) {

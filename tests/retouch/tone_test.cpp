@@ -139,8 +139,6 @@ TEST(CrossMedian, MatchesSortedCrossInEveryMode) {
         ASSERT_EQ(MyOneKeyFliter(src.get(), &empty), 1);
         EXPECT_EQ(diff(empty.get(), ref_cross_median(src.get(), make(w, h, 8).get()).get()), "");
     }
-    Owned deep = random_image(20, 20, 24, 1);
-    EXPECT_EQ(MyOneKeyFliter(deep.get(), nullptr), 0);
 }
 
 TEST(ThresholdBlur, NearBlackTapsBlackenTheirNeighbours) {
