@@ -27,8 +27,13 @@ void planes(Input &in) {
     ImageGuard src{make_image(in)};
     const int32_t mode = in.param(0, 5);
     Slot p1(in, src.img, false), p2(in, src.img, false), p3(in, src.img, false), alpha(in, src.img);
+    // The first slot may hold the source itself; Split then releases it.
+    if (in.one_in(8)) {
+        p1.hold(src.img);
+        src.img = nullptr;
+    }
     Image **s1 = in.one_in(24) ? nullptr : p1.get();
-    Split(src.img, s1, p2.get(), in.one_in(24) ? s1 : p3.get(), alpha.get(), mode);
+    Split(src.img != nullptr ? src.img : p1.image(), s1, p2.get(), in.one_in(24) ? s1 : p3.get(), alpha.get(), mode);
     // Join the planes just made, or hand-made ones of other sizes.
     ImageGuard o1{in.one_in(3) ? make_plane(in) : nullptr};
     ImageGuard o2{in.one_in(3) ? make_partner(in, p1.image()) : nullptr};

@@ -12,13 +12,16 @@ namespace {
 
 using namespace fuzz;
 
-const std::string &temp_dir() {
-    static const std::string dir = [] {
-        char name[] = "/tmp/pxfx_fuzz_core_XXXXXX";
-        const char *made = mkdtemp(name);
-        return std::string(made != nullptr ? made : "/tmp");
+// A private directory for the file functions, removed at exit.
+const char *temp_dir() {
+    static char name[] = "/tmp/pxfx_fuzz_core_XXXXXX";
+    static const bool made = [] {
+        if (mkdtemp(name) == nullptr) std::abort();
+        std::atexit([] { rmdir(name); });
+        return true;
     }();
-    return dir;
+    (void)made;
+    return name;
 }
 
 // Sizes for malloc_Image: small ones, or ones whose block cannot fit.
@@ -78,7 +81,7 @@ void memory(Input &in) {
 }
 
 void files(Input &in) {
-    const std::string &dir = temp_dir();
+    const std::string dir = temp_dir();
     // A name of fuzzed length and letters below the temporary directory, some
     // past the 256-byte limit.
     std::string name = dir + "/";

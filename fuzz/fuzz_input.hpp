@@ -210,6 +210,11 @@ class Slot {
     Slot &operator=(const Slot &) = delete;
     Image **get() { return null_ ? nullptr : &img_; }
     Image *image() const { return img_; }
+    // Hands `img` to the slot (releasing what it held): the slot owns it now.
+    void hold(Image *img) {
+        free_Image(&img_, 0);
+        img_ = img;
+    }
 
   private:
     Image *img_ = nullptr;
