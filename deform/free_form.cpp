@@ -64,10 +64,11 @@ template <class S, class D> void forward_map(const Warp &k) {
         const typename S::CRow in = S::crow(k.src, y);
         for (int32_t x = 0; x < k.w; ++x) {
             if (m[x] & kSourcePoint) continue;
-            const double *wx = k.weights + x;
+            // Indexed rather than offset: with no pair the weights are null.
+            const size_t col = static_cast<size_t>(x);
             double s = 0.0, spx = 0.0, spy = 0.0, sqx = 0.0, sqy = 0.0;
             for (int32_t i = 0; i < k.n; ++i) {
-                const double wi = wx[i * w];
+                const double wi = k.weights[i * w + col];
                 s += wi;
                 spx += wi * pts[i].px;
                 spy += wi * pts[i].py;
@@ -81,7 +82,7 @@ template <class S, class D> void forward_map(const Warp &k) {
                 const int64_t phx = int64_t{pts[i].px} - p.x, phy = int64_t{pts[i].py} - p.y;
                 const double qhx = static_cast<double>(int64_t{pts[i].qx} - q.x);
                 const double qhy = static_cast<double>(int64_t{pts[i].qy} - q.y);
-                const double wi = wx[i * w];
+                const double wi = k.weights[i * w + col];
                 const double wa = wi * static_cast<double>(phx * dx + phy * dy);
                 const double wb = wi * static_cast<double>(phy * dx - phx * dy);
                 const double wc = wi * static_cast<double>(phx * dy - phy * dx);

@@ -31,7 +31,9 @@ double param_value(const pxop::Param &prm, Reader &in) {
     case 0: return -2147483648.0;
     case 1: return 2147483647.0;
     case 2: return prm.lo - 1 - raw % 1000;
-    case 3: return prm.hi + 1 + raw % 1000;
+    // Fractional parameters (scales, percentages) overshoot by at most their
+    // range: a scale far above it only asks for a gigantic, slow result.
+    case 3: return prm.hi + 1 + (prm.integer ? raw % 1000 : (prm.hi - prm.lo) * (raw % 1000) / 1000.0);
     default: {
         const double v = prm.lo + (prm.hi - prm.lo) * (raw / 4294967295.0);
         return prm.integer ? static_cast<double>(static_cast<int64_t>(v)) : v;

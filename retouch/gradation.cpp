@@ -168,7 +168,7 @@ void BuildTable(uint8_t table[256], float gamma) {
         const float x = (static_cast<float>(i) + 0.5f) * 0.00390625f;
         const float p = static_cast<float>(std::pow(static_cast<double>(x), static_cast<double>(gamma)));
         const float v = p * 256.0f - 0.5f;
-        table[i] = v > 255.0f ? 255 : (v < 0.0f ? 0 : static_cast<uint8_t>(static_cast<int32_t>(v)));
+        table[i] = clamp_u8(trunc_sat<int32_t>(v)); // a NaN gamma gives 0
     }
 }
 

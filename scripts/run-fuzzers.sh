@@ -1,23 +1,61 @@
 #!/usr/bin/env bash
 # Builds the libFuzzer targets with clang and runs each for a bounded time.
-#   scripts/run-fuzzers.sh [SECONDS_PER_TARGET]   (default 60; use e.g. 3600 for a long run)
-# Findings are written to fuzz/findings/; the corpus grows in build-fuzz/corpus/.
+#   scripts/run-fuzzers.sh [SECONDS_PER_TARGET] [TARGET...]   (default 60 s each)
+#   scripts/run-fuzzers.sh --total SECONDS [TARGET...]        (SECONDS split over the targets)
+# TARGET names a target without its prefix (core, color, effects, deform,
+# toolkit, retouch, lines, operations); all of them by default.
+# Every target runs even when an earlier one fails; the script exits 1 when
+# any target reported a crash, sanitizer error, leak or timeout. Reproducers
+# are written to fuzz/findings/; the corpus grows in build-fuzz/corpus/, seeded
+# from fuzz/corpus/<target>/.
 set -euo pipefail
 cd "$(dirname "$0")/.."
-seconds=${1:-60}
+
+total=""
+per_target=60
+if [ "${1:-}" = "--total" ]; then
+  total=${2:?--total needs a number of seconds}
+  shift 2
+elif [ -n "${1:-}" ] && [ -z "${1//[0-9]/}" ]; then
+  per_target=$1
+  shift
+fi
+targets=("$@")
+[ ${#targets[@]} -gt 0 ] || targets=(core color effects deform toolkit retouch lines operations)
+if [ -n "$total" ]; then
+  per_target=$((total / ${#targets[@]}))
+  [ "$per_target" -ge 1 ] || per_target=1
+fi
+
 bash scripts/install-deps.sh clang-14 libclang-rt-14-dev
 cmake -S . -B build-fuzz -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo \
   -DCMAKE_C_COMPILER=clang-14 -DCMAKE_CXX_COMPILER=clang++-14 \
   -DPXFX_BUILD_FUZZERS=ON -DPXFX_BUILD_TESTS=OFF -DPXFX_BUILD_BENCH=OFF
-cmake --build build-fuzz -j "$(nproc)" --target pxfx_fuzz_operations
+cmake --build build-fuzz -j "$(nproc)" --target "${targets[@]/#/pxfx_fuzz_}"
+
 mkdir -p fuzz/findings
-for target in build-fuzz/fuzz/pxfx_fuzz_*; do
-  name=$(basename "$target")
+failed=()
+for name in "${targets[@]}"; do
   corpus="build-fuzz/corpus/$name"
   mkdir -p "$corpus"
-  seeds="fuzz/corpus/${name#pxfx_fuzz_}"
-  [ -d "$seeds" ] || seeds=""
-  echo "== $name for $seconds s"
-  ASAN_OPTIONS=detect_leaks=1 "$target" -max_total_time="$seconds" -max_len=16384 -timeout=20 \
-    -artifact_prefix=fuzz/findings/ -print_final_stats=1 "$corpus" $seeds
+  seeds=()
+  [ -d "fuzz/corpus/$name" ] && seeds=("fuzz/corpus/$name")
+  echo "== $name for $per_target s"
+  log="build-fuzz/fuzz-$name.log"
+  status=0
+  ASAN_OPTIONS=detect_leaks=1 "build-fuzz/fuzz/pxfx_fuzz_$name" -max_total_time="$per_target" \
+    -max_len=16384 -timeout=20 -rss_limit_mb=2048 -artifact_prefix="fuzz/findings/$name-" \
+    -print_final_stats=1 "$corpus" "${seeds[@]}" >"$log" 2>&1 || status=$?
+  grep -E '^#[0-9]+[[:space:]]+DONE' "$log" | tail -n 1 || true
+  if [ "$status" -ne 0 ]; then
+    echo "!! $name failed (exit $status); log $log:"
+    grep -E 'ERROR|SUMMARY|runtime error|Test unit written' "$log" | head -n 20 || tail -n 20 "$log"
+    failed+=("$name")
+  fi
 done
+
+if [ ${#failed[@]} -gt 0 ]; then
+  echo "Fuzzing found problems in: ${failed[*]} (reproducers in fuzz/findings/)"
+  exit 1
+fi
+echo "Fuzzing found nothing in ${#targets[@]} targets."

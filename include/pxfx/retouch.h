@@ -63,7 +63,7 @@ PXFX_API int32_t getpos(const int32_t *values, int32_t count, int32_t value);
 
 /* ---- Tone curves and automatic gradation ----------------------------------------------- */
 
-/* 256-entry gamma table; a null table is ignored. */
+/* 256-entry gamma table; a null table is ignored, a NaN gamma gives every entry 0. */
 PXFX_API void BuildTable(uint8_t table[256], float gamma);
 /* Turns a 256-bin histogram into a stretch mapping in place. An empty histogram has
  * both cuts at 0 (every entry 0); a null table is ignored. */

@@ -2,6 +2,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <cmath>
 #include <vector>
 
 #include "retouch/reference.hpp"
@@ -72,6 +73,8 @@ TEST(ToneCurves, GammaTableAndStretchMapping) {
     EXPECT_EQ(std::vector<uint8_t>(t, t + 256)[200], 200);
     BuildTable(t, 2.0f);
     EXPECT_EQ(t[128] + t[255] * 1000, 64 + 254 * 1000);
+    BuildTable(t, std::nanf(""));
+    EXPECT_EQ(std::vector<uint8_t>(t, t + 256), std::vector<uint8_t>(256, 0));
     EXPECT_EQ(mapping({{77, 5}}, 0.0005f, 0.0005f), std::vector<int32_t>(256, 77));
     EXPECT_EQ(mapping({}, 0.0005f, 0.0005f), std::vector<int32_t>(256, 0));
     const std::vector<int32_t> two = mapping({{10, 3}, {200, 4}}, 0, 0);
