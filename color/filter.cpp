@@ -8,6 +8,7 @@
 #include <pxfx/color.h>
 
 #include <algorithm>
+#include <climits>
 #include <cstdint>
 #include <cstring>
 
@@ -65,14 +66,23 @@ struct Taps {
 struct Finish {
     double divisor;
     int64_t offset;
-    uint8_t operator()(uint32_t acc) const {
+    // When every sum the taps can make lies in [low, low + span) without
+    // wrapping, the results of all of them, indexed by sum - low.
+    const uint8_t *table = nullptr;
+    uint32_t low = 0;
+
+    uint8_t slow(uint32_t acc) const {
         const int32_t sum = static_cast<int32_t>(acc);
         const int64_t q =
             divisor != 0.0 ? static_cast<int64_t>(static_cast<double>(sum) / divisor) : static_cast<int64_t>(sum);
         const int64_t v = q + offset;
         return static_cast<uint8_t>(v < 0 ? 0 : (v > 255 ? 255 : v));
     }
+    uint8_t operator()(uint32_t acc) const { return table != nullptr ? table[acc - low] : slow(acc); }
 };
+
+// Sums stay within this many values for the table of Finish to be built.
+constexpr int64_t kMaxFinishTable = 1 << 16;
 
 // Adds every tap's weighted source row to acc (S bytes per pixel, W output
 // pixels), reading with the edge rows and columns repeated.
@@ -90,8 +100,13 @@ template <int S> void accumulate(const Image *src, const Taps &taps, int32_t y, 
             for (int c = 0; c < S; ++c)
                 acc[S * x + c] += k * row[c];
         const ptrdiff_t shift = static_cast<ptrdiff_t>(S) * tap.dx;
-        for (int32_t j = S * lo; j < S * hi; ++j)
-            acc[j] += k * row[j + shift];
+        if (k == 1) {
+            for (int32_t j = S * lo; j < S * hi; ++j)
+                acc[j] += row[j + shift];
+        } else {
+            for (int32_t j = S * lo; j < S * hi; ++j)
+                acc[j] += k * row[j + shift];
+        }
         const uint8_t *last = row + static_cast<size_t>(S) * (w - 1);
         for (int32_t x = hi; x < width; ++x)
             for (int c = 0; c < S; ++c)
@@ -119,6 +134,7 @@ bool selected(const Image *mask, int32_t x, int32_t y) {
 
 void filter_index(const Job &job, const Taps &taps, uint32_t *acc) {
     const Image *src = job.src;
+    const Finish finish = job.finish; // a local copy: result stores cannot alias its table
     for (int32_t y = 0; y < job.height; ++y) {
         accumulate<1>(src, taps, y, job.width, acc);
         uint8_t *out = row_ptr(job.dst, y);
@@ -127,19 +143,20 @@ void filter_index(const Job &job, const Taps &taps, uint32_t *acc) {
             if (job.mask != nullptr && !selected(job.mask, x, y))
                 out[x] = own[std::min(x, src->width - 1)];
             else
-                out[x] = job.finish(acc[x]);
+                out[x] = finish(acc[x]);
         }
     }
 }
 
 template <int S, int D> void filter_colour(const Job &job, const Taps &taps, uint32_t *acc) {
     const Image *src = job.src;
+    const Finish finish = job.finish; // a local copy: result stores cannot alias its table
     for (int32_t y = 0; y < job.height; ++y) {
         accumulate<S>(src, taps, y, job.width, acc);
         uint8_t *out = row_ptr(job.dst, y);
         const uint8_t *alphaRow = row_ptr(src, std::clamp(y + job.lastDy, 0, src->height - 1));
         for (int32_t x = 0; x < job.width; ++x) {
-            uint8_t b = job.finish(acc[S * x]), g = job.finish(acc[S * x + 1]), r = job.finish(acc[S * x + 2]);
+            uint8_t b = finish(acc[S * x]), g = finish(acc[S * x + 1]), r = finish(acc[S * x + 2]);
             if (job.gray) b = g = r = static_cast<uint8_t>((b + 2 * g + r) >> 2);
             uint8_t *p = out + D * x;
             p[0] = b;
@@ -211,6 +228,21 @@ int32_t run_filter(const Image *src, const int32_t *kernel, int32_t size, int32_
     const Taps taps(kernel, size, std::max(width, src->width), std::max(height, src->height));
     Buffer<uint32_t> acc = alloc_buffer<uint32_t>(checked_size(static_cast<uint64_t>(width), 4));
     if (!taps.ok || !acc) return 0;
+    Finish finish{divisor == 0 ? 0.0 : static_cast<double>(divisor), offset};
+    // Bounds of the sums from the signed weights; beyond 32 bits they may wrap.
+    int64_t low = 0, high = 0;
+    for (size_t t = 0; t < taps.count; ++t)
+        (static_cast<int32_t>(taps.list[t].weight) < 0 ? low : high) +=
+            255 * int64_t{static_cast<int32_t>(taps.list[t].weight)};
+    Buffer<uint8_t> table;
+    if (high - low < kMaxFinishTable && low > INT32_MIN && high < INT32_MAX)
+        table = alloc_buffer<uint8_t>(static_cast<size_t>(high - low + 1));
+    if (table) {
+        for (int64_t v = low; v <= high; ++v)
+            table[static_cast<size_t>(v - low)] = finish.slow(static_cast<uint32_t>(v));
+        finish.table = table.get();
+        finish.low = static_cast<uint32_t>(low);
+    }
     Job job{&source.view,
             dst,
             bits == 8 ? mask : nullptr,
@@ -220,7 +252,7 @@ int32_t run_filter(const Image *src, const int32_t *kernel, int32_t size, int32_
             size - size / 2 - 1,
             size > 0,
             gray >= 1,
-            {divisor == 0 ? 0.0 : static_cast<double>(divisor), offset}};
+            finish};
     if (bits == 8) {
         filter_index(job, taps, acc.get());
     } else {
