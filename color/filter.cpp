@@ -93,34 +93,70 @@ constexpr int64_t kMaxFinishTable = 1 << 16;
 
 // Adds every tap's weighted source row to acc for output pixels x0 .. x1 - 1
 // (S bytes per pixel, acc[0] for x0), reading with the edge rows and columns
-// repeated.
+// repeated. The taps of one kernel row (listed together, same dy) are added
+// in one pass over the output pixels where all of them read inside the row;
+// the pixels nearer the ends go one tap at a time with clamped columns.
 template <int S, class T>
 void accumulate(const Image *src, const Taps &taps, int32_t y, int32_t x0, int32_t x1, T *acc) {
     const int32_t w = src->width, h = src->height;
     std::memset(acc, 0, sizeof(T) * S * static_cast<size_t>(x1 - x0));
     const ptrdiff_t first = static_cast<ptrdiff_t>(S) * x0; // acc index of output pixel x: S * x - first
-    for (size_t t = 0; t < taps.count; ++t) {
-        const Tap tap = taps.list[t];
-        const uint8_t *row = row_ptr(src, static_cast<int32_t>(std::clamp<int64_t>(int64_t{y} + tap.dy, 0, h - 1)));
-        const T k = static_cast<T>(tap.weight);
-        // Output pixels x in [lo, hi) read inside the row.
-        const int32_t lo = static_cast<int32_t>(std::clamp<int64_t>(-int64_t{tap.dx}, x0, x1));
-        const int32_t hi = static_cast<int32_t>(std::clamp<int64_t>(int64_t{w} - tap.dx, lo, x1));
-        for (int32_t x = x0; x < lo; ++x)
-            for (int c = 0; c < S; ++c)
-                acc[S * x + c - first] = static_cast<T>(acc[S * x + c - first] + k * row[c]);
-        const ptrdiff_t shift = static_cast<ptrdiff_t>(S) * tap.dx;
-        if (k == 1) {
-            for (int32_t j = S * lo; j < S * hi; ++j)
-                acc[j - first] = static_cast<T>(acc[j - first] + row[j + shift]);
-        } else {
-            for (int32_t j = S * lo; j < S * hi; ++j)
-                acc[j - first] = static_cast<T>(acc[j - first] + k * row[j + shift]);
+    for (size_t g = 0; g < taps.count;) {
+        const Tap *group = taps.list.get() + g;
+        size_t n = 1;
+        while (g + n < taps.count && group[n].dy == group[0].dy)
+            ++n;
+        g += n;
+        const uint8_t *row =
+            row_ptr(src, static_cast<int32_t>(std::clamp<int64_t>(int64_t{y} + group[0].dy, 0, h - 1)));
+        int64_t lo = x0, hi = x1;
+        for (size_t t = 0; t < n; ++t) {
+            lo = std::max<int64_t>(lo, -int64_t{group[t].dx});
+            hi = std::min<int64_t>(hi, int64_t{w} - group[t].dx);
         }
-        const uint8_t *last = row + static_cast<size_t>(S) * (w - 1);
-        for (int32_t x = hi; x < x1; ++x)
-            for (int c = 0; c < S; ++c)
-                acc[S * x + c - first] = static_cast<T>(acc[S * x + c - first] + k * last[c]);
+        lo = std::min<int64_t>(lo, x1);
+        hi = std::max(hi, lo);
+        for (size_t t = 0; t < n; ++t) {
+            const T k = static_cast<T>(group[t].weight);
+            const int64_t dx = group[t].dx;
+            auto edge = [&](int64_t a, int64_t b) {
+                for (int64_t x = a; x < b; ++x) {
+                    const uint8_t *p =
+                        row + static_cast<size_t>(S) * static_cast<size_t>(std::clamp<int64_t>(x + dx, 0, w - 1));
+                    for (int c = 0; c < S; ++c)
+                        acc[S * x + c - first] = static_cast<T>(acc[S * x + c - first] + k * p[c]);
+                }
+            };
+            edge(x0, lo);
+            edge(hi, x1);
+        }
+        const ptrdiff_t j0 = static_cast<ptrdiff_t>(S) * lo, j1 = static_cast<ptrdiff_t>(S) * hi;
+        if (n == 3) {
+            const ptrdiff_t s0 = ptrdiff_t{S} * group[0].dx, s1 = ptrdiff_t{S} * group[1].dx,
+                            s2 = ptrdiff_t{S} * group[2].dx;
+            const T k0 = static_cast<T>(group[0].weight), k1 = static_cast<T>(group[1].weight),
+                    k2 = static_cast<T>(group[2].weight);
+            if (k0 == 1 && k1 == 1 && k2 == 1) {
+                for (ptrdiff_t j = j0; j < j1; ++j)
+                    acc[j - first] = static_cast<T>(acc[j - first] + row[j + s0] + row[j + s1] + row[j + s2]);
+            } else {
+                for (ptrdiff_t j = j0; j < j1; ++j)
+                    acc[j - first] =
+                        static_cast<T>(acc[j - first] + k0 * row[j + s0] + k1 * row[j + s1] + k2 * row[j + s2]);
+            }
+            continue;
+        }
+        for (size_t t = 0; t < n; ++t) {
+            const T k = static_cast<T>(group[t].weight);
+            const ptrdiff_t shift = ptrdiff_t{S} * group[t].dx;
+            if (k == 1) {
+                for (ptrdiff_t j = j0; j < j1; ++j)
+                    acc[j - first] = static_cast<T>(acc[j - first] + row[j + shift]);
+            } else {
+                for (ptrdiff_t j = j0; j < j1; ++j)
+                    acc[j - first] = static_cast<T>(acc[j - first] + k * row[j + shift]);
+            }
+        }
     }
 }
 
