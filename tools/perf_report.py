@@ -1,7 +1,7 @@
 #!/usr/bin/env python3
 """Turns a pxfx_bench JSON run into the Markdown performance report.
 
-Usage: perf_report.py RUN.json [-o docs/performance.md]
+Usage: perf_report.py RUN.json [-o docs/performance.md] [--baseline EARLIER.json]
 
 Ratios compare CPU time per call of two benchmarks of the same run, so they
 hold up better than absolute figures on a shared machine. Benchmark CV_<Name>
@@ -10,6 +10,7 @@ BM_Memcpy of the same bit count.
 """
 import argparse
 import json
+import math
 import platform
 import re
 import sys
@@ -140,6 +141,7 @@ def main():
     ap = argparse.ArgumentParser()
     ap.add_argument("run")
     ap.add_argument("-o", "--output", default="-")
+    ap.add_argument("--baseline", help="an earlier run: adds each family's change since then")
     opt = ap.parse_args()
     context, runs = load(opt.run)
     out = []
@@ -218,6 +220,21 @@ def main():
     for name, b in runs.items():
         if name.startswith("BM_") and family(name) not in POINTWISE and "CV_" + name[3:] not in runs:
             w(f"| `{name}` | {ms(b):.2f} | {mps(b):.0f} |")
+
+    if opt.baseline:
+        base_context, base = load(opt.baseline)
+        w(f"\n## Change since {base_context.get('date', 'the baseline run')}\n")
+        w("Geometric mean over each family's shared benchmarks of CPU time now / then "
+          "(two runs, so machine load differs between them; the ratios above are the "
+          "reliable figures).\n")
+        w("| Family | benchmarks | time now / then |")
+        w("|---|---:|---:|")
+        fams = {}
+        for name in runs.keys() & base.keys():
+            if name.startswith("BM_"):
+                fams.setdefault(name.split("/")[0], []).append(math.log(ms(runs[name]) / ms(base[name])))
+        for fam, logs in sorted(fams.items()):
+            w(f"| `{fam}` | {len(logs)} | {math.exp(sum(logs) / len(logs)):.2f} |")
 
     met = sum(1 for t in targets if t[4])
     w(f"\n## Targets: {met} met, {len(targets) - met} missed\n")
