@@ -56,7 +56,8 @@ struct Box {
 
 // Writes the row means of the column sums `col` (bpp channels interleaved).
 template <class Sum, int Bpp, class MeanFn>
-void row_means(const Sum *col, int32_t w, const Box &box, const MeanFn &mean, uint8_t *out) {
+void row_means(const Sum *col, int32_t w, const Box &box, const MeanFn &meanFn, uint8_t *out) {
+    const MeanFn mean = meanFn; // a local copy: the result stores cannot alias what it holds
     Sum s[Bpp];
     for (int k = 0; k < Bpp; ++k) {
         s[k] = clamped_sum<Sum>(box.first(0), box.last(0), w, [&](int32_t c) { return col[Bpp * c + k]; });
