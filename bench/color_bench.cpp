@@ -4,58 +4,79 @@
 
 using namespace pxbench;
 
-static void BM_SplitCombineHsl(benchmark::State &state) {
-    Image *src = make_picture(static_cast<int32_t>(state.range(0)));
+namespace {
+
+void BM_SplitCombineHsl(benchmark::State &state) {
+    Image *src = make_source(static_cast<int32_t>(state.range(0)), state.range(1));
     Image *h = nullptr, *s = nullptr, *l = nullptr, *a = nullptr;
-    for (auto _ : state) {
+    timed(state, block_bytes(src), 4.0 * kWidth * kHeight + block_bytes(src), [&] {
         Split(src, &h, &s, &l, &a, 1);
         Image *back = Combine(h, s, l, a, 1);
         benchmark::DoNotOptimize(back);
         free_Image(&back, 0);
-    }
+    });
     set_rate(state);
     for (Image **p : {&h, &s, &l, &a, &src})
         free_Image(p, 0);
 }
-BENCHMARK(BM_SplitCombineHsl)->ArgName("bits")->Arg(24)->Arg(32)->Unit(benchmark::kMillisecond);
 
-static void BM_Blur(benchmark::State &state) {
-    Image *src = make_picture(static_cast<int32_t>(state.range(0)));
+// Runs a kernel filter into a result slot that stays between iterations.
+template <class Run> void into_slot(benchmark::State &state, Run run) {
+    Image *src = make_source(static_cast<int32_t>(state.range(0)), state.range(1));
     Image *dst = nullptr;
-    for (auto _ : state)
-        benchmark::DoNotOptimize(PX_IMG_Blur(src, &dst));
+    timed(state, block_bytes(src), block_bytes(src), [&] { benchmark::DoNotOptimize(run(src, &dst)); });
     set_rate(state);
     free_Image(&dst, 0);
     free_Image(&src, 0);
 }
-BENCHMARK(BM_Blur)->ArgName("bits")->Arg(24)->Arg(32)->Unit(benchmark::kMillisecond);
 
-static void BM_FilterFast10(benchmark::State &state) {
-    Image *img = make_picture(static_cast<int32_t>(state.range(0)));
-    for (auto _ : state)
-        benchmark::DoNotOptimize(Filter_fast(img, 10, 0));
+void BM_Blur(benchmark::State &state) { into_slot(state, PX_IMG_Blur); }
+void BM_ImgSharpen(benchmark::State &state) { into_slot(state, PX_IMG_Sharpen); }
+void BM_Transform(benchmark::State &state) {
+    into_slot(state, [](Image *s, Image **d) { return PX_IMG_Transform(s, d, 150, 0); });
+}
+
+void BM_FilterFast(benchmark::State &state) {
+    Image *img = make_source(static_cast<int32_t>(state.range(0)), state.range(1));
+    const auto size = static_cast<int32_t>(state.range(2));
+    timed(state, block_bytes(img), 0, [&] { benchmark::DoNotOptimize(Filter_fast(img, size, 0)); });
     set_rate(state);
     free_Image(&img, 0);
 }
-BENCHMARK(BM_FilterFast10)->ArgName("bits")->Arg(24)->Arg(32)->Unit(benchmark::kMillisecond);
 
-static void BM_Transform(benchmark::State &state) {
-    Image *src = make_picture(static_cast<int32_t>(state.range(0)));
-    Image *dst = nullptr;
-    for (auto _ : state)
-        benchmark::DoNotOptimize(PX_IMG_Transform(src, &dst, 150, 0));
+// The curve filters work in place on 8-bit planes (ColorFilter24 on 24-bit pictures).
+template <class Run> void in_place(benchmark::State &state, Run run) {
+    Image *img = make_source(static_cast<int32_t>(state.range(0)), state.range(1));
+    timed(state, block_bytes(img), 0, [&] { benchmark::DoNotOptimize(run(img)); });
     set_rate(state);
-    free_Image(&dst, 0);
-    free_Image(&src, 0);
+    free_Image(&img, 0);
 }
-BENCHMARK(BM_Transform)->ArgName("bits")->Arg(24)->Arg(32)->Unit(benchmark::kMillisecond);
 
-// The curve filter works on single planes: one 8-bit plane of the picture's size.
-static void BM_ColorFilterZanto(benchmark::State &state) {
-    Image *plane = make_picture(8);
-    for (auto _ : state)
-        benchmark::DoNotOptimize(ColorFilter_zanto(plane, 200));
-    set_rate(state);
-    free_Image(&plane, 0);
+void BM_ColorFilterZanto(benchmark::State &state) {
+    in_place(state, [](Image *im) { return ColorFilter_zanto(im, 200); });
 }
-BENCHMARK(BM_ColorFilterZanto)->Unit(benchmark::kMillisecond);
+void BM_ColorFilter1(benchmark::State &state) {
+    in_place(state, [](Image *im) { return ColorFilter1(im, 200); });
+}
+void BM_ColorFilter(benchmark::State &state) {
+    in_place(state, [](Image *im) { return ColorFilter(im, 0x2080E0u, nullptr); });
+}
+void BM_ColorFilter24(benchmark::State &state) {
+    in_place(state, [](Image *im) { return ColorFilter24(im, 0x2080E0u, nullptr); });
+}
+
+} // namespace
+
+#define PXFX_COLOUR_ARGS ArgNames({"bits", "photo"})->ArgsProduct({{24, 32}, {0, 1}})->Unit(benchmark::kMillisecond)
+BENCHMARK(BM_SplitCombineHsl)->PXFX_COLOUR_ARGS;
+BENCHMARK(BM_Blur)->PXFX_COLOUR_ARGS;
+BENCHMARK(BM_ImgSharpen)->ArgNames({"bits", "photo"})->ArgsProduct({{24, 32}, {0}})->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_Transform)->ArgNames({"bits", "photo"})->ArgsProduct({{24, 32}, {0}})->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_FilterFast)
+    ->ArgNames({"bits", "photo", "size"})
+    ->ArgsProduct({{8, 24, 32}, {0, 1}, {10}})
+    ->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_ColorFilterZanto)->ArgNames({"bits", "photo"})->Args({8, 0})->Args({8, 1})->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_ColorFilter1)->ArgNames({"bits", "photo"})->Args({8, 0})->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_ColorFilter)->ArgNames({"bits", "photo"})->Args({8, 0})->Unit(benchmark::kMillisecond);
+BENCHMARK(BM_ColorFilter24)->ArgNames({"bits", "photo"})->Args({24, 0})->Unit(benchmark::kMillisecond);

@@ -11,6 +11,7 @@
 #include <pxfx/color.h>
 
 #include <algorithm>
+#include <cstring>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
@@ -54,37 +55,59 @@ struct Box {
 };
 
 // Writes the row means of the column sums `col` (bpp channels interleaved).
-template <class Sum, int Bpp>
-void row_means(const Sum *col, int32_t w, const Box &box, const Mean<Sum> &mean, uint8_t *out) {
+template <class Sum, int Bpp, class MeanFn>
+void row_means(const Sum *col, int32_t w, const Box &box, const MeanFn &meanFn, uint8_t *out) {
+    const MeanFn mean = meanFn; // a local copy: the result stores cannot alias what it holds
     Sum s[Bpp];
     for (int k = 0; k < Bpp; ++k) {
         s[k] = clamped_sum<Sum>(box.first(0), box.last(0), w, [&](int32_t c) { return col[Bpp * c + k]; });
         out[k] = mean(s[k]);
     }
-    for (int32_t x = 1; x < w; ++x) {
-        const Sum *in = col + Bpp * clamp_coord(box.last(x), w);
-        const Sum *gone = col + Bpp * clamp_coord(box.first(x) - 1, w);
+    // Columns x whose entering and leaving columns both lie inside the row
+    // need no clamping: x in [half + 1, w - size + half].
+    const int64_t lo = std::clamp<int64_t>(box.half + 1, 1, w);
+    const int64_t hi = std::clamp<int64_t>(static_cast<int64_t>(w) - box.size + box.half + 1, lo, w);
+    auto step = [&](int32_t x, const Sum *in, const Sum *gone) {
         for (int k = 0; k < Bpp; ++k) {
             s[k] += in[k] - gone[k];
             out[Bpp * x + k] = mean(s[k]);
         }
-    }
+    };
+    auto clamped = [&](int32_t x) {
+        step(x, col + Bpp * clamp_coord(box.last(x), w), col + Bpp * clamp_coord(box.first(x) - 1, w));
+    };
+    for (int32_t x = 1; x < lo; ++x)
+        clamped(x);
+    const Sum *in = col + Bpp * (lo + box.size - box.half - 1), *gone = col + Bpp * (lo - box.half - 1);
+    for (int32_t x = static_cast<int32_t>(lo); x < hi; ++x, in += Bpp, gone += Bpp)
+        step(x, in, gone);
+    for (int32_t x = static_cast<int32_t>(hi); x < w; ++x)
+        clamped(x);
 }
 
-template <class Sum, int Bpp>
-void running_box(const Image *src, Image *dst, const Box &box, const Mean<Sum> &mean, Sum *col) {
+// Column sums run down the picture, one result row at a time. When the result
+// replaces the source (dst == src), every source row is saved in `ring`
+// (ringRows rows, at least half + 2 or the whole height) before it is
+// overwritten, and the rows leaving the box are read back from there.
+template <class Sum, int Bpp, class MeanFn>
+void running_box(const Image *src, Image *dst, const Box &box, const MeanFn &mean, Sum *col, uint8_t *ring,
+                 int32_t ringRows) {
     const int32_t w = src->width, h = src->height;
     const size_t n = static_cast<size_t>(w) * Bpp;
     for (size_t j = 0; j < n; ++j) {
         col[j] = clamped_sum<Sum>(box.first(0), box.last(0), h,
                                   [&](int32_t r) { return static_cast<Sum>(row_ptr(src, r)[j]); });
     }
-    row_means<Sum, Bpp>(col, w, box, mean, row_ptr(dst, 0));
-    for (int32_t y = 1; y < h; ++y) {
-        const uint8_t *in = row_ptr(src, clamp_coord(box.last(y), h));
-        const uint8_t *gone = row_ptr(src, clamp_coord(box.first(y) - 1, h));
-        for (size_t j = 0; j < n; ++j)
-            col[j] += static_cast<Sum>(in[j]) - static_cast<Sum>(gone[j]);
+    for (int32_t y = 0; y < h; ++y) {
+        if (ring != nullptr) std::memcpy(ring + static_cast<size_t>(y % ringRows) * n, row_ptr(src, y), n);
+        if (y > 0) {
+            // The entering row is at or below y, so it still holds source pixels.
+            const uint8_t *in = row_ptr(src, clamp_coord(box.last(y), h));
+            const int32_t r = clamp_coord(box.first(y) - 1, h);
+            const uint8_t *gone = ring != nullptr ? ring + static_cast<size_t>(r % ringRows) * n : row_ptr(src, r);
+            for (size_t j = 0; j < n; ++j)
+                col[j] += static_cast<Sum>(in[j]) - static_cast<Sum>(gone[j]);
+        }
         row_means<Sum, Bpp>(col, w, box, mean, row_ptr(dst, y));
     }
 }
@@ -106,24 +129,53 @@ template <class Sum, int Bpp> void full_box(const Image *src, Image *dst, const 
     }
 }
 
-template <class Sum, int Bpp> void smooth(const Image *src, Image *dst, int32_t size, int32_t offset, bool running) {
+// Smooths src into dst; with a ring (see running_box) dst is src itself.
+template <class Sum, int Bpp>
+bool smooth(const Image *src, Image *dst, int32_t size, int32_t offset, bool running, uint8_t *ring, int32_t ringRows) {
     const Box box{size, size / 2};
     const Mean<Sum> mean(size, offset);
     Buffer<Sum> col = running ? alloc_zeroed<Sum>(checked_size(static_cast<uint64_t>(src->width), Bpp)) : Buffer<Sum>();
-    if (col)
-        running_box<Sum, Bpp>(src, dst, box, mean, col.get());
-    else
+    if (col && mean.table) {
+        // The table through a local pointer: stores to the result rows cannot
+        // alias it, so the loop keeps it in a register.
+        const uint8_t *table = mean.table.get();
+        running_box<Sum, Bpp>(
+            src, dst, box, [table](Sum v) { return table[static_cast<size_t>(v)]; }, col.get(), ring, ringRows);
+    } else if (col) {
+        running_box<Sum, Bpp>(
+            src, dst, box, [&mean](Sum v) { return mean.slow(v); }, col.get(), ring, ringRows);
+    } else if (ring == nullptr) {
         full_box<Sum, Bpp>(src, dst, box, mean);
+    } else {
+        return false;
+    }
+    return true;
 }
 
 // Sums fit 32 bits while 255 * size^2 does.
 constexpr int32_t kMaxSize32 = 2901;
 
-template <int Bpp> void smooth_any(const Image *src, Image *dst, int32_t size, int32_t offset, bool running) {
-    if (size <= kMaxSize32)
-        smooth<int32_t, Bpp>(src, dst, size, offset, running);
-    else
-        smooth<int64_t, Bpp>(src, dst, size, offset, running);
+template <int Bpp>
+bool smooth_any(const Image *src, Image *dst, int32_t size, int32_t offset, bool running, uint8_t *ring = nullptr,
+                int32_t ringRows = 0) {
+    if (size <= kMaxSize32) return smooth<int32_t, Bpp>(src, dst, size, offset, running, ring, ringRows);
+    return smooth<int64_t, Bpp>(src, dst, size, offset, running, ring, ringRows);
+}
+
+// Running sums straight into the image, keeping only the source rows that
+// are still to leave the box; false (image untouched) when the working
+// memory cannot be had.
+bool smooth_in_place(Image *image, int32_t size, int32_t offset) {
+    const int32_t ringRows = static_cast<int32_t>(std::min<int64_t>(size / 2 + 2, image->height));
+    const uint32_t bpp = image->bitCount / 8;
+    Buffer<uint8_t> ring =
+        alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(image->width), bpp, static_cast<uint64_t>(ringRows)));
+    if (!ring) return false;
+    switch (image->bitCount) {
+    case 8: return smooth_any<1>(image, image, size, offset, true, ring.get(), ringRows);
+    case 24: return smooth_any<3>(image, image, size, offset, true, ring.get(), ringRows);
+    default: return smooth_any<4>(image, image, size, offset, true, ring.get(), ringRows);
+    }
 }
 
 } // namespace
@@ -132,6 +184,8 @@ namespace pxfx {
 
 int32_t box_filter(Image *image, int32_t size, int32_t offset, bool runningSums) {
     if (!has_pixels(image) || image->bitCount < 8 || size <= 0 || size > kMaxBoxSize) return 0;
+    const bool direct = image->bitCount == 8 || image->bitCount == 24 || image->bitCount == 32;
+    if (runningSums && direct && smooth_in_place(image, size, offset)) return 1;
     ImagePtr work = make_image(image->width, image->height, static_cast<int32_t>(image->bitCount));
     if (!work) return 0;
     switch (image->bitCount) {

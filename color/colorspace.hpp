@@ -99,13 +99,15 @@ inline constexpr HueWeights kHueWeights{};
 inline uint32_t hsl_to_rgb(uint32_t c) {
     const int32_t l = static_cast<int32_t>(blue_of(c)), s = static_cast<int32_t>(green_of(c));
     const uint32_t h = red_of(c);
-    if (s == 0)
-        return pack(static_cast<uint32_t>(l), static_cast<uint32_t>(l), static_cast<uint32_t>(l), 0) | keep_alpha(c);
-    const int32_t m2 = l <= 127 ? (l * (s + 255) + 127) / 255 : l + s - (l * s + 127) / 255;
+    // A gray (s = 0) needs no case of its own: m2 = m1 = l and span = 0.
+    // Every dividend is non-negative (m2 >= l, so span >= 0): unsigned
+    // division by 255 is the same and cheaper.
+    const auto by255 = [](int32_t v) { return static_cast<int32_t>(static_cast<uint32_t>(v) / 255u); };
+    const int32_t m2 = l <= 127 ? by255(l * (s + 255) + 127) : l + s - by255(l * s + 127);
     const int32_t m1 = 2 * l - m2, span = m2 - m1;
-    const uint32_t rr = static_cast<uint32_t>(m1 + (span * kHueWeights.red[h] + 126) / 255) & 255u;
-    const uint32_t gg = static_cast<uint32_t>(m1 + (span * kHueWeights.green[h] + 126) / 255) & 255u;
-    const uint32_t bb = static_cast<uint32_t>(m1 + (span * kHueWeights.blue[h] + 126) / 255) & 255u;
+    const uint32_t rr = static_cast<uint32_t>(m1 + by255(span * kHueWeights.red[h] + 126)) & 255u;
+    const uint32_t gg = static_cast<uint32_t>(m1 + by255(span * kHueWeights.green[h] + 126)) & 255u;
+    const uint32_t bb = static_cast<uint32_t>(m1 + by255(span * kHueWeights.blue[h] + 126)) & 255u;
     return pack(bb, gg, rr, 0) | keep_alpha(c);
 }
 

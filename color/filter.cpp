@@ -8,6 +8,7 @@
 #include <pxfx/color.h>
 
 #include <algorithm>
+#include <climits>
 #include <cstdint>
 #include <cstring>
 
@@ -65,39 +66,102 @@ struct Taps {
 struct Finish {
     double divisor;
     int64_t offset;
-    uint8_t operator()(uint32_t acc) const {
+    // When every sum the taps can make lies in [low, low + span) without
+    // wrapping, the results of all of them, indexed by sum - low.
+    const uint8_t *table = nullptr;
+    uint32_t low = 0;
+
+    uint8_t slow(uint32_t acc) const {
         const int32_t sum = static_cast<int32_t>(acc);
         const int64_t q =
             divisor != 0.0 ? static_cast<int64_t>(static_cast<double>(sum) / divisor) : static_cast<int64_t>(sum);
         const int64_t v = q + offset;
         return static_cast<uint8_t>(v < 0 ? 0 : (v > 255 ? 255 : v));
     }
+    // 32-bit sums, or 16-bit sums (only with the table: they equal the true
+    // sums modulo 2^16, and so does their distance from low, which is below 2^16).
+    template <class T> uint8_t operator()(T acc) const {
+        if constexpr (sizeof(T) == 2)
+            return table[static_cast<uint16_t>(acc - static_cast<uint16_t>(low))];
+        else
+            return table != nullptr ? table[acc - low] : slow(acc);
+    }
 };
 
-// Adds every tap's weighted source row to acc (S bytes per pixel, W output
-// pixels), reading with the edge rows and columns repeated.
-template <int S> void accumulate(const Image *src, const Taps &taps, int32_t y, int32_t width, uint32_t *acc) {
+// Sums stay within this many values for the table of Finish to be built.
+constexpr int64_t kMaxFinishTable = 1 << 16;
+
+// Adds every tap's weighted source row to acc for output pixels x0 .. x1 - 1
+// (S bytes per pixel, acc[0] for x0), reading with the edge rows and columns
+// repeated. The taps of one kernel row (listed together, same dy) are added
+// in one pass over the output pixels where all of them read inside the row;
+// the pixels nearer the ends go one tap at a time with clamped columns.
+template <int S, class T>
+void accumulate(const Image *src, const Taps &taps, int32_t y, int32_t x0, int32_t x1, T *acc) {
     const int32_t w = src->width, h = src->height;
-    std::memset(acc, 0, sizeof(uint32_t) * S * static_cast<size_t>(width));
-    for (size_t t = 0; t < taps.count; ++t) {
-        const Tap tap = taps.list[t];
-        const uint8_t *row = row_ptr(src, static_cast<int32_t>(std::clamp<int64_t>(int64_t{y} + tap.dy, 0, h - 1)));
-        const uint32_t k = tap.weight;
-        // Output pixels x in [lo, hi) read inside the row.
-        const int32_t lo = std::clamp(-tap.dx, 0, width);
-        const int32_t hi = static_cast<int32_t>(std::clamp<int64_t>(int64_t{w} - tap.dx, lo, width));
-        for (int32_t x = 0; x < lo; ++x)
-            for (int c = 0; c < S; ++c)
-                acc[S * x + c] += k * row[c];
-        const ptrdiff_t shift = static_cast<ptrdiff_t>(S) * tap.dx;
-        for (int32_t j = S * lo; j < S * hi; ++j)
-            acc[j] += k * row[j + shift];
-        const uint8_t *last = row + static_cast<size_t>(S) * (w - 1);
-        for (int32_t x = hi; x < width; ++x)
-            for (int c = 0; c < S; ++c)
-                acc[S * x + c] += k * last[c];
+    std::memset(acc, 0, sizeof(T) * S * static_cast<size_t>(x1 - x0));
+    const ptrdiff_t first = static_cast<ptrdiff_t>(S) * x0; // acc index of output pixel x: S * x - first
+    for (size_t g = 0; g < taps.count;) {
+        const Tap *group = taps.list.get() + g;
+        size_t n = 1;
+        while (g + n < taps.count && group[n].dy == group[0].dy)
+            ++n;
+        g += n;
+        const uint8_t *row =
+            row_ptr(src, static_cast<int32_t>(std::clamp<int64_t>(int64_t{y} + group[0].dy, 0, h - 1)));
+        int64_t lo = x0, hi = x1;
+        for (size_t t = 0; t < n; ++t) {
+            lo = std::max<int64_t>(lo, -int64_t{group[t].dx});
+            hi = std::min<int64_t>(hi, int64_t{w} - group[t].dx);
+        }
+        lo = std::min<int64_t>(lo, x1);
+        hi = std::max(hi, lo);
+        for (size_t t = 0; t < n; ++t) {
+            const T k = static_cast<T>(group[t].weight);
+            const int64_t dx = group[t].dx;
+            auto edge = [&](int64_t a, int64_t b) {
+                for (int64_t x = a; x < b; ++x) {
+                    const uint8_t *p =
+                        row + static_cast<size_t>(S) * static_cast<size_t>(std::clamp<int64_t>(x + dx, 0, w - 1));
+                    for (int c = 0; c < S; ++c)
+                        acc[S * x + c - first] = static_cast<T>(acc[S * x + c - first] + k * p[c]);
+                }
+            };
+            edge(x0, lo);
+            edge(hi, x1);
+        }
+        const ptrdiff_t j0 = static_cast<ptrdiff_t>(S) * lo, j1 = static_cast<ptrdiff_t>(S) * hi;
+        if (n == 3) {
+            const ptrdiff_t s0 = ptrdiff_t{S} * group[0].dx, s1 = ptrdiff_t{S} * group[1].dx,
+                            s2 = ptrdiff_t{S} * group[2].dx;
+            const T k0 = static_cast<T>(group[0].weight), k1 = static_cast<T>(group[1].weight),
+                    k2 = static_cast<T>(group[2].weight);
+            if (k0 == 1 && k1 == 1 && k2 == 1) {
+                for (ptrdiff_t j = j0; j < j1; ++j)
+                    acc[j - first] = static_cast<T>(acc[j - first] + row[j + s0] + row[j + s1] + row[j + s2]);
+            } else {
+                for (ptrdiff_t j = j0; j < j1; ++j)
+                    acc[j - first] =
+                        static_cast<T>(acc[j - first] + k0 * row[j + s0] + k1 * row[j + s1] + k2 * row[j + s2]);
+            }
+            continue;
+        }
+        for (size_t t = 0; t < n; ++t) {
+            const T k = static_cast<T>(group[t].weight);
+            const ptrdiff_t shift = ptrdiff_t{S} * group[t].dx;
+            if (k == 1) {
+                for (ptrdiff_t j = j0; j < j1; ++j)
+                    acc[j - first] = static_cast<T>(acc[j - first] + row[j + shift]);
+            } else {
+                for (ptrdiff_t j = j0; j < j1; ++j)
+                    acc[j - first] = static_cast<T>(acc[j - first] + k * row[j + shift]);
+            }
+        }
     }
 }
+
+// Output pixels per accumulation pass, so that the sums stay in the L1 cache.
+constexpr int32_t kChunk = 1024;
 
 struct Job {
     const Image *src; // 8-bit for an 8-bit destination, else 24- or 32-bit
@@ -117,38 +181,48 @@ bool selected(const Image *mask, int32_t x, int32_t y) {
     return row_ptr(mask, y)[x] != 0;
 }
 
-void filter_index(const Job &job, const Taps &taps, uint32_t *acc) {
+template <class T> void filter_index(const Job &job, const Taps &taps, T *acc) {
     const Image *src = job.src;
+    const Finish finish = job.finish; // a local copy: result stores cannot alias its table
     for (int32_t y = 0; y < job.height; ++y) {
-        accumulate<1>(src, taps, y, job.width, acc);
         uint8_t *out = row_ptr(job.dst, y);
         const uint8_t *own = row_ptr(src, std::min(y, src->height - 1));
-        for (int32_t x = 0; x < job.width; ++x) {
-            if (job.mask != nullptr && !selected(job.mask, x, y))
-                out[x] = own[std::min(x, src->width - 1)];
-            else
-                out[x] = job.finish(acc[x]);
+        for (int32_t x0 = 0; x0 < job.width; x0 += kChunk) {
+            const int32_t x1 = std::min(job.width, x0 + kChunk);
+            accumulate<1>(src, taps, y, x0, x1, acc);
+            for (int32_t x = x0; x < x1; ++x) {
+                if (job.mask != nullptr && !selected(job.mask, x, y))
+                    out[x] = own[std::min(x, src->width - 1)];
+                else
+                    out[x] = finish(acc[x - x0]);
+            }
         }
     }
 }
 
-template <int S, int D> void filter_colour(const Job &job, const Taps &taps, uint32_t *acc) {
+template <int S, int D, class T> void filter_colour(const Job &job, const Taps &taps, T *acc) {
     const Image *src = job.src;
+    const Finish finish = job.finish; // a local copy: result stores cannot alias its table
     for (int32_t y = 0; y < job.height; ++y) {
-        accumulate<S>(src, taps, y, job.width, acc);
         uint8_t *out = row_ptr(job.dst, y);
         const uint8_t *alphaRow = row_ptr(src, std::clamp(y + job.lastDy, 0, src->height - 1));
-        for (int32_t x = 0; x < job.width; ++x) {
-            uint8_t b = job.finish(acc[S * x]), g = job.finish(acc[S * x + 1]), r = job.finish(acc[S * x + 2]);
-            if (job.gray) b = g = r = static_cast<uint8_t>((b + 2 * g + r) >> 2);
-            uint8_t *p = out + D * x;
-            p[0] = b;
-            p[1] = g;
-            p[2] = r;
-            if constexpr (D == 4) {
-                if (job.anyTap) {
-                    const int32_t ax = std::clamp(x + job.lastDx, 0, src->width - 1);
-                    p[3] = S == 4 ? alphaRow[4 * ax + 3] : 255;
+        for (int32_t x0 = 0; x0 < job.width; x0 += kChunk) {
+            const int32_t x1 = std::min(job.width, x0 + kChunk);
+            accumulate<S>(src, taps, y, x0, x1, acc);
+            const ptrdiff_t first = static_cast<ptrdiff_t>(S) * x0;
+            for (int32_t x = x0; x < x1; ++x) {
+                const T *a = acc + (S * x - first);
+                uint8_t b = finish(a[0]), g = finish(a[1]), r = finish(a[2]);
+                if (job.gray) b = g = r = static_cast<uint8_t>((b + 2 * g + r) >> 2);
+                uint8_t *p = out + D * x;
+                p[0] = b;
+                p[1] = g;
+                p[2] = r;
+                if constexpr (D == 4) {
+                    if (job.anyTap) {
+                        const int32_t ax = std::clamp(x + job.lastDx, 0, src->width - 1);
+                        p[3] = S == 4 ? alphaRow[4 * ax + 3] : 255;
+                    }
                 }
             }
         }
@@ -209,8 +283,22 @@ int32_t run_filter(const Image *src, const int32_t *kernel, int32_t size, int32_
     Source source;
     if (!source.prepare(src, bits == 8, overlaps(src, dst))) return 0;
     const Taps taps(kernel, size, std::max(width, src->width), std::max(height, src->height));
-    Buffer<uint32_t> acc = alloc_buffer<uint32_t>(checked_size(static_cast<uint64_t>(width), 4));
-    if (!taps.ok || !acc) return 0;
+    if (!taps.ok) return 0;
+    Finish finish{divisor == 0 ? 0.0 : static_cast<double>(divisor), offset};
+    // Bounds of the sums from the signed weights; beyond 32 bits they may wrap.
+    int64_t low = 0, high = 0;
+    for (size_t t = 0; t < taps.count; ++t)
+        (static_cast<int32_t>(taps.list[t].weight) < 0 ? low : high) +=
+            255 * int64_t{static_cast<int32_t>(taps.list[t].weight)};
+    Buffer<uint8_t> table;
+    if (high - low < kMaxFinishTable && low > INT32_MIN && high < INT32_MAX)
+        table = alloc_buffer<uint8_t>(static_cast<size_t>(high - low + 1));
+    if (table) {
+        for (int64_t v = low; v <= high; ++v)
+            table[static_cast<size_t>(v - low)] = finish.slow(static_cast<uint32_t>(v));
+        finish.table = table.get();
+        finish.low = static_cast<uint32_t>(low);
+    }
     Job job{&source.view,
             dst,
             bits == 8 ? mask : nullptr,
@@ -220,17 +308,24 @@ int32_t run_filter(const Image *src, const int32_t *kernel, int32_t size, int32_
             size - size / 2 - 1,
             size > 0,
             gray >= 1,
-            {divisor == 0 ? 0.0 : static_cast<double>(divisor), offset}};
-    if (bits == 8) {
-        filter_index(job, taps, acc.get());
-    } else {
-        const bool four = source.view.bitCount == 32;
-        if (bits == 24)
-            four ? filter_colour<4, 3>(job, taps, acc.get()) : filter_colour<3, 3>(job, taps, acc.get());
-        else
-            four ? filter_colour<4, 4>(job, taps, acc.get()) : filter_colour<3, 4>(job, taps, acc.get());
-    }
-    return 1;
+            finish};
+    // 16-bit sums when the table covers them: twice as many per vector.
+    auto run = [&](auto zero) {
+        using T = decltype(zero);
+        Buffer<T> acc = alloc_buffer<T>(checked_size(static_cast<uint64_t>(std::min(width, kChunk)), 4));
+        if (!acc) return 0;
+        if (bits == 8) {
+            filter_index(job, taps, acc.get());
+        } else {
+            const bool four = source.view.bitCount == 32;
+            if (bits == 24)
+                four ? filter_colour<4, 3>(job, taps, acc.get()) : filter_colour<3, 3>(job, taps, acc.get());
+            else
+                four ? filter_colour<4, 4>(job, taps, acc.get()) : filter_colour<3, 4>(job, taps, acc.get());
+        }
+        return 1;
+    };
+    return finish.table != nullptr ? run(uint16_t{}) : run(uint32_t{});
 }
 
 // The 3 x 3 kernels of the effects, rows top to bottom.

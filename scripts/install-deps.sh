@@ -2,7 +2,9 @@
 # Installs the Debian packages that building and testing pxfx needs, skipping
 # those already present. Runs as root (or through sudo when available).
 set -euo pipefail
-packages=(cmake ninja-build g++ make pkg-config libgtest-dev libbenchmark-dev libpng-dev libjpeg-dev)
+# libopencv-dev and libopencv-contrib-dev serve only the comparison benchmarks.
+packages=(cmake ninja-build g++ make pkg-config libgtest-dev libbenchmark-dev libpng-dev libjpeg-dev
+          libopencv-dev libopencv-contrib-dev)
 missing=()
 for p in "${packages[@]}" "$@"; do
   dpkg -s "$p" >/dev/null 2>&1 || missing+=("$p")

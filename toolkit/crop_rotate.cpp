@@ -1,9 +1,11 @@
 // Crop of a bottom-up rectangle and rotation by quarter turns. Pixels move
 // whole (1, 2 or 3 bytes); crops are row copies and the quarter turns walk
-// the picture in square tiles so both sides stay in cache.
+// the picture in square tiles so both sides stay in cache, 8-bit pictures
+// in 8 x 8 blocks transposed in registers.
 #include <pxfx/toolkit.h>
 
 #include <algorithm>
+#include <bit>
 #include <cstring>
 
 #include "toolkit/pximage_check.hpp"
@@ -19,16 +21,17 @@ bool geometry_input_ok(const PXImage *src) {
 
 constexpr int32_t kTile = 32;
 
-// Quarter turn of a w x h picture into rows of `outWidth` pixels. With
-// `clockwise` false result pixel (i, j) is source (j, w - 1 - i); with true it
-// is source (h - 1 - j, i). Columns h and beyond are cleared.
+// Quarter turn of a w x h picture into rows of `outWidth` pixels, result rows
+// i0 .. i1 - 1 and columns j0 .. j1 - 1. With `clockwise` false result pixel
+// (i, j) is source (j, w - 1 - i); with true it is source (h - 1 - j, i).
 template <int32_t B>
-void quarter_turn(const uint8_t *src, int32_t w, int32_t h, uint8_t *dst, int32_t outWidth, bool clockwise) {
+void quarter_turn_pixels(const uint8_t *src, int32_t w, int32_t h, uint8_t *dst, int32_t outWidth, bool clockwise,
+                         int32_t i0, int32_t i1, int32_t j0, int32_t j1) {
     const size_t srcRow = static_cast<size_t>(w) * B, dstRow = static_cast<size_t>(outWidth) * B;
-    for (int32_t ib = 0; ib < w; ib += kTile) {
-        const int32_t iEnd = std::min(w, ib + kTile);
-        for (int32_t jb = 0; jb < h; jb += kTile) {
-            const int32_t jEnd = std::min(h, jb + kTile);
+    for (int32_t ib = i0; ib < i1; ib += kTile) {
+        const int32_t iEnd = std::min(i1, ib + kTile);
+        for (int32_t jb = j0; jb < j1; jb += kTile) {
+            const int32_t jEnd = std::min(j1, jb + kTile);
             for (int32_t i = ib; i < iEnd; ++i) {
                 uint8_t *out = dst + static_cast<size_t>(i) * dstRow;
                 for (int32_t j = jb; j < jEnd; ++j) {
@@ -39,9 +42,69 @@ void quarter_turn(const uint8_t *src, int32_t w, int32_t h, uint8_t *dst, int32_
             }
         }
     }
+}
+
+// Transposes the 8 x 8 bytes held in eight little-endian words (byte k of
+// word r is column k of row r) by swapping ever smaller off-diagonal blocks.
+inline void transpose8(uint64_t (&r)[8]) {
+    for (int i = 0; i < 4; ++i) {
+        const uint64_t t = ((r[i] >> 32) ^ r[i + 4]) & 0x00000000FFFFFFFFu;
+        r[i + 4] ^= t;
+        r[i] ^= t << 32;
+    }
+    for (int i : {0, 1, 4, 5}) {
+        const uint64_t t = ((r[i] >> 16) ^ r[i + 2]) & 0x0000FFFF0000FFFFu;
+        r[i + 2] ^= t;
+        r[i] ^= t << 16;
+    }
+    for (int i = 0; i < 8; i += 2) {
+        const uint64_t t = ((r[i] >> 8) ^ r[i + 1]) & 0x00FF00FF00FF00FFu;
+        r[i + 1] ^= t;
+        r[i] ^= t << 8;
+    }
+}
+
+// The 8-bit quarter turns on whole 8 x 8 blocks: eight source rows read as
+// words, transposed, written as eight result rows. Returns how many result
+// rows (a multiple of 8) and columns were done; the rest is left to the
+// pixel loop.
+template <bool Clockwise>
+void quarter_turn_blocks(const uint8_t *src, int32_t w, int32_t h, uint8_t *dst, int32_t outWidth) {
+    const int32_t w8 = w / 8 * 8, h8 = h / 8 * 8;
+    for (int32_t ib = 0; ib < w8; ib += kTile)
+        for (int32_t jb = 0; jb < h8; jb += kTile)
+            for (int32_t i0 = ib; i0 < std::min(w8, ib + kTile); i0 += 8)
+                for (int32_t j0 = jb; j0 < std::min(h8, jb + kTile); j0 += 8) {
+                    uint64_t r[8];
+                    for (int b = 0; b < 8; ++b) {
+                        const int32_t sy = Clockwise ? h - 1 - j0 - b : j0 + b;
+                        const int32_t sx = Clockwise ? i0 : w - 8 - i0;
+                        std::memcpy(&r[b], src + static_cast<size_t>(sy) * w + sx, 8);
+                    }
+                    transpose8(r);
+                    for (int a = 0; a < 8; ++a)
+                        std::memcpy(dst + static_cast<size_t>(i0 + a) * outWidth + j0, &r[Clockwise ? a : 7 - a], 8);
+                }
+}
+
+template <int32_t B>
+void quarter_turn(const uint8_t *src, int32_t w, int32_t h, uint8_t *dst, int32_t outWidth, bool clockwise) {
+    if constexpr (B == 1 && std::endian::native == std::endian::little) {
+        if (clockwise)
+            quarter_turn_blocks<true>(src, w, h, dst, outWidth);
+        else
+            quarter_turn_blocks<false>(src, w, h, dst, outWidth);
+        // Result columns h8.. of every row and rows w8.. of the first h8 columns.
+        const int32_t w8 = w / 8 * 8, h8 = h / 8 * 8;
+        quarter_turn_pixels<1>(src, w, h, dst, outWidth, clockwise, 0, w, h8, h);
+        quarter_turn_pixels<1>(src, w, h, dst, outWidth, clockwise, w8, w, 0, h8);
+    } else {
+        quarter_turn_pixels<B>(src, w, h, dst, outWidth, clockwise, 0, w, 0, h);
+    }
     if (outWidth > h)
         for (int32_t i = 0; i < w; ++i)
-            std::memset(dst + i * dstRow + static_cast<size_t>(h) * B, 0, static_cast<size_t>(outWidth - h) * B);
+            std::memset(dst + i * static_cast<size_t>(outWidth) * B + static_cast<size_t>(h) * B, 0,
+                        static_cast<size_t>(outWidth - h) * B);
 }
 
 PXImage *rotate_quarter(const PXImage *src, bool clockwise) {

@@ -4,6 +4,8 @@
 // in single precision.
 #include <pxfx/toolkit.h>
 
+#include <cmath>
+
 #include "core/internal/memory.hpp"
 #include "toolkit/pximage_check.hpp"
 #include "toolkit/resize_internal.hpp"
@@ -15,6 +17,8 @@ namespace pxfx::packed {
 
 namespace {
 
+constexpr float kMaxPlainWeight = 1048576.0f;
+
 struct Tap {
     int32_t i0, i1; // clamped sample indices
     float w, omw;   // weight of i1 and 1 - weight
@@ -22,30 +26,53 @@ struct Tap {
 
 } // namespace
 
-bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
-                       int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
+// Interpolates pixels of C interleaved samples (pixel p at p * srcStride /
+// p * dstStride, its samples consecutive); every sample as interpolate_plane
+// would on its own plane.
+template <int C>
+bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
+                 int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
     Buffer<Tap> cols = alloc_buffer<Tap>(static_cast<size_t>(dstWidth));
     if (!cols) return false;
+    // With every column weight in 0..1 the row blends stay in 0..255 (no NaN).
+    bool weightsInRange = true;
     for (int32_t j = 0; j < dstWidth; ++j) {
         const float fx = static_cast<float>(j) / rx;
         const int32_t x0 = trunc_sat<int32_t>(fx);
         const float wx = fx - static_cast<float>(x0);
         cols[j] = {clamp_coord(x0, srcWidth), clamp_coord(int64_t{x0} + 1, srcWidth), wx, 1.0f - wx};
+        weightsInRange = weightsInRange && wx >= 0.0f && wx <= 1.0f;
     }
-    // Horizontally interpolated source rows, cached in two slots by row
-    // parity: consecutive output rows mostly reuse one or both.
-    Buffer<float> across = alloc_buffer<float>(2 * static_cast<size_t>(dstWidth));
+    // Horizontally interpolated source rows (C samples per pixel, packed),
+    // cached in two slots by row parity: consecutive output rows mostly reuse
+    // one or both.
+    const size_t n = static_cast<size_t>(dstWidth) * C;
+    Buffer<float> across = alloc_buffer<float>(2 * n);
     if (!across) return false;
+    // One source row as floats (exact), converted once per row in one pass.
+    Buffer<float> row = alloc_buffer<float>(static_cast<size_t>(srcWidth) * C);
+    if (!row) return false;
     int32_t cached[2] = {-1, -1};
     const size_t srcRow = static_cast<size_t>(srcWidth) * srcStride;
     const size_t dstRow = static_cast<size_t>(dstWidth) * dstStride;
     auto row_across = [&](int32_t y) {
-        float *h = across.get() + static_cast<size_t>(y & 1) * dstWidth;
+        float *h = across.get() + static_cast<size_t>(y & 1) * n;
         if (cached[y & 1] == y) return static_cast<const float *>(h);
         const uint8_t *a = src + static_cast<size_t>(y) * srcRow;
+        float *f = row.get();
+        if (srcStride == C) {
+            for (size_t k = 0; k < static_cast<size_t>(srcWidth) * C; ++k)
+                f[k] = static_cast<float>(a[k]);
+        } else {
+            for (int32_t p = 0; p < srcWidth; ++p)
+                for (int c = 0; c < C; ++c)
+                    f[static_cast<size_t>(p) * C + c] = static_cast<float>(a[static_cast<size_t>(p) * srcStride + c]);
+        }
         for (int32_t j = 0; j < dstWidth; ++j) {
             const Tap &t = cols[j];
-            h[j] = t.omw * static_cast<float>(a[t.i0 * srcStride]) + t.w * static_cast<float>(a[t.i1 * srcStride]);
+            const float *p0 = f + static_cast<size_t>(t.i0) * C, *p1 = f + static_cast<size_t>(t.i1) * C;
+            for (int c = 0; c < C; ++c)
+                h[static_cast<size_t>(j) * C + c] = t.omw * p0[c] + t.w * p1[c];
         }
         cached[y & 1] = y;
         return static_cast<const float *>(h);
@@ -61,11 +88,27 @@ bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, 
         const float *top = row_across(Y0);
         const float *bottom = row_across(Y1);
         uint8_t *out = dst + static_cast<size_t>(i) * dstRow;
-        for (int32_t j = 0; j < dstWidth; ++j)
-            out[static_cast<size_t>(j) * dstStride] =
-                static_cast<uint8_t>(trunc_sat<uint32_t>(omwy * top[j] + wy * bottom[j]));
+        // With the row blends in 0..255 and |wy| (so |1 - wy|) at most 2^20,
+        // every result lies well inside int32, where the saturating
+        // conversion to uint32 is a plain one held at 0.
+        if (weightsInRange && std::fabs(wy) <= kMaxPlainWeight && dstStride == C) {
+            for (size_t j = 0; j < n; ++j) {
+                const auto v = static_cast<int32_t>(omwy * top[j] + wy * bottom[j]);
+                out[j] = static_cast<uint8_t>(v < 0 ? 0 : v);
+            }
+        } else {
+            for (int32_t j = 0; j < dstWidth; ++j)
+                for (int c = 0; c < C; ++c)
+                    out[static_cast<size_t>(j) * dstStride + c] = static_cast<uint8_t>(trunc_sat<uint32_t>(
+                        omwy * top[static_cast<size_t>(j) * C + c] + wy * bottom[static_cast<size_t>(j) * C + c]));
+        }
     }
     return true;
+}
+
+bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
+                       int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
+    return interpolate<1>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
 }
 
 } // namespace pxfx::packed
@@ -109,8 +152,7 @@ PXImage *PXImage_Resize(const PXImage *src, int32_t newWidth, int32_t newHeight)
     if (src->bitcount == 8) {
         ok = interpolate_plane(src->data, w, h, 1, out->data, newWidth, newHeight, 1, ry, rx);
     } else if (src->bitcount == 24) {
-        for (int32_t c = 0; c < 3 && ok; ++c)
-            ok = interpolate_plane(src->data + c, w, h, 3, out->data + c, newWidth, newHeight, 3, ry, rx);
+        ok = interpolate<3>(src->data, w, h, 3, out->data, newWidth, newHeight, 3, ry, rx);
     } else {
         // A 16-bit source is read as three-byte pixels; the bytes that this
         // stride puts past the end of its block read as 0.

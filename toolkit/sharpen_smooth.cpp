@@ -4,6 +4,7 @@
 #include <pxfx/toolkit.h>
 
 #include <algorithm>
+#include <cstring>
 #include <utility>
 
 #include "core/internal/memory.hpp"
@@ -97,6 +98,96 @@ template <class F> void median_row_bytes(const uint8_t *const *rows, int32_t siz
     }
 }
 
+// A compare-exchange network that leaves element K of N values at index
+// `out`: Batcher's odd-even merge sort of the next power of two, with the
+// missing inputs taken as +infinity (comparators against them vanish or only
+// move a value) and the comparators that cannot reach `out` dropped.
+template <int N, int K> struct SelectNetwork {
+    struct Op {
+        uint8_t lo, hi; // lo receives the smaller value, hi the larger
+    };
+    static constexpr int kWires = N <= 32 ? 32 : 64;
+    static constexpr int kInfinite = -1;
+    Op ops[kWires * kWires] = {};
+    int count = 0;
+    int out = 0;
+
+    constexpr SelectNetwork() {
+        int slot[kWires] = {};
+        for (int i = 0; i < kWires; ++i)
+            slot[i] = i < N ? i : kInfinite;
+        Op all[kWires * kWires] = {};
+        int n = 0;
+        for (int p = 1; p < kWires; p <<= 1)
+            for (int k = p; k >= 1; k >>= 1)
+                for (int j = k % p; j + k < kWires; j += 2 * k)
+                    for (int i = 0; i < k && i + j + k < kWires; ++i) {
+                        const int a = i + j, b = i + j + k;
+                        if ((a / (2 * p)) != (b / (2 * p))) continue;
+                        if (slot[b] == kInfinite) continue;
+                        if (slot[a] == kInfinite) {
+                            slot[a] = slot[b];
+                            slot[b] = kInfinite;
+                            continue;
+                        }
+                        all[n++] = {static_cast<uint8_t>(slot[a]), static_cast<uint8_t>(slot[b])};
+                    }
+        out = slot[K];
+        bool needed[N] = {};
+        needed[out] = true;
+        bool keep[kWires * kWires] = {};
+        for (int i = n - 1; i >= 0; --i)
+            if (needed[all[i].lo] || needed[all[i].hi]) {
+                keep[i] = true;
+                needed[all[i].lo] = needed[all[i].hi] = true;
+            }
+        for (int i = 0; i < n; ++i)
+            if (keep[i]) ops[count++] = all[i];
+    }
+};
+
+template <int N, int K> inline constexpr SelectNetwork<N, K> kSelect{};
+
+// One compare-exchange of lanes a and b.
+template <size_t Lanes> inline void compare_exchange(uint8_t (&a)[Lanes], uint8_t (&b)[Lanes]) {
+    for (size_t j = 0; j < Lanes; ++j) {
+        const uint8_t x = a[j], y = b[j];
+        a[j] = x < y ? x : y;
+        b[j] = x < y ? y : x;
+    }
+}
+
+// The whole network unrolled, every lane index a constant.
+template <const auto &Net, size_t Lanes, size_t N, size_t... I>
+inline void apply_network(uint8_t (&v)[N][Lanes], std::index_sequence<I...>) {
+    (compare_exchange(v[Net.ops[I].lo], v[Net.ops[I].hi]), ...);
+}
+
+// Median of byte samples through the selection network, kLanes samples at a
+// time: value v of lane j is the window sample v (row-major) of sample i0 + j.
+template <int Size> void median_row_network(const uint8_t *const *rows, int32_t channels, size_t n, int32_t *acc) {
+    constexpr int N = Size * Size, half = Size / 2;
+    constexpr const auto &kNet = kSelect<N, N / 2>;
+    constexpr size_t kLanes = 16;
+    uint8_t v[N][kLanes];
+    for (size_t i0 = 0; i0 < n; i0 += kLanes) {
+        const size_t m = std::min(kLanes, n - i0);
+        for (int ky = 0; ky < Size; ++ky)
+            for (int kx = 0; kx < Size; ++kx) {
+                const uint8_t *src =
+                    rows[ky] + static_cast<ptrdiff_t>(i0) + static_cast<ptrdiff_t>(kx - half) * channels;
+                uint8_t *lane = v[ky * Size + kx];
+                for (size_t j = 0; j < m; ++j)
+                    lane[j] = src[j];
+                for (size_t j = m; j < kLanes; ++j)
+                    lane[j] = 0;
+            }
+        apply_network<kSelect<N, N / 2>>(v, std::make_index_sequence<kSelect<N, N / 2>.count>{});
+        for (size_t j = 0; j < m; ++j)
+            acc[i0 + j] = v[kNet.out][j];
+    }
+}
+
 // Median of 16-bit samples by selection of element size^2 / 2.
 void median_row_words(const uint16_t *const *rows, int32_t size, size_t width, int32_t *acc) {
     const int32_t half = size / 2, k = size * size / 2;
@@ -119,9 +210,12 @@ template <class F> bool median_smooth(PXImage *img, int32_t size) {
     const typename F::T *rows[7];
     for (int32_t y = 0; y < img->height; ++y) {
         win.rows_for(y, rows);
-        if constexpr (sizeof(typename F::T) == 1)
-            median_row_bytes<F>(rows, size, static_cast<size_t>(img->width), acc.get());
-        else
+        if constexpr (sizeof(typename F::T) == 1) {
+            if (size == 5)
+                median_row_network<5>(rows, F::kChannels, n, acc.get());
+            else
+                median_row_bytes<F>(rows, size, static_cast<size_t>(img->width), acc.get());
+        } else
             median_row_words(rows, size, static_cast<size_t>(img->width), acc.get());
         store_row<F>(img, y, acc.get(), n, [](int32_t v) { return v; });
     }

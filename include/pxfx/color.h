@@ -135,9 +135,12 @@ PXFX_API int32_t PX_IMG_Emboss1(const Image *src, Image **out);
  * too. A 16-bit image (or any other bit count of 8 or more) is not smoothed:
  * it receives the untouched white working image, as the filter always did,
  * and the call returns 1. Sums are exact at every size (no 32-bit wrap).
+ * The 8-, 24- and 32-bit images are smoothed in place, keeping only the
+ * source rows still needed (size / 2 + 2 rows); when that memory cannot be had
+ * a whole working image is used instead.
  * Returns 1 when processed, 0 (image unchanged) when the image is null, has
- * no pixels or fewer than 8 bits, size is 0, negative or above 2^20, or the
- * working image cannot be made. */
+ * no pixels or fewer than 8 bits, size is 0, negative or above 2^20, or no
+ * working memory can be had. */
 PXFX_API int32_t Filter_fast(Image *image, int32_t size, int32_t offset);
 /* Box smoothing by a strength: size min(strength, 100) / 10, nothing for a
  * strength of 3 or less (a plain copy). With out null src itself is smoothed;

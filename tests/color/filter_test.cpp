@@ -104,6 +104,16 @@ TEST(Filter, MatchesAccessorVersionAliasingAndRefusals) {
                 ASSERT_EQ(run(src.get(), p, mask.get(), nullptr), 1);
                 ASSERT_EQ(diff(src.get(), want.get()), "") << "in place, mask " << maskBits << ", k" << size;
             }
+    // Rows longer than one accumulation pass (1024 pixels): the box, small
+    // weights (16-bit sums) and random ones.
+    for (int32_t bc : {8, 24, 32})
+        for (const Params &p :
+             {Params{std::vector<int32_t>(9, 1), 3, 9, 0, 0}, random_params(rng, 3), random_params(rng, 5)}) {
+            Owned src = random_image(2100, 2, bc, seed++), dst = make(2100, 2, bc), want = make(2100, 2, bc);
+            reference_filter(src.get(), p, nullptr, want.get());
+            ASSERT_EQ(run(src.get(), p, nullptr, dst.get()), 1);
+            ASSERT_EQ(diff(dst.get(), want.get()), "") << bc << " bits, long rows, k" << p.size;
+        }
     // A destination sharing the source's pixels is filtered from a snapshot.
     const Params upLeft{{1, 0, 0, 0, 0, 0, 0, 0, 0}, 3, 1, 0, 0};
     Owned same = random_image(6, 5, 8, 4), shifted = make(6, 5, 8);

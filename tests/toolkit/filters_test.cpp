@@ -13,7 +13,7 @@ using namespace pxtest;
 
 namespace {
 
-const int kSizes[][2] = {{1, 1}, {1, 9}, {9, 1}, {2, 3}, {8, 8}, {13, 7}, {6, 60}};
+const int kSizes[][2] = {{1, 1}, {1, 9}, {9, 1}, {2, 3}, {8, 8}, {13, 7}, {6, 60}, {37, 5}};
 
 std::vector<int> sharpen_kernel(int strength) {
     if (strength < 40) return {0, -1, 0, -1, 5, -1, 0, -1, 0};

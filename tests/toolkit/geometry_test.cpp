@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <utility>
 
 #include "toolkit/px_images.hpp"
 
@@ -74,20 +75,25 @@ TEST(Crop, RoundsWidthUpAndRunsIntoFollowingRows) {
 }
 
 TEST(Rotate, QuarterTurnsMapPixelsAndClearPadding) {
-    for (int bits : {8, 16, 24}) {
-        const int w = 10, h = 5, bpp = bits / 8;
-        PX src = px_random(w, h, bits, 11);
-        PX r90(PXImage_Rotate90(src.get())), r270(PXImage_Rotate270(src.get())), r180(PXImage_Rotate180(src.get()));
-        ASSERT_TRUE(r90 && r270 && r180 && r90->width == 8 && r90->height == 10);
-        for (int b = 0; b < bpp; ++b)
-            for (int i = 0; i < w; ++i)
-                for (int j = 0; j < w; ++j) {
-                    auto at = [&](const PX &im, int y, int x) { return im->data[(y * im->width + x) * bpp + b]; };
-                    EXPECT_EQ(j < 8 ? at(r90, i, j) : 0, j < h ? at(src, j, w - 1 - i) : 0);
-                    EXPECT_EQ(j < 8 ? at(r270, i, j) : 0, j < h ? at(src, h - 1 - j, i) : 0);
-                    EXPECT_EQ(i < h ? at(r180, i, j) : 0, i < h ? at(src, h - 1 - i, w - 1 - j) : 0);
-                }
-    }
+    // Sizes below, at and across the 8 x 8 blocks and 32-pixel tiles.
+    for (int bits : {8, 16, 24})
+        for (auto [w, h] : {std::pair{10, 5}, {16, 8}, {45, 19}, {9, 70}}) {
+            const int bpp = bits / 8, ow = (h + 7) / 8 * 8;
+            PX src = px_random(w, h, bits, 11);
+            PX r90(PXImage_Rotate90(src.get())), r270(PXImage_Rotate270(src.get())), r180(PXImage_Rotate180(src.get()));
+            ASSERT_TRUE(r90 && r270 && r180 && r90->width == ow && r90->height == w);
+            auto at = [&](const PX &im, int y, int x, int b) { return im->data[(y * im->width + x) * bpp + b]; };
+            for (int b = 0; b < bpp; ++b)
+                for (int i = 0; i < w; ++i)
+                    for (int j = 0; j < ow; ++j) {
+                        ASSERT_EQ(at(r90, i, j, b), j < h ? at(src, j, w - 1 - i, b) : 0) << w << "x" << h;
+                        ASSERT_EQ(at(r270, i, j, b), j < h ? at(src, h - 1 - j, i, b) : 0) << w << "x" << h;
+                    }
+            for (int b = 0; b < bpp; ++b)
+                for (int i = 0; i < h; ++i)
+                    for (int j = 0; j < w; ++j)
+                        ASSERT_EQ(at(r180, i, j, b), at(src, h - 1 - i, w - 1 - j, b));
+        }
 }
 
 TEST(Zoom, InAveragesWithRoundingOutDecimatesAndHoldsTheLastColumn) {
