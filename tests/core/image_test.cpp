@@ -74,15 +74,6 @@ TEST(PixelAccess, PackedIndexAndUnreadableFormats) {
     EXPECT_EQ(GetPixelColor(&twelve, 0, 0), 0xFF000000u); // opaque black, writes ignored
     SetPixelColor(&twelve, 0, 0, 0);
     EXPECT_EQ(odd[0], 1);
-    // A record freed but kept has no pixels; a second release takes the record.
-    Image *kept = malloc_Image(4, 4, 24);
-    free_Image(&kept, 1);
-    ASSERT_NE(kept, nullptr);
-    EXPECT_EQ(kept->bits, nullptr);
-    EXPECT_EQ(GetPixelColor(kept, 0, 0), 0u);
-    free_Image(&kept, 1);
-    free_Image(&kept, 0);
-    EXPECT_EQ(kept, nullptr);
 }
 
 TEST(ImageCopy, ConvertsClampsAndKeepsDestinationAlpha) {

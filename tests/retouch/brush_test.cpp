@@ -182,9 +182,7 @@ TEST(Eradicate, PullsDarkPixelsTowardTheSurroundings) {
 
 TEST(Bezier, PointsAlongTheCurve) {
     const PXPoint c[4] = {{0, 0}, {10, 30}, {20, 30}, {30, 0}};
-    PXPoint out[5] = {{7, 7}, {7, 7}};
-    ComputeBezier(c, 0, out);
-    EXPECT_EQ(out[0].x, 7);
+    PXPoint out[5];
     ComputeBezier(c, 1, out);
     EXPECT_EQ(out[0].x, 0);
     ComputeBezier(c, 5, out);
