@@ -9,6 +9,7 @@
 #include <cstring>
 #include <type_traits>
 
+#include "color/box_filter.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
@@ -96,7 +97,9 @@ Image *smoothed_copy(const Image *picture, int32_t size) {
     ImagePtr copy = make_image(picture->width, picture->height, static_cast<int32_t>(picture->bitCount));
     if (!copy) return nullptr;
     PX_Img_Copy(copy.get(), picture);
-    Filter_fast(copy.get(), size, 0);
+    // Sizes the box filter refuses leave the copy as it is; any other
+    // refusal is its working memory failing.
+    if (Filter_fast(copy.get(), size, 0) == 0 && size <= kMaxBoxSize) return nullptr;
     return copy.release();
 }
 

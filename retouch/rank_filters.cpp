@@ -104,8 +104,6 @@ int32_t Best_Color(Image *img, int32_t size) {
 
 void MoreLight(const Image *src, int32_t size, Image **dst) {
     if (!has_pixels(src) || dst == nullptr || size > kMaxMoreLightSize) return;
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return;
     const int32_t w = src->width, h = src->height;
     Buffer<uint8_t> own;
     size_t stride = 0;
@@ -135,6 +133,10 @@ void MoreLight(const Image *src, int32_t size, Image **dst) {
                                         });
         if (!ok) return;
     }
+    // The result is prepared only once the lift map stands, so a call short
+    // of working memory leaves the slot as it was.
+    Image *out = acquire_result(src, dst);
+    if (out == nullptr) return;
     with_formats(src, out, [&](auto fs, auto fd) {
         lift_pixels<decltype(fs), decltype(fd)>(src, out, lift.get(), static_cast<size_t>(w), kLiftWeight, kLiftWeight,
                                                 kLiftWeight);

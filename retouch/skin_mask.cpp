@@ -125,11 +125,14 @@ int32_t CreateFaceMaskImg(const Image *src, Image **mask) {
 }
 
 int32_t SmileDetect(const Image *src, Image **dst, int32_t) {
+    if (dst == nullptr) return 0;
+    // The mask first: a call short of memory leaves the slot as it was.
+    Image *mask = nullptr;
+    if (!CreateFaceMaskImg(src, &mask)) return 0;
+    ImagePtr owned(mask);
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
-    Image *mask = nullptr;
-    if (CreateFaceMaskImg(src, &mask)) PX_Img_Copy(out, mask);
-    free_Image(&mask, 0);
+    PX_Img_Copy(out, mask);
     return 1;
 }
 

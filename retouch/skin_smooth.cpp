@@ -64,9 +64,10 @@ int32_t alg_Img_smooth_1(const Image *src, Image **dst) {
     const int32_t w = src->width, h = src->height;
     Buffer<uint8_t> spots = alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h)));
     if (!spots) return 0;
-    // Without a mask no pixel is skin and the source is copied unchanged.
+    // A mask that cannot be made fails the call like the spot map: left
+    // unchecked, it would read as no skin and pass the source off as smoothed.
     Image *mask = nullptr;
-    const bool ok = !CreateFaceMaskImg(src, &mask) || spot_map(mask, spots.get());
+    const bool ok = CreateFaceMaskImg(src, &mask) && spot_map(mask, spots.get());
     free_Image(&mask, 0);
     if (!ok) return 0;
     with_formats(src, out, [&](auto fs, auto fd) {
@@ -86,9 +87,8 @@ int32_t alg_Img_Skin(const Image *src, Image **dst, int32_t lighten) {
     uint8_t tone[256];
     for (int32_t i = 0; i < 256; ++i)
         tone[i] = static_cast<uint8_t>((52 * i + 75 * ZANTOFILTER[i] + 63) / 127);
-    alg_Img_smooth_1(src, dst);
+    if (!alg_Img_smooth_1(src, dst)) return 0;
     Image *out = *dst;
-    if (!has_pixels(out)) return 0;
     const int32_t lightUps = lighten != 0 ? 2 : 1;
     if (out->bitCount == 8 || out->bitCount == 24 || out->bitCount == 32) {
         // Byte channels store every intermediate value exactly, so the

@@ -36,14 +36,13 @@ Curves make_curves(int32_t amount) {
     return c;
 }
 
-// taps: offsets (from -size) of the non-zero kernel weights, in order.
+// taps: offsets (from -size) of the non-zero kernel weights, in order;
+// colours and dark: room for a row padded by size on both sides.
 template <class FS, class FD>
-bool blur_rows(const Image *src, Image *out, int32_t size, const int32_t *taps, int32_t ntaps, const Curves &cv) {
+void blur_rows(const Image *src, Image *out, int32_t size, const int32_t *taps, int32_t ntaps, const Curves &cv,
+               uint32_t *colours, uint8_t *dark) {
     const int32_t w = src->width;
     const size_t padded = static_cast<size_t>(w) + 2 * static_cast<size_t>(size);
-    Buffer<uint32_t> colours = alloc_buffer<uint32_t>(padded);
-    Buffer<uint8_t> dark = alloc_buffer<uint8_t>(padded);
-    if (!colours || !dark) return false;
     for (int32_t y = 0; y < src->height; ++y) {
         const typename FS::CRow in = FS::crow(src, y);
         for (size_t i = 0; i < padded; ++i) {
@@ -64,7 +63,6 @@ bool blur_rows(const Image *src, Image *out, int32_t size, const int32_t *taps, 
             FD::store(o, x, pack(cv.b[b], cv.g[g], cv.r[r], alpha_of(last)));
         }
     }
-    return true;
 }
 
 } // namespace
@@ -74,6 +72,12 @@ extern "C" {
 void thresholdBlur(int32_t, int32_t, int32_t size, int32_t amount, const Image *src, Image **dst) {
     size = clamp_to(size, 1, 10);
     amount = clamp_to(amount, 0, 100);
+    if (!has_pixels(src) || dst == nullptr) return;
+    // Working rows first: a call short of memory leaves the slot as it was.
+    const size_t padded = static_cast<size_t>(src->width) + 2 * static_cast<size_t>(size);
+    Buffer<uint32_t> colours = alloc_buffer<uint32_t>(padded);
+    Buffer<uint8_t> dark = alloc_buffer<uint8_t>(padded);
+    if (!colours || !dark) return;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return;
     int32_t taps[21], ntaps = 0;
@@ -81,8 +85,9 @@ void thresholdBlur(int32_t, int32_t, int32_t size, int32_t amount, const Image *
         if (matrixX[size - 1][k] != 0.0f) taps[ntaps++] = k;
     const Curves cv = make_curves(amount);
     if (ntaps == 0) return;
-    with_formats(src, out,
-                 [&](auto fs, auto fd) { blur_rows<decltype(fs), decltype(fd)>(src, out, size, taps, ntaps, cv); });
+    with_formats(src, out, [&](auto fs, auto fd) {
+        blur_rows<decltype(fs), decltype(fd)>(src, out, size, taps, ntaps, cv, colours.get(), dark.get());
+    });
 }
 
 } // extern "C"

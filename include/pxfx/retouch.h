@@ -36,16 +36,21 @@ typedef struct PXTint {
 /* New 8-bit skin mask (green of skin pixels, 0 elsewhere) into *mask. 1 or 0. */
 PXFX_API int32_t CreateFaceMaskImg(const Image *src, Image **mask);
 /* The skin mask as a picture of the source's format in *dst; `unused` is ignored.
- * 1; 0 for a source without pixels or a null slot. The temporary mask is released. */
+ * 1; 0 for a source without pixels, a null slot or a mask that cannot be made (the
+ * mask is made before the slot is prepared, so the slot is then left as given). The
+ * temporary mask is released. */
 PXFX_API int32_t SmileDetect(const Image *src, Image **dst, int32_t unused);
 /* Brightens small dark spots on the skin into *dst. 1; 0 for a source without pixels,
- * a null slot or a failed allocation (the slot then holds the prepared result image, its
- * pixels not written). Without a skin mask the source is copied. */
+ * a null slot or a failed allocation of the spot map, the skin mask or their working
+ * rows (the slot then holds the prepared result image, its pixels not written). A
+ * picture without skin is copied. */
 PXFX_API int32_t alg_Img_smooth_1(const Image *src, Image **dst);
-/* alg_Img_smooth_1 followed by LightUP on the result. */
+/* alg_Img_smooth_1 followed by LightUP on the slot's image, also when the smoothing
+ * failed for want of memory (the prepared, unwritten image is then lightened). */
 PXFX_API void alg_Img_smooth(const Image *src, Image **dst);
 /* Skin smoothing, LightUP once (twice when lighten is non-zero) and a tone curve. 1;
- * 0 for a source without pixels, a null slot or no result image. */
+ * 0 for a source without pixels, a null slot, or when alg_Img_smooth_1 fails (its
+ * prepared, unwritten result image is then left in the slot, not toned). */
 PXFX_API int32_t alg_Img_Skin(const Image *src, Image **dst, int32_t lighten);
 /* Maps blue, green and red through ZANTOMOPI in place. 1, or 0 for null or no pixels. */
 PXFX_API int32_t LightUP(Image *img);
@@ -54,7 +59,9 @@ PXFX_API int32_t LightUP(Image *img);
 PXFX_API int32_t Best_Color(Image *img, int32_t size);
 /* Lifts dark specks of an 8-bit image by the window's largest value into *dst.
  * Sizes above 255 are refused (the slot is left alone). A size <= 0 reads an empty
- * window: its list stays cleared, so only sizes 0 and -1 (size * size <= 1) lift. */
+ * window: its list stays cleared, so only sizes 0 and -1 (size * size <= 1) lift.
+ * The slot is prepared only after the lift map is computed: when its working memory
+ * cannot be had, the slot is left as given. */
 PXFX_API void MoreLight(const Image *src, int32_t size, Image **dst);
 /* Sorts values[0..count-1] largest first (stable selection); returns values (null stays null). */
 PXFX_API int32_t *Sort_largelow(int32_t *values, int32_t count);
@@ -82,7 +89,9 @@ PXFX_API int32_t ImageExposure(const Image *src, Image **dst, int32_t delta);
 /* 15 x 15 cross median of an 8-bit image into *dst, or in place when dst is null; the
  * result of an empty slot is 8-bit with an uncomputed border of 255. 1 or 0. */
 PXFX_API int32_t MyOneKeyFliter(Image *src, Image **dst);
-/* Blur of near-black values with a tone curve into *dst. */
+/* Blur of near-black values with a tone curve into *dst. A source without pixels or a
+ * null slot does nothing; so does a call whose working rows cannot be had (they are
+ * taken before the slot is prepared, which is then left as given). */
 PXFX_API void thresholdBlur(int32_t unused1, int32_t unused2, int32_t size, int32_t amount, const Image *src,
                             Image **dst);
 
@@ -108,7 +117,9 @@ PXFX_API int32_t alg_Blending(Image *picture, void *unused, int32_t cx, int32_t 
  * cannot be made (a picture alg_Blending refuses, or failed working memory) the output
  * slot is left alone. */
 PXFX_API int32_t alg_Img_Blending(Image *src, Image **out);
-/* Smoothing brush: pastes a box-smoothed copy (cached in *cache when given). 1 or 0. */
+/* Smoothing brush: pastes a box-smoothed copy (cached in *cache when given). 1; 0 for a
+ * picture refused, or when the smoothed copy or the smoothing's working memory cannot be
+ * had (a cache that did not match is then released and the slot left empty). */
 PXFX_API int32_t alg_smooth(Image *picture, int32_t unused, int32_t cx, int32_t cy, int32_t r, int32_t strength,
                             Image **cache);
 /* Pulls a disc toward the mean colour of its surroundings; a rectangle with no pixel

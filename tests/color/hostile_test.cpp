@@ -70,27 +70,3 @@ TEST(Hostile, HueMasksAndDestinations) {
             EXPECT_TRUE(bad->snapshot() == before) << bad->what;
         }
 }
-
-// A call that runs short of memory fails, or makes what a full run makes.
-TEST(Hostile, FiltersShortOfMemoryFailOrFinish) {
-    PXTEST_REQUIRE_ALLOCATION_HOOK();
-    using Fn = int32_t (*)(const Image *, Image **);
-    Owned src = random_image(9, 7, 32, 5);
-    for (Fn fn : {PX_IMG_Blur, PX_IMG_Soften, PX_IMG_Sharpen, PX_IMG_Emboss1,
-                  +[](const Image *s, Image **d) { return PX_IMG_Transform(s, d, 130, 1); },
-                  +[](const Image *s, Image **d) { return PX_IMG_Smooth(s, d, 40); },
-                  +[](const Image *s, Image **d) { return int32_t((*d = Combine(s, s, s, s, 2)) != nullptr); },
-                  +[](const Image *s, Image **d) {
-                      Slot b, c;
-                      return Split(s, d, &b, &c, nullptr, 3);
-                  }}) {
-        Slot want;
-        ASSERT_EQ(fn(src.get(), &want), 1);
-        sweep_allocation_failures([&] {
-            Slot out;
-            if (fn(src.get(), &out) == 1) {
-                EXPECT_EQ(diff(out.get(), want.get()), "");
-            }
-        });
-    }
-}
