@@ -12,6 +12,7 @@
 
 #include <cstdint>
 
+#include "core/internal/byte_map.hpp"
 #include "core/internal/pixel.hpp"
 
 namespace pxfx {
@@ -31,26 +32,15 @@ template <class F, class Pick> void map_rows(const Image *src, Image *dst, Pick 
         const typename F::CRow in = F::crow(src, y);
         const typename F::Row out = F::row(dst, y);
         if constexpr (F::kBitCount == 32) {
-            for (int32_t x = 0; x < w; ++x) {
-                const uint8_t *p = in + 4 * x;
-                uint8_t *q = out + 4 * x;
-                q[0] = t->b[p[0]];
-                q[1] = t->g[p[1]];
-                q[2] = t->r[p[2]];
-                q[3] = p[3];
-            }
+            const uint8_t *tables[4] = {t->b, t->g, t->r, kIdentityMap};
+            map_bytes(in, out, static_cast<size_t>(w), 4, tables);
         } else if constexpr (F::kBitCount == 24) {
-            for (int32_t x = 0; x < w; ++x) {
-                const uint8_t *p = in + 3 * x;
-                uint8_t *q = out + 3 * x;
-                q[0] = t->b[p[0]];
-                q[1] = t->g[p[1]];
-                q[2] = t->r[p[2]];
-            }
+            const uint8_t *tables[3] = {t->b, t->g, t->r};
+            map_bytes(in, out, static_cast<size_t>(w), 3, tables);
         } else if constexpr (F::kBitCount == 8) {
             // A gray pixel reads as three equal channels and stores its green.
-            for (int32_t x = 0; x < w; ++x)
-                out[x] = t->g[in[x]];
+            const uint8_t *tables[1] = {t->g};
+            map_bytes(in, out, static_cast<size_t>(w), 1, tables);
         } else {
             for (int32_t x = 0; x < w; ++x) {
                 const uint32_t c = F::load(in, x);

@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cstring>
 
+#include "core/internal/byte_map.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
@@ -84,46 +85,37 @@ template <class Fn> uint32_t point_effect(Image *src, Image **dst, Fn fn) {
     return 1;
 }
 
-// warm and cold on the bytes of 24- and 32-bit rows (blue, green, red, then
-// alpha, which is kept), written so that the compiler can vectorise them.
-template <int Bpp, bool Warm> void tone_rows(const Image *src, Image *dst) {
-    const int32_t w = src->width;
-    for (int32_t y = 0; y < src->height; ++y) {
-        const uint8_t *in = row_ptr(src, y);
-        uint8_t *out = row_ptr(dst, y);
-        for (int32_t x = 0; x < w; ++x) {
-            // Byte arithmetic throughout (sums saturate, differences cannot
-            // go below 0), so each step maps to one vector byte operation.
-            const uint8_t b = in[Bpp * x], g = in[Bpp * x + 1], r = in[Bpp * x + 2];
-            uint8_t b2, g2, r2;
-            if constexpr (Warm) {
-                const uint8_t rq = static_cast<uint8_t>(r >> 2);
-                r2 = static_cast<uint8_t>(std::min(r + rq, 255));
-                const uint8_t gd = static_cast<uint8_t>(r2 >> 3);
-                g2 = g > gd ? static_cast<uint8_t>(g - gd) : 0;
-                b2 = static_cast<uint8_t>(b - (b >> 4));
-            } else {
-                r2 = static_cast<uint8_t>(r - (r >> 2));
-                const uint8_t gd = static_cast<uint8_t>(r2 >> 4), bq = static_cast<uint8_t>(b >> 2);
-                g2 = static_cast<uint8_t>(std::min(g + gd, 255));
-                b2 = static_cast<uint8_t>(std::min(b + bq, 255));
-            }
-            out[Bpp * x] = b2;
-            out[Bpp * x + 1] = g2;
-            out[Bpp * x + 2] = r2;
-            if constexpr (Bpp == 4) out[Bpp * x + 3] = in[Bpp * x + 3];
+// warm and cold on 24- and 32-bit rows as byte tables: blue and red through
+// their own maps, green moved by a map of the pixel's red, alpha kept.
+ToneTables tone_tables(bool warm) {
+    static const auto tables = [] {
+        struct {
+            uint8_t b[2][256], r[2][256], q[2][256];
+        } t;
+        for (uint32_t v = 0; v < 256; ++v) {
+            const uint32_t warmRed = std::min(v + (v >> 2), 255u), coldRed = v - (v >> 2);
+            t.b[0][v] = static_cast<uint8_t>(std::min(v + (v >> 2), 255u)),
+            t.b[1][v] = static_cast<uint8_t>(v - (v >> 4));
+            t.r[0][v] = static_cast<uint8_t>(coldRed), t.r[1][v] = static_cast<uint8_t>(warmRed);
+            t.q[0][v] = static_cast<uint8_t>(coldRed >> 4), t.q[1][v] = static_cast<uint8_t>(warmRed >> 3);
         }
-    }
+        return t;
+    }();
+    return {tables.b[warm], tables.r[warm], tables.q[warm], warm};
+}
+
+template <bool Warm> void tone_rows(const Image *src, Image *dst) {
+    const ToneTables t = tone_tables(Warm);
+    const int channels = static_cast<int>(src->bitCount / 8);
+    for (int32_t y = 0; y < src->height; ++y)
+        tone_bytes(row_ptr(src, y), row_ptr(dst, y), static_cast<size_t>(src->width), channels, t);
 }
 
 template <bool Warm, class Fn> uint32_t tone_effect(Image *src, Image **dst, Fn fn) {
     if (src == nullptr || (src->bitCount != 24 && src->bitCount != 32)) return point_effect(src, dst, fn);
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
-    if (src->bitCount == 24)
-        tone_rows<3, Warm>(src, out);
-    else
-        tone_rows<4, Warm>(src, out);
+    tone_rows<Warm>(src, out);
     return 1;
 }
 

@@ -12,6 +12,7 @@
 #include <cstdint>
 #include <cstring>
 
+#include "core/internal/byte_map.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 
@@ -147,12 +148,20 @@ void lift_pixels(const Image *src, Image *dst, const uint8_t *amount, size_t str
 // Maps blue, green and red of every pixel through per-channel tables in
 // place; alpha kept.
 template <class F> void map_channels(Image *img, const uint8_t tb[256], const uint8_t tg[256], const uint8_t tr[256]) {
-    for (int32_t y = 0; y < img->height; ++y) {
-        const typename F::CRow in = F::crow(img, y);
-        const typename F::Row out = F::row(img, y);
-        for (int32_t x = 0; x < img->width; ++x) {
-            const uint32_t c = F::load(in, x);
-            F::store(out, x, pack(tb[blue_of(c)], tg[green_of(c)], tr[red_of(c)], alpha_of(c)));
+    if constexpr (F::kBitCount == 8 || F::kBitCount == 24 || F::kBitCount == 32) {
+        // Byte channels: a gray pixel stores the green of its three equal channels.
+        constexpr int channels = static_cast<int>(F::kBitCount / 8);
+        const uint8_t *tables[4] = {channels == 1 ? tg : tb, tg, tr, kIdentityMap};
+        for (int32_t y = 0; y < img->height; ++y)
+            map_bytes(row_ptr(img, y), row_ptr(img, y), static_cast<size_t>(img->width), channels, tables);
+    } else {
+        for (int32_t y = 0; y < img->height; ++y) {
+            const typename F::CRow in = F::crow(img, y);
+            const typename F::Row out = F::row(img, y);
+            for (int32_t x = 0; x < img->width; ++x) {
+                const uint32_t c = F::load(in, x);
+                F::store(out, x, pack(tb[blue_of(c)], tg[green_of(c)], tr[red_of(c)], alpha_of(c)));
+            }
         }
     }
 }

@@ -7,6 +7,7 @@
 #include <cmath>
 #include <cstdlib>
 
+#include "core/internal/byte_map.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/pixel.hpp"
@@ -34,9 +35,10 @@ template <int Bpp> void apply(Image *img, const Map *m, const Image *mask) {
     for (int32_t y = 0; y < h; ++y) {
         uint8_t *row = row_ptr(img, y);
         if (mask == nullptr) {
-            for (int32_t x = 0; x < w; ++x)
-                for (int k = 0; k < Bpp; ++k)
-                    row[Bpp * x + k] = m[k][row[Bpp * x + k]];
+            const uint8_t *tables[Bpp];
+            for (int k = 0; k < Bpp; ++k)
+                tables[k] = m[k];
+            map_bytes(row, row, static_cast<size_t>(w), Bpp, tables);
             continue;
         }
         const uint8_t *sel = row_ptr(mask, y);

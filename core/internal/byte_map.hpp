@@ -1,0 +1,36 @@
+// Byte tables over rows of interleaved channels: byte k of every pixel goes
+// through tables[k]. The per-channel maps of the tone effects, the curve
+// filters and the retouching curves all end here, so the one routine that
+// does the lookups can use the widest table-lookup instructions the machine
+// has. Every path gives the same bytes as the plain loop.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+namespace pxfx {
+
+// table[v] = v: the channel a map leaves alone (alpha).
+extern const uint8_t kIdentityMap[256];
+
+// Maps `pixels` pixels of `channels` bytes (1, 3 or 4) from in to out; in may
+// equal out. tables holds `channels` pointers to 256-entry tables.
+void map_bytes(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const uint8_t *const *tables);
+
+// The same through the plain loop only (the reference of the fast paths).
+void map_bytes_portable(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const uint8_t *const *tables);
+
+// A tone map of 3- and 4-byte pixels (blue, green, red, alpha): blue and red
+// through their tables, green raised (or, with lower, lowered) by q[red],
+// saturating at 255 (or 0); alpha kept.
+struct ToneTables {
+    const uint8_t *b, *r, *q;
+    bool lower;
+};
+void tone_bytes(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const ToneTables &t);
+void tone_bytes_portable(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const ToneTables &t);
+
+// Whether map_bytes uses vector table lookups on this machine and build.
+bool map_bytes_vectorised();
+
+} // namespace pxfx
