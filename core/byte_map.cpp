@@ -107,21 +107,23 @@ template <int C> PXFX_VBMI void vbmi(const uint8_t *in, uint8_t *out, size_t pix
     plain<C>(in + bytes, out + bytes, pixels - blocks * 64, t);
 }
 
-// A 64-byte block of a tone map: green lanes take their adjustment from the
-// byte after them (their red), read by a second load one byte further on.
-PXFX_VBMI inline void tone_block(const uint8_t *in, uint8_t *out, const Table512 &tb, const Table512 &tr,
-                                 const Table512 &tq, bool lower, uint64_t mb, uint64_t mg, uint64_t mr) {
-    const __m512i v = _mm512_loadu_si512(in);
-    const __m512i d = lookup(tq, _mm512_loadu_si512(in + 1));
+// A 64-byte block v of a tone map; next holds the bytes one further on, so
+// green lanes find their red there.
+template <bool Lower>
+PXFX_VBMI inline __m512i tone_block(__m512i v, __m512i next, const Table512 &tb, const Table512 &tr, const Table512 &tq,
+                                    uint64_t mb, uint64_t mg, uint64_t mr) {
+    const __m512i d = lookup(tq, next);
     __m512i r = _mm512_mask_mov_epi8(v, mb, lookup(tb, v));
     r = _mm512_mask_mov_epi8(r, mr, lookup(tr, v));
-    r = _mm512_mask_mov_epi8(r, mg, lower ? _mm512_subs_epu8(v, d) : _mm512_adds_epu8(v, d));
-    _mm512_storeu_si512(out, r);
+    return _mm512_mask_mov_epi8(r, mg, Lower ? _mm512_subs_epu8(v, d) : _mm512_adds_epu8(v, d));
 }
 
-template <int C> PXFX_VBMI void vbmi_tone(const uint8_t *in, uint8_t *out, size_t pixels, const ToneTables &t) {
+template <int C, bool Lower>
+PXFX_VBMI void vbmi_tone_rows(const uint8_t *in, uint8_t *out, size_t pixels, const ToneTables &t) {
     // Groups of C blocks (the channel pattern repeats in each), as long as a
-    // byte follows the group to be read by the second load.
+    // byte follows the group: that byte alone is read, and each block's bytes
+    // one further on are its own shifted by one lane with the next block's
+    // first byte moved in.
     const size_t groups = pixels == 0 ? 0 : (C * pixels - 1) / (64 * C), bytes = groups * 64 * C;
     const Table512 tb = load_table(t.b), tr = load_table(t.r), tq = load_table(t.q);
     uint64_t mb[C], mg[C], mr[C];
@@ -129,10 +131,28 @@ template <int C> PXFX_VBMI void vbmi_tone(const uint8_t *in, uint8_t *out, size_
         const int phase = (64 * k) % C;
         mb[k] = lanes(C, phase, 0), mg[k] = lanes(C, phase, 1), mr[k] = lanes(C, phase, 2);
     }
-    for (size_t i = 0; i < bytes; i += 64 * C)
+    alignas(64) uint8_t shift[64];
+    for (int j = 0; j < 64; ++j)
+        shift[j] = static_cast<uint8_t>(j + 1);
+    const __m512i byOne = _mm512_load_si512(shift);
+    for (size_t i = 0; i < bytes; i += 64 * C) {
+        __m512i v[C + 1];
         for (int k = 0; k < C; ++k)
-            tone_block(in + i + 64 * k, out + i + 64 * k, tb, tr, tq, t.lower, mb[k], mg[k], mr[k]);
+            v[k] = _mm512_loadu_si512(in + i + 64 * k);
+        v[C] = _mm512_castsi128_si512(_mm_cvtsi32_si128(in[i + 64 * C]));
+        for (int k = 0; k < C; ++k) {
+            const __m512i next = _mm512_permutex2var_epi8(v[k], byOne, v[k + 1]);
+            _mm512_storeu_si512(out + i + 64 * k, tone_block<Lower>(v[k], next, tb, tr, tq, mb[k], mg[k], mr[k]));
+        }
+    }
     plain_tone<C>(in + bytes, out + bytes, pixels - groups * 64, t);
+}
+
+template <int C> PXFX_VBMI void vbmi_tone(const uint8_t *in, uint8_t *out, size_t pixels, const ToneTables &t) {
+    if (t.lower)
+        vbmi_tone_rows<C, true>(in, out, pixels, t);
+    else
+        vbmi_tone_rows<C, false>(in, out, pixels, t);
 }
 
 bool has_vbmi() {
