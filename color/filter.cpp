@@ -70,6 +70,9 @@ struct Finish {
     // wrapping, the results of all of them, indexed by sum - low.
     const uint8_t *table = nullptr;
     uint32_t low = 0;
+    // When non-zero: every sum the taps can make is at least 0 and below
+    // 2^16, and its result is (sum * mul) >> 16, which rows finish in vectors.
+    uint16_t mul = 0;
 
     uint8_t slow(uint32_t acc) const {
         const int32_t sum = static_cast<int32_t>(acc);
@@ -87,6 +90,19 @@ struct Finish {
             return table != nullptr ? table[acc - low] : slow(acc);
     }
 };
+
+// The results of n 16-bit sums into out: by the multiplier in one vector
+// loop where it applies, else through the table.
+void finish_row(const Finish &finish, const uint16_t *acc, size_t n, uint8_t *out) {
+    if (finish.mul != 0) {
+        const uint32_t mul = finish.mul;
+        for (size_t j = 0; j < n; ++j)
+            out[j] = static_cast<uint8_t>((acc[j] * mul) >> 16);
+    } else {
+        for (size_t j = 0; j < n; ++j)
+            out[j] = finish(acc[j]);
+    }
+}
 
 // Sums stay within this many values for the table of Finish to be built.
 constexpr int64_t kMaxFinishTable = 1 << 16;
@@ -200,7 +216,37 @@ template <class T> void filter_index(const Job &job, const Taps &taps, T *acc) {
     }
 }
 
-template <int S, int D, class T> void filter_colour(const Job &job, const Taps &taps, T *acc) {
+// Moves finished colour pixels x0 .. x1 - 1 into the result row where that is
+// a plain copy: all of them for 24-bit pixels, and for 32-bit ones those whose
+// alpha pixel (lastDx further on) lies in the row, the colour and alpha
+// bytes merged a word at a time. Returns the first pixel not placed.
+template <int S, int D>
+int32_t place_finished(const Job &job, const uint8_t *done, const uint8_t *alphaRow, uint8_t *out, int32_t x0,
+                       int32_t x1) {
+    if constexpr (S == 3 && D == 3) {
+        std::memcpy(out + 3 * static_cast<size_t>(x0), done, 3 * static_cast<size_t>(x1 - x0));
+        return x1;
+    } else if constexpr (S == 4 && D == 4) {
+        if (!job.anyTap) return x0;
+        const int32_t hi = static_cast<int32_t>(std::clamp<int64_t>(int64_t{job.src->width} - job.lastDx, x0, x1));
+        const uint8_t colourBytes[4] = {0xFF, 0xFF, 0xFF, 0};
+        uint32_t colour;
+        std::memcpy(&colour, colourBytes, 4);
+        const uint8_t *alpha = alphaRow + 4 * static_cast<ptrdiff_t>(job.lastDx);
+        for (int32_t x = x0; x < hi; ++x) {
+            uint32_t c, a;
+            std::memcpy(&c, done + 4 * static_cast<size_t>(x - x0), 4);
+            std::memcpy(&a, alpha + 4 * static_cast<size_t>(x), 4);
+            c = (c & colour) | (a & ~colour);
+            std::memcpy(out + 4 * static_cast<size_t>(x), &c, 4);
+        }
+        return hi;
+    } else {
+        return x0;
+    }
+}
+
+template <int S, int D, class T> void filter_colour(const Job &job, const Taps &taps, T *acc, uint8_t *done) {
     const Image *src = job.src;
     const Finish finish = job.finish; // a local copy: result stores cannot alias its table
     for (int32_t y = 0; y < job.height; ++y) {
@@ -210,9 +256,21 @@ template <int S, int D, class T> void filter_colour(const Job &job, const Taps &
             const int32_t x1 = std::min(job.width, x0 + kChunk);
             accumulate<S>(src, taps, y, x0, x1, acc);
             const ptrdiff_t first = static_cast<ptrdiff_t>(S) * x0;
-            for (int32_t x = x0; x < x1; ++x) {
-                const T *a = acc + (S * x - first);
-                uint8_t b = finish(a[0]), g = finish(a[1]), r = finish(a[2]);
+            // 16-bit sums are finished for the whole chunk first.
+            int32_t from = x0; // the first pixel left to the loop below
+            if constexpr (sizeof(T) == 2) {
+                finish_row(finish, acc, static_cast<size_t>(S) * (x1 - x0), done);
+                if (!job.gray) from = place_finished<S, D>(job, done, alphaRow, out, x0, x1);
+            }
+            for (int32_t x = from; x < x1; ++x) {
+                uint8_t b, g, r;
+                if constexpr (sizeof(T) == 2) {
+                    const uint8_t *f = done + (S * x - first);
+                    b = f[0], g = f[1], r = f[2];
+                } else {
+                    const T *a = acc + (S * x - first);
+                    b = finish(a[0]), g = finish(a[1]), r = finish(a[2]);
+                }
                 if (job.gray) b = g = r = static_cast<uint8_t>((b + 2 * g + r) >> 2);
                 uint8_t *p = out + D * x;
                 p[0] = b;
@@ -298,6 +356,15 @@ int32_t run_filter(const Image *src, const int32_t *kernel, int32_t size, int32_
             table[static_cast<size_t>(v - low)] = finish.slow(static_cast<uint32_t>(v));
         finish.table = table.get();
         finish.low = static_cast<uint32_t>(low);
+        // A positive divisor without offset: try the rounded-up reciprocal,
+        // kept only when it gives every entry of the table.
+        if (divisor > 0 && offset == 0 && low == 0) {
+            const uint32_t mul = (65536u + static_cast<uint32_t>(divisor) - 1) / static_cast<uint32_t>(divisor);
+            bool exact = mul < 65536u;
+            for (int64_t v = 0; v <= high && exact; ++v)
+                exact = ((static_cast<uint32_t>(v) * mul) >> 16) == table[static_cast<size_t>(v)];
+            if (exact) finish.mul = static_cast<uint16_t>(mul);
+        }
     }
     Job job{&source.view,
             dst,
@@ -312,16 +379,19 @@ int32_t run_filter(const Image *src, const int32_t *kernel, int32_t size, int32_
     // 16-bit sums when the table covers them: twice as many per vector.
     auto run = [&](auto zero) {
         using T = decltype(zero);
-        Buffer<T> acc = alloc_buffer<T>(checked_size(static_cast<uint64_t>(std::min(width, kChunk)), 4));
-        if (!acc) return 0;
+        const size_t chunk = checked_size(static_cast<uint64_t>(std::min(width, kChunk)), 4);
+        Buffer<T> acc = alloc_buffer<T>(chunk);
+        Buffer<uint8_t> done = alloc_buffer<uint8_t>(chunk);
+        if (!acc || !done) return 0;
         if (bits == 8) {
             filter_index(job, taps, acc.get());
         } else {
             const bool four = source.view.bitCount == 32;
+            uint8_t *d = done.get();
             if (bits == 24)
-                four ? filter_colour<4, 3>(job, taps, acc.get()) : filter_colour<3, 3>(job, taps, acc.get());
+                four ? filter_colour<4, 3>(job, taps, acc.get(), d) : filter_colour<3, 3>(job, taps, acc.get(), d);
             else
-                four ? filter_colour<4, 4>(job, taps, acc.get()) : filter_colour<3, 4>(job, taps, acc.get());
+                four ? filter_colour<4, 4>(job, taps, acc.get(), d) : filter_colour<3, 4>(job, taps, acc.get(), d);
         }
         return 1;
     };

@@ -104,11 +104,12 @@ TEST(Filter, MatchesAccessorVersionAliasingAndRefusals) {
                 ASSERT_EQ(run(src.get(), p, mask.get(), nullptr), 1);
                 ASSERT_EQ(diff(src.get(), want.get()), "") << "in place, mask " << maskBits << ", k" << size;
             }
-    // Rows longer than one accumulation pass (1024 pixels): the box, small
-    // weights (16-bit sums) and random ones.
+    // Rows longer than one accumulation pass (1024 pixels): the box and a
+    // weighted kernel (16-bit sums finished by a reciprocal), random ones.
     for (int32_t bc : {8, 24, 32})
         for (const Params &p :
-             {Params{std::vector<int32_t>(9, 1), 3, 9, 0, 0}, random_params(rng, 3), random_params(rng, 5)}) {
+             {Params{std::vector<int32_t>(9, 1), 3, 9, 0, 0}, Params{{1, 2, 1, 2, 5, 2, 1, 2, 1}, 3, 13, 0, 0},
+              random_params(rng, 3), random_params(rng, 5)}) {
             Owned src = random_image(2100, 2, bc, seed++), dst = make(2100, 2, bc), want = make(2100, 2, bc);
             reference_filter(src.get(), p, nullptr, want.get());
             ASSERT_EQ(run(src.get(), p, nullptr, dst.get()), 1);
