@@ -54,9 +54,10 @@ struct Box {
     int64_t last(int64_t x) const { return x + size - half - 1; } // last index
 };
 
-// Writes the row means of the column sums `col` (bpp channels interleaved).
+// Writes the row means of the column sums `col` (bpp channels interleaved);
+// diff has room for a row of sums.
 template <class Sum, int Bpp, class MeanFn>
-void row_means(const Sum *col, int32_t w, const Box &box, const MeanFn &meanFn, uint8_t *out) {
+void row_means(const Sum *col, Sum *diff, int32_t w, const Box &box, const MeanFn &meanFn, uint8_t *out) {
     const MeanFn mean = meanFn; // a local copy: the result stores cannot alias what it holds
     Sum s[Bpp];
     for (int k = 0; k < Bpp; ++k) {
@@ -78,9 +79,18 @@ void row_means(const Sum *col, int32_t w, const Box &box, const MeanFn &meanFn, 
     };
     for (int32_t x = 1; x < lo; ++x)
         clamped(x);
+    // The entering minus the leaving column of every interior step first, in
+    // one vector loop, so that the running sums only add one value each.
     const Sum *in = col + Bpp * (lo + box.size - box.half - 1), *gone = col + Bpp * (lo - box.half - 1);
-    for (int32_t x = static_cast<int32_t>(lo); x < hi; ++x, in += Bpp, gone += Bpp)
-        step(x, in, gone);
+    const size_t steps = static_cast<size_t>(hi - lo) * Bpp;
+    for (size_t j = 0; j < steps; ++j)
+        diff[j] = in[j] - gone[j];
+    const Sum *d = diff;
+    for (int32_t x = static_cast<int32_t>(lo); x < hi; ++x, d += Bpp)
+        for (int k = 0; k < Bpp; ++k) {
+            s[k] += d[k];
+            out[Bpp * x + k] = mean(s[k]);
+        }
     for (int32_t x = static_cast<int32_t>(hi); x < w; ++x)
         clamped(x);
 }
@@ -108,7 +118,7 @@ void running_box(const Image *src, Image *dst, const Box &box, const MeanFn &mea
             for (size_t j = 0; j < n; ++j)
                 col[j] += static_cast<Sum>(in[j]) - static_cast<Sum>(gone[j]);
         }
-        row_means<Sum, Bpp>(col, w, box, mean, row_ptr(dst, y));
+        row_means<Sum, Bpp>(col, col + n, w, box, mean, row_ptr(dst, y));
     }
 }
 
@@ -134,7 +144,9 @@ template <class Sum, int Bpp>
 bool smooth(const Image *src, Image *dst, int32_t size, int32_t offset, bool running, uint8_t *ring, int32_t ringRows) {
     const Box box{size, size / 2};
     const Mean<Sum> mean(size, offset);
-    Buffer<Sum> col = running ? alloc_zeroed<Sum>(checked_size(static_cast<uint64_t>(src->width), Bpp)) : Buffer<Sum>();
+    // Column sums and a row of their differences.
+    Buffer<Sum> col =
+        running ? alloc_zeroed<Sum>(checked_size(static_cast<uint64_t>(src->width), 2 * Bpp)) : Buffer<Sum>();
     if (col && mean.table) {
         // The table through a local pointer: stores to the result rows cannot
         // alias it, so the loop keeps it in a register.
