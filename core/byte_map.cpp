@@ -4,7 +4,9 @@
 // machines, and builds configured with PXFX_SIMD=OFF, run the plain loop.
 #include "core/internal/byte_map.hpp"
 
-#if !defined(PXFX_PORTABLE_ONLY) && defined(__x86_64__) && (defined(__GNUC__) || defined(__clang__))
+#include "core/internal/cpu.hpp"
+
+#if PXFX_X86_DISPATCH
 #define PXFX_MAP_VBMI 1
 #include <immintrin.h>
 #elif !defined(PXFX_PORTABLE_ONLY) && defined(__aarch64__)
@@ -155,19 +157,13 @@ template <int C> PXFX_VBMI void vbmi_tone(const uint8_t *in, uint8_t *out, size_
         vbmi_tone_rows<C, false>(in, out, pixels, t);
 }
 
-bool has_vbmi() {
-    __builtin_cpu_init();
-    return __builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512bw") &&
-           __builtin_cpu_supports("avx512vbmi");
-}
-
 template <int C> MapFn pick() {
-    static const MapFn fn = has_vbmi() ? &vbmi<C> : &plain<C>;
+    static const MapFn fn = cpu::has_avx512vbmi() ? &vbmi<C> : &plain<C>;
     return fn;
 }
 
 template <int C> ToneFn pick_tone() {
-    static const ToneFn fn = has_vbmi() ? &vbmi_tone<C> : &plain_tone<C>;
+    static const ToneFn fn = cpu::has_avx512vbmi() ? &vbmi_tone<C> : &plain_tone<C>;
     return fn;
 }
 
