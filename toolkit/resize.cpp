@@ -4,8 +4,10 @@
 // in single precision.
 #include <pxfx/toolkit.h>
 
+#include <algorithm>
 #include <cmath>
 
+#include "core/internal/cpu.hpp"
 #include "core/internal/memory.hpp"
 #include "toolkit/pximage_check.hpp"
 #include "toolkit/resize_internal.hpp"
@@ -19,12 +21,35 @@ namespace {
 
 constexpr float kMaxPlainWeight = 1048576.0f;
 
-struct Tap {
-    int32_t i0, i1; // clamped sample indices
-    float w, omw;   // weight of i1 and 1 - weight
+// The two source columns of every result column and their weights, one
+// array each, so that the column loop can gather in vectors.
+struct Taps {
+    Buffer<int32_t> i0, i1; // clamped sample indices
+    Buffer<float> w, omw;   // weight of i1 and 1 - weight
+    explicit Taps(size_t n)
+        : i0(alloc_buffer<int32_t>(n)), i1(alloc_buffer<int32_t>(n)), w(alloc_buffer<float>(n)),
+          omw(alloc_buffer<float>(n)) {}
+    bool ok() const { return i0 && i1 && w && omw; }
 };
 
 } // namespace
+
+// One row across: h[j] = (1 - w) * f[i0] + w * f[i1] per result column j and
+// sample. The buffers are distinct, which lets the single-sample loop gather.
+template <int C>
+inline void blend_columns(const float *__restrict f, const int32_t *__restrict i0, const int32_t *__restrict i1,
+                          const float *__restrict w, const float *__restrict omw, int32_t n, float *__restrict h) {
+    if constexpr (C == 1) {
+        for (int32_t j = 0; j < n; ++j)
+            h[j] = omw[j] * f[i0[j]] + w[j] * f[i1[j]];
+    } else {
+        for (int32_t j = 0; j < n; ++j) {
+            const float *p0 = f + static_cast<size_t>(i0[j]) * C, *p1 = f + static_cast<size_t>(i1[j]) * C;
+            for (int c = 0; c < C; ++c)
+                h[static_cast<size_t>(j) * C + c] = omw[j] * p0[c] + w[j] * p1[c];
+        }
+    }
+}
 
 // Interpolates pixels of C interleaved samples (pixel p at p * srcStride /
 // p * dstStride, its samples consecutive); every sample as interpolate_plane
@@ -32,16 +57,19 @@ struct Tap {
 template <int C>
 bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
                  int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
-    Buffer<Tap> cols = alloc_buffer<Tap>(static_cast<size_t>(dstWidth));
-    if (!cols) return false;
+    Taps cols(static_cast<size_t>(dstWidth));
+    if (!cols.ok()) return false;
     // With every column weight in 0..1 the row blends stay in 0..255 (no NaN).
     bool weightsInRange = true;
+    int32_t used0 = srcWidth - 1, used1 = 0; // the source columns the taps read
     for (int32_t j = 0; j < dstWidth; ++j) {
         const float fx = static_cast<float>(j) / rx;
         const int32_t x0 = trunc_sat<int32_t>(fx);
         const float wx = fx - static_cast<float>(x0);
-        cols[j] = {clamp_coord(x0, srcWidth), clamp_coord(int64_t{x0} + 1, srcWidth), wx, 1.0f - wx};
+        cols.i0[j] = clamp_coord(x0, srcWidth), cols.i1[j] = clamp_coord(int64_t{x0} + 1, srcWidth);
+        cols.w[j] = wx, cols.omw[j] = 1.0f - wx;
         weightsInRange = weightsInRange && wx >= 0.0f && wx <= 1.0f;
+        used0 = std::min(used0, cols.i0[j]), used1 = std::max(used1, cols.i1[j]);
     }
     // Horizontally interpolated source rows (C samples per pixel, packed),
     // cached in two slots by row parity: consecutive output rows mostly reuse
@@ -49,7 +77,8 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
     const size_t n = static_cast<size_t>(dstWidth) * C;
     Buffer<float> across = alloc_buffer<float>(2 * n);
     if (!across) return false;
-    // One source row as floats (exact), converted once per row in one pass.
+    // One source row as floats (exact), converted once per row in one pass,
+    // columns used0 .. used1 (the ones the taps read).
     Buffer<float> row = alloc_buffer<float>(static_cast<size_t>(srcWidth) * C);
     if (!row) return false;
     int32_t cached[2] = {-1, -1};
@@ -61,19 +90,14 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
         const uint8_t *a = src + static_cast<size_t>(y) * srcRow;
         float *f = row.get();
         if (srcStride == C) {
-            for (size_t k = 0; k < static_cast<size_t>(srcWidth) * C; ++k)
+            for (size_t k = static_cast<size_t>(used0) * C; k < static_cast<size_t>(used1 + 1) * C; ++k)
                 f[k] = static_cast<float>(a[k]);
         } else {
-            for (int32_t p = 0; p < srcWidth; ++p)
+            for (int32_t p = used0; p <= used1; ++p)
                 for (int c = 0; c < C; ++c)
                     f[static_cast<size_t>(p) * C + c] = static_cast<float>(a[static_cast<size_t>(p) * srcStride + c]);
         }
-        for (int32_t j = 0; j < dstWidth; ++j) {
-            const Tap &t = cols[j];
-            const float *p0 = f + static_cast<size_t>(t.i0) * C, *p1 = f + static_cast<size_t>(t.i1) * C;
-            for (int c = 0; c < C; ++c)
-                h[static_cast<size_t>(j) * C + c] = t.omw * p0[c] + t.w * p1[c];
-        }
+        blend_columns<C>(f, cols.i0.get(), cols.i1.get(), cols.w.get(), cols.omw.get(), dstWidth, h);
         cached[y & 1] = y;
         return static_cast<const float *>(h);
     };
@@ -106,9 +130,30 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
     return true;
 }
 
+#if PXFX_X86_DISPATCH
+// The same code compiled for AVX-512, whose gathers let the column blends run
+// in vectors; the float operations and their order are the same.
+template <int C>
+__attribute__((target("avx512f,avx512bw"), flatten)) bool
+interpolate_wide(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
+                 int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
+    return interpolate<C>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
+}
+#endif
+
+template <int C>
+bool interpolate_any(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
+                     int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
+#if PXFX_X86_DISPATCH
+    if (cpu::has_avx512bw())
+        return interpolate_wide<C>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
+#endif
+    return interpolate<C>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
+}
+
 bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
                        int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
-    return interpolate<1>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
+    return interpolate_any<1>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
 }
 
 } // namespace pxfx::packed
@@ -152,7 +197,7 @@ PXImage *PXImage_Resize(const PXImage *src, int32_t newWidth, int32_t newHeight)
     if (src->bitcount == 8) {
         ok = interpolate_plane(src->data, w, h, 1, out->data, newWidth, newHeight, 1, ry, rx);
     } else if (src->bitcount == 24) {
-        ok = interpolate<3>(src->data, w, h, 3, out->data, newWidth, newHeight, 3, ry, rx);
+        ok = interpolate_any<3>(src->data, w, h, 3, out->data, newWidth, newHeight, 3, ry, rx);
     } else {
         // A 16-bit source is read as three-byte pixels; the bytes that this
         // stride puts past the end of its block read as 0.
