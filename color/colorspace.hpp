@@ -77,7 +77,8 @@ constexpr uint16_t hue_to_rgb(uint16_t lo, uint16_t hi, uint16_t hue) {
 // with w = 6 hue, 255, 1020 - 6 hue or 0 by the range of the (folded) hue: the
 // ranges that return hi or lo give exactly that. HSLtoRGB always has
 // 0 <= M1 <= M2 (M2 <= 2L), so its channels take their weights from tables
-// indexed by the hue byte instead of branching.
+// indexed by the hue byte instead of branching (32-bit entries, which vector
+// gathers read).
 constexpr int32_t hue_weight(uint32_t hue) {
     const uint32_t h = hue > 255 ? (hue - 255) & 0xFFFF : hue;
     return h <= 41 ? static_cast<int32_t>(6 * h)
@@ -85,12 +86,12 @@ constexpr int32_t hue_weight(uint32_t hue) {
 }
 
 struct HueWeights {
-    uint16_t red[256] = {}, green[256] = {}, blue[256] = {};
+    int32_t red[256] = {}, green[256] = {}, blue[256] = {};
     constexpr HueWeights() {
         for (uint32_t h = 0; h < 256; ++h) {
-            red[h] = static_cast<uint16_t>(hue_weight(h + 85));
-            green[h] = static_cast<uint16_t>(hue_weight(h));
-            blue[h] = static_cast<uint16_t>(hue_weight((h - 85) & 0xFFFF));
+            red[h] = hue_weight(h + 85);
+            green[h] = hue_weight(h);
+            blue[h] = hue_weight((h - 85) & 0xFFFF);
         }
     }
 };

@@ -197,15 +197,14 @@ void median5_row(const uint8_t *const *rows, int32_t channels, size_t n, int32_t
 
 #if PXFX_X86_DISPATCH
 // The same network compiled for 64-byte vectors, for processors that have them.
-__attribute__((target("avx512f,avx512bw"), flatten)) void median5_row_wide(const uint8_t *const *rows, int32_t channels,
-                                                                           size_t n, int32_t *acc) {
+PXFX_WIDE void median5_row_wide(const uint8_t *const *rows, int32_t channels, size_t n, int32_t *acc) {
     median_row_network<5, 64>(rows, channels, n, acc);
 }
 #endif
 
 MedianRow pick_median5() {
 #if PXFX_X86_DISPATCH
-    static const MedianRow fn = cpu::has_avx512bw() ? &median5_row_wide : &median5_row;
+    static const MedianRow fn = cpu::has_avx512() ? &median5_row_wide : &median5_row;
     return fn;
 #else
     return &median5_row;

@@ -6,6 +6,10 @@
 
 #if !defined(PXFX_PORTABLE_ONLY) && defined(__x86_64__) && (defined(__GNUC__) || defined(__clang__))
 #define PXFX_X86_DISPATCH 1
+// A wide copy: the function and everything it calls compiled for AVX-512, to
+// be called only when cpu::has_avx512(). The code is the same plain C++, so
+// its results are the same (the build never contracts multiply-add).
+#define PXFX_WIDE __attribute__((target("avx512f,avx512bw,avx512dq"), flatten))
 #else
 #define PXFX_X86_DISPATCH 0
 #endif
@@ -13,8 +17,9 @@
 namespace pxfx::cpu {
 
 #if PXFX_X86_DISPATCH
-// AVX-512 foundation and byte/word instructions.
-bool has_avx512bw();
+// AVX-512 foundation, byte/word and dword/qword instructions: the target of
+// the wide copies, "avx512f,avx512bw,avx512dq".
+bool has_avx512();
 // The above and the byte permutes of VBMI.
 bool has_avx512vbmi();
 #endif
