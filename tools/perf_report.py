@@ -46,36 +46,38 @@ WHAT = {
 # Why a target stays missed where the result must stay bit-exact; printed
 # beside the measured range of every family that misses.
 NOTES = {
-    "memcpy-table": "one 256-entry table lookup per colour byte. A lookup is a scalar load "
-                    "(about one per cycle), while memcpy moves 16 to 64 bytes per instruction, "
-                    "so a byte-table map cannot come within 2x of a copy: neither SSE2 (the x86-64 "
-                    "baseline) nor NEON looks up 256-entry byte tables in one vector instruction. The rows are already walked with row pointers and no "
-                    "per-pixel branching.",
-    "memcpy-tone": "the tone arithmetic is byte-wise and the 32-bit warm tone vectorises "
-                   "(within 2x of memcpy); the 24-bit rows interleave three channels whose "
-                   "formulas differ, which the compiler does not vectorise, and the 32-bit cold "
-                   "tone's loop is not vectorised by GCC 12.",
-    "Smooth": "the 5x5 median runs a pruned 113-comparator selection network over 16 samples "
-              "at a time (exact at every rank and tie), 2.4x faster than the sliding histogram "
-              "it replaced on noisy pictures; OpenCV reuses sorted columns between neighbouring "
-              "pixels with wider vectors. The 7x7 median (sliding histogram) is faster than "
-              "OpenCV's.",
+    "memcpy-table": "one 256-entry table lookup per colour byte. With AVX-512 VBMI (x86-64, "
+                    "chosen at run time) or NEON (arm64) 64 or 16 bytes are looked up per "
+                    "instruction group and the maps run at memcpy speed; a machine with neither "
+                    "runs the plain loop, about one lookup per cycle.",
+    "memcpy-tone": "per 64 bytes the tone needs three 256-entry vector lookups (blue, red, and "
+                   "green's offset from the red byte beside it, found by shifting the block one "
+                   "lane) and a saturating add, and its result goes to another picture whose "
+                   "lines are read before they are written, while memcpy streams past the cache.",
+    "Smooth": "the 5x5 median runs a pruned 113-comparator selection network across 64 "
+              "samples at a time (an AVX-512 copy of the plain code; 16 on other machines), "
+              "exact at every rank and tie; OpenCV reuses sorted columns between neighbouring "
+              "pixels, which a network over the whole window does not. The 7x7 median (sliding "
+              "histogram) runs at OpenCV's speed or faster.",
     "Blur": "the kernel filter keeps the general path (any kernel, divisor, offset, mask, "
-            "32-bit wrap) with 16-bit sums, kernel rows summed in one pass and the "
-            "division from a table; what remains is the per-channel table lookup of the "
-            "finish step.",
-    "FilterFast": "running sums in place with a ring of source rows; the horizontal running sum "
-                  "is serial per channel and the truncating division is a table lookup per "
-                  "sample, where OpenCV scales the sums in vectors.",
-    "SplitCombineHsl": "the integer HSL formulas (rounded divisions per pixel, table-driven "
-                       "hue weights) are kept exactly; they run as scalar code per pixel, "
+            "32-bit wrap); 16-bit sums are finished by a checked reciprocal in vectors.",
+    "FilterFast": "running sums in place with a ring of source rows; the differences of "
+                  "entering and leaving columns run in vectors, but the running sum along a row "
+                  "is serial (one chain per channel) and the truncating division is a table "
+                  "lookup per sample, where OpenCV scales the sums in vectors.",
+    "SplitCombineHsl": "the integer HSL formulas (divisions through a reciprocal table, "
+                       "table-driven hue weights) are kept exactly. Combine runs in AVX-512 "
+                       "vectors with gathers; Split's reciprocal gathers are not vectorised by "
+                       "GCC 12 (it cannot rule out that the plane stores alias the table), "
                        "while OpenCV converts in float vectors. Split also makes four new "
                        "planes per call.",
-    "ResizeHalf": "the source coordinate i / r is computed in single precision per column and "
-                  "row and each result is a float blend; OpenCV uses fixed-point weights and a "
-                  "special 2:1 path.",
-    "ResizeOneAndAHalf": "as for the halving: single-precision blends per sample with gathered "
-                         "columns; the 24-bit case meets the target.",
+    "ResizeHalf": "the source coordinate of result pixel i is i / r, computed in single "
+                  "precision per column and row (at r = 2 only the top-left quarter is read and "
+                  "enlarged), and each result is two float blends of gathered columns (AVX-512 "
+                  "where available); OpenCV halves by averaging 2x2 blocks in fixed point, a "
+                  "different and cheaper computation.",
+    "ResizeOneAndAHalf": "as for the halving: single-precision blends of gathered columns; "
+                         "the 24-bit case meets the target.",
     "Rotate270": "8-bit quarter turns use 8x8 word transposes; the 24-bit ones move 3-byte "
                  "pixels one at a time.",
 }
