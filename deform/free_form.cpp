@@ -291,6 +291,7 @@ int32_t DeformationImage(Image *src, const DeformationPair *pairs, uint32_t coun
     if (src == nullptr || count > static_cast<uint32_t>(INT32_MAX) || (count > 0 && pairs == nullptr)) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     return DeformationFunc(src, out, pairs, static_cast<int32_t>(count));
 }
 

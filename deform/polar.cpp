@@ -5,6 +5,7 @@
 #include <cmath>
 #include <cstdlib>
 
+#include "core/internal/image_check.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
 #include "deform/deform_common.hpp"
@@ -80,6 +81,7 @@ uint32_t CircleTransform(Image *src, Image **dst, int32_t mode, int32_t radius, 
     if (src == nullptr) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     Circle c;
     c.mode = mode;
     c.width = src->width;

@@ -159,6 +159,7 @@ uint32_t Wave_Transform(Image *src, Image **dst, int32_t amplitude) {
     if (!map) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     const int32_t cx = w >> 1, cy = h >> 1;
     create_wave(map.get(), w, h, cx, cy, amplitude);
     render_wave(src, out, map.get(), cx, cy);

@@ -3,6 +3,7 @@
 #include <pxfx/effects.h>
 #include <pxfx/toolkit.h>
 
+#include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/result.hpp"
 #include "effects/pixel_maps.hpp"
@@ -56,6 +57,7 @@ void channel_table(uint32_t mode, int32_t d, uint8_t *out) {
 extern "C" uint32_t PX_IMG_Alter(Image *src, Image **dst, int32_t dR, int32_t dG, int32_t dB, uint32_t mode) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     ChannelTables t;
     channel_table(mode, dR, t.r);
     channel_table(mode, dG, t.g);

@@ -113,6 +113,7 @@ extern "C" {
 uint32_t PX_IMG_Light_Alter(Image *src, Image **dst, uint32_t percent, uint32_t channel) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     if (percent == 100) {
         PX_Img_Copy(out, src);
     } else if (percent == 0) {
@@ -128,6 +129,7 @@ uint32_t PX_IMG_Ballance(Image *src, Image **dst, int32_t contrast) {
     contrast_table(contrast, t.b);
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     if (contrast == 0) {
         // A plain byte copy of the blocks; a result with a larger block than
         // the source's keeps its bytes beyond the source's block.
@@ -148,6 +150,7 @@ uint32_t PX_IMG_Lambency(Image *src, Image **dst) {
     if (!blur || Filter(src, kGlowKernel, 3, 16, 0, nullptr, blur.get(), 0) == 0) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     // The blurred image has the source's format, or 8 bits for a source of
     // any other bit count (as malloc_Image makes it).
     with_format(src->bitCount, [&](auto f) {

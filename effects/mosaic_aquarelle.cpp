@@ -66,6 +66,7 @@ uint32_t PX_IMG_Mosaic(Image *src, Image **dst, int32_t n) {
     if (n < 1) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     with_format(src->bitCount, [&](auto f) { mosaic<decltype(f)>(src, out, n); });
     return 1;
 }
@@ -73,6 +74,7 @@ uint32_t PX_IMG_Mosaic(Image *src, Image **dst, int32_t n) {
 uint32_t PX_IMG_Aquarelle(Image *src, Image **dst, int32_t range) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     with_format(src->bitCount, [&](auto f) { aquarelle<decltype(f)>(src, out, range); });
     return 1;
 }

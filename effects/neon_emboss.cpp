@@ -3,6 +3,7 @@
 
 #include <cstdlib>
 
+#include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
@@ -86,6 +87,7 @@ extern "C" {
 uint32_t PX_IMG_Neon(Image *src, Image **dst) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     with_format(src->bitCount, [&](auto f) { neon<decltype(f)>(src, out); });
     return 1;
 }
@@ -93,6 +95,7 @@ uint32_t PX_IMG_Neon(Image *src, Image **dst) {
 uint32_t PX_IMG_Emboss(Image *src, Image **dst) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     with_format(src->bitCount, [&](auto f) { emboss<decltype(f)>(src, out); });
     return 1;
 }

@@ -147,6 +147,7 @@ uint32_t imOil(Image *src, Image **dst, int32_t r) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
     if (2 * static_cast<int64_t>(r) >= src->width || 2 * static_cast<int64_t>(r) >= src->height) return 0;
+    if (!has_pixels(out)) return 1;
     return with_format(src->bitCount, [&](auto f) { return oil_with_sums<decltype(f)>(src, out, r); }) ? 1 : 0;
 }
 

@@ -137,6 +137,7 @@ extern "C" uint32_t PX_IMG_Photocopy(Image *src, Image **dst) {
     if (src == nullptr) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     const int32_t w = src->width, h = src->height;
     const int32_t s = static_cast<int32_t>((static_cast<int64_t>(w) + 3) & ~int64_t{3});
     const size_t plane = checked_size(static_cast<uint64_t>(s), static_cast<uint64_t>(h));

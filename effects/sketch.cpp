@@ -117,6 +117,7 @@ uint32_t sketch(Image *src, Image **dst, bool withEdges) {
     if (src == nullptr) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     const int32_t w = src->width, h = src->height;
     const size_t plane = static_cast<size_t>(w) * h;
     // The planes share one allocation so that temp_ex's read past the gray

@@ -6,6 +6,7 @@
 #include <cstring>
 
 #include "core/internal/byte_map.hpp"
+#include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
@@ -81,6 +82,7 @@ ChannelTables old_photo_tables() {
 template <class Fn> uint32_t point_effect(Image *src, Image **dst, Fn fn) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     with_format(src->bitCount, [&](auto f) { map_pixels<decltype(f)>(src, out, fn); });
     return 1;
 }
@@ -115,6 +117,7 @@ template <bool Warm, class Fn> uint32_t tone_effect(Image *src, Image **dst, Fn 
     if (src == nullptr || (src->bitCount != 24 && src->bitCount != 32)) return point_effect(src, dst, fn);
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     tone_rows<Warm>(src, out);
     return 1;
 }
@@ -126,6 +129,7 @@ extern "C" {
 uint32_t PX_IMG_Negative(Image *src, Image **dst) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     with_format(src->bitCount, [&](auto f) { negative<decltype(f)>(src, out); });
     return 1;
 }
@@ -139,6 +143,7 @@ uint32_t PX_IMG_Repristination(Image *src, Image **dst) { return point_effect(sr
 uint32_t PX_IMG_Classical_Photograph(Image *src, Image **dst) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     map_channels(src, out, old_photo_tables());
     return 1;
 }
@@ -146,6 +151,7 @@ uint32_t PX_IMG_Classical_Photograph(Image *src, Image **dst) {
 uint32_t PX_IMG_Line(Image *src, Image **dst) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    if (!has_pixels(out)) return 1;
     ChannelTables dark, same;
     for (int i = 0; i < 256; ++i) {
         dark.b[i] = dark.g[i] = dark.r[i] = static_cast<uint8_t>(i > 128 ? i - 128 : 0);

@@ -43,6 +43,14 @@ inline bool geometry_ok(const Image *im) {
 
 inline bool has_pixels(const Image *im) { return im != nullptr && im->bits != nullptr && geometry_ok(im); }
 
+// True when a loop over the record's width and height stays inside its block:
+// there is no block to touch (null pixels, which the accessors read as 0 and
+// the writers skip), no row or column to visit, or a valid geometry. A record
+// failing this claims rows its block cannot hold.
+inline bool rows_inside(const Image *im) {
+    return im->bits == nullptr || im->width <= 0 || im->height <= 0 || geometry_ok(im);
+}
+
 // True for an 8-bit record with pixels.
 inline bool is_plane(const Image *im) { return has_pixels(im) && im->bitCount == 8; }
 

@@ -144,6 +144,13 @@ template <class R> struct Contract {
     bool keeps_result_on_failure = false;   // a failed working allocation leaves the prepared result
     int32_t typical = 3;                    // an ordinary parameter value
     bool falls_back_on_failure = false;     // short of memory it finishes another, documented way
+    // Degenerate records (names from `broken`: "null pixels", "zero width",
+    // ...) it works on without refusing, reading no pixels: what it makes of
+    // them is pinned by the family's own tests.
+    std::vector<std::string> accepts;
+    bool accepts_record(const std::string &what) const {
+        return std::find(accepts.begin(), accepts.end(), what) != accepts.end();
+    }
 };
 
 inline constexpr int32_t kExtremes[] = {INT_MIN, -70000, -256, -1, 0, 1, 2, 255, 256, 70000, INT_MAX};
@@ -217,11 +224,13 @@ template <class R> void expect_refusals(const Contract<R> &c) {
     R *second = c.pictures > 1 ? &b->record : nullptr;
     run.expect_refused(nullptr, second, false, {b.get()}, "null first picture");
     for (auto &bad : broken<R>(c.formats))
-        run.expect_refused(&bad->record, second, false, {bad.get(), b.get()}, bad->what);
+        if (!c.accepts_record(bad->what))
+            run.expect_refused(&bad->record, second, false, {bad.get(), b.get()}, bad->what);
     if (c.pictures > 1) {
         run.expect_refused(&a->record, nullptr, false, {a.get()}, "null second picture");
         for (auto &bad : broken<R>(c.formats_b.empty() ? c.formats : c.formats_b))
-            run.expect_refused(&a->record, &bad->record, false, {a.get(), bad.get()}, "second: " + bad->what);
+            if (!c.accepts_record("second: " + bad->what))
+                run.expect_refused(&a->record, &bad->record, false, {a.get(), bad.get()}, "second: " + bad->what);
         if (c.mismatch_fails) {
             auto odd = good<R>(5, 11, fb, 13);
             run.expect_refused(&a->record, &odd->record, false, {a.get(), odd.get()}, "pictures of different sizes");
