@@ -23,7 +23,9 @@ void put32(uint8_t *p, uint32_t v) {
 } // namespace
 
 extern "C" int32_t saveBmp(const char *path, const Image *image) {
-    if (!has_pixels(image)) return 0;
+    // The block written is the pitch x height bytes the record claims; a
+    // negative height claims none that could be written.
+    if (image == nullptr || image->bits == nullptr || image->height < 0 || !block_claim_ok(image)) return 0;
     uint8_t palette[256 * 4];
     for (uint32_t i = 0; i < 256; ++i) {
         palette[4 * i] = palette[4 * i + 1] = palette[4 * i + 2] = static_cast<uint8_t>(i);
@@ -47,7 +49,7 @@ extern "C" int32_t saveBmp(const char *path, const Image *image) {
     put32(header + 34, imageSize);
     PX_fwrite(header, 1, sizeof header, f);
     if (indexed) PX_fwrite(palette, 1, sizeof palette, f);
-    PX_fwrite(image->bits, block_bytes(image), 1, f);
+    PX_fwrite(image->bits, static_cast<size_t>(imageSize), 1, f);
     PX_fclose(f);
     return 1;
 }

@@ -142,25 +142,41 @@ void SetPixelColor(Image *image, int32_t x, int32_t y, uint32_t colour) {
 }
 
 int32_t PX_Img_Copy(Image *dst, const Image *src) {
-    if (!has_pixels(dst) || !has_pixels(src)) return 0;
+    if (dst == nullptr || src == nullptr || !block_claim_ok(dst) || !block_claim_ok(src)) return 0;
     if (dst->pitch == src->pitch && dst->height == src->height && dst->bitCount == src->bitCount) {
-        std::memmove(dst->bits, src->bits, block_bytes(src));
+        // The whole block, pitch x height bytes, which both records claim. A
+        // missing source block reads as zeros, as the pixel readers read it.
+        const size_t bytes = dst->height > 0 ? static_cast<size_t>(dst->pitch) * static_cast<size_t>(dst->height) : 0;
+        if (bytes == 0 || dst->bits == nullptr) return 1;
+        if (src->bits == nullptr)
+            std::memset(dst->bits, 0, bytes);
+        else
+            std::memmove(dst->bits, src->bits, bytes);
         return 1;
     }
-    with_format(src->bitCount, [&](auto s) {
-        with_format(dst->bitCount, [&](auto d) { copy_convert<decltype(s), decltype(d)>(dst, src); });
+    // The converting walk writes only where the destination has pixels; a
+    // source without them reads as 0 everywhere.
+    if (!has_pixels(dst)) return 1;
+    with_format(dst->bitCount, [&](auto d) {
+        if (has_pixels(src))
+            with_format(src->bitCount, [&](auto s) { copy_convert<decltype(s), decltype(d)>(dst, src); });
+        else
+            copy_convert<AnyFormat, decltype(d)>(dst, src);
     });
     return 1;
 }
 
 int32_t PX_Img_CopyAlpha(Image *dst, const Image *src) {
-    if (!has_pixels(dst) || !has_pixels(src)) return 0;
+    if (dst == nullptr || src == nullptr) return 0;
     if (dst->bitCount != 32 || src->bitCount != 32 || dst->height != src->height || dst->width != src->width) return 0;
+    if (dst->width <= 0 || dst->height <= 0) return 1;
+    if (!rows_inside(dst) || !rows_inside(src)) return 0;
+    if (dst->bits == nullptr) return 1;
     for (int32_t y = 0; y < dst->height; ++y) {
-        const uint8_t *s = row_ptr(src, y);
+        const uint8_t *s = src->bits != nullptr ? row_ptr(src, y) : nullptr;
         uint8_t *d = row_ptr(dst, y);
         for (int32_t x = 0; x < dst->width; ++x)
-            d[4 * x + 3] = s[4 * x + 3];
+            d[4 * x + 3] = s != nullptr ? s[4 * x + 3] : 0;
     }
     return 1;
 }

@@ -43,6 +43,12 @@ inline bool geometry_ok(const Image *im) {
 
 inline bool has_pixels(const Image *im) { return im != nullptr && im->bits != nullptr && geometry_ok(im); }
 
+// True when the block the record claims, pitch x height bytes (none for a
+// height below 1), is one the library handles (at most kMaxBlockBytes).
+inline bool block_claim_ok(const Image *im) {
+    return im->height <= 0 || static_cast<uint64_t>(im->pitch) * static_cast<uint64_t>(im->height) <= kMaxBlockBytes;
+}
+
 // True when a loop over the record's width and height stays inside its block:
 // there is no block to touch (null pixels, which the accessors read as 0 and
 // the writers skip), no row or column to visit, or a valid geometry. A record

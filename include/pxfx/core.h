@@ -75,10 +75,15 @@ PXFX_API void SetPixelIndex(Image *image, int32_t x, int32_t y, int32_t index);
 PXFX_API void SetPixelColor(Image *image, int32_t x, int32_t y, uint32_t colour);
 /* Copies src into dst: one block move when pitch, height and bit count agree,
  * else a converting walk over dst (32-bit dst keeps its alpha). 1, or 0 when
- * either record is null or has no pixels. */
+ * either record is null or claims a block over 2^31 - 1 bytes. A missing pixel
+ * block reads as zeros (the whole-block copy from it clears the destination's
+ * block) and takes no writes; the walk writes nothing into a destination whose
+ * rows its block cannot hold. */
 PXFX_API int32_t PX_Img_Copy(Image *dst, const Image *src);
 /* Copies the alpha bytes of one 32-bit image into another of the same size; 1,
- * or 0 for other records or records without pixels. */
+ * or 0 for other records. An empty size copies nothing (1); a missing source
+ * block reads as alpha 0, a missing destination block takes nothing (1); a
+ * record whose rows its block cannot hold is refused (0). */
 PXFX_API int32_t PX_Img_CopyAlpha(Image *dst, const Image *src);
 
 /* ---- Memory and files ------------------------------------------------------ */
@@ -112,7 +117,10 @@ PXFX_API unsigned char *PX_ReadMemFile(const char *fileName, int32_t *size);
 /* Releases a block of PX_ReadMemFile; null is ignored. */
 PXFX_API void PX_ReleaseMemFile(void *block);
 /* Writes the image as an uncompressed BMP (8-bit images with a gray palette),
- * rows as stored, row 0 at the bottom. 1, or 0 for no pixels or an open failure. */
+ * rows as stored, row 0 at the bottom: the pitch x height bytes the record
+ * claims, whatever its width (a height of 0 writes the headers alone). 1, or 0
+ * for a null record or block, a negative height, a block over 2^31 - 1 bytes
+ * or an open failure. */
 PXFX_API int32_t saveBmp(const char *path, const Image *image);
 
 /* ---- Integer math ------------------------------------------------------------ */

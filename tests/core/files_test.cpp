@@ -76,8 +76,21 @@ TEST(Files, SaveBmpWritesHeadersPaletteAndRowsAsStored) {
     Owned im = make(2, 2, 32);
     Image hollow = *im;
     hollow.bits = nullptr;
-    EXPECT_EQ(saveBmp(path("h.bmp").c_str(), &hollow) + saveBmp(path("h.bmp").c_str(), nullptr), 0);
+    Image upsideDown = *im;
+    upsideDown.height = -2;
+    EXPECT_EQ(saveBmp(path("h.bmp").c_str(), &hollow) + saveBmp(path("h.bmp").c_str(), nullptr) +
+                  saveBmp(path("h.bmp").c_str(), &upsideDown),
+              0);
     EXPECT_TRUE(read(path("h.bmp")).empty());
+    // No rows, or rows of no pixels: the headers and the pitch x height bytes claimed.
+    Image noRows = *im, noColumns = *im;
+    noRows.height = 0;
+    noColumns.width = 0;
+    ASSERT_EQ(saveBmp(path("h.bmp").c_str(), &noRows), 1);
+    EXPECT_EQ(read(path("h.bmp")).size(), 54u);
+    ASSERT_EQ(saveBmp(path("h.bmp").c_str(), &noColumns), 1);
+    EXPECT_EQ(read(path("h.bmp")).size(), 54u + 16);
+    std::remove(path("h.bmp").c_str());
     EXPECT_EQ(saveBmp(path("none/x.bmp").c_str(), im.get()), 0);
     EXPECT_EQ(saveBmp(dir.c_str(), im.get()), 0);                               // a directory
     EXPECT_EQ(saveBmp(("/tmp/" + std::string(251, 'c')).c_str(), im.get()), 0); // 256 bytes

@@ -37,13 +37,17 @@ TEST(Hostile, PixelAccessAndCopies) {
          .formats = any,
          .call = [](C &c) { return int64_t(PX_Img_Copy(c.a, c.b)); },
          .pictures = 2,
-         .slot = false},
+         .slot = false,
+         .accepts = {"null pixels", "zero width", "negative height", "INT_MIN width", "pitch below a row", "zero pitch",
+                     "second: null pixels", "second: zero width", "second: negative height", "second: INT_MIN width",
+                     "second: pitch below a row", "second: zero pitch"}},
         {.name = "PX_Img_CopyAlpha",
          .formats = {32},
          .call = [](C &c) { return int64_t(PX_Img_CopyAlpha(c.a, c.b)); },
          .pictures = 2,
          .slot = false,
-         .mismatch_fails = true},
+         .mismatch_fails = true,
+         .accepts = {"null pixels", "second: null pixels"}},
     });
 }
 
