@@ -20,9 +20,7 @@ using namespace pxfx;
 
 namespace {
 
-bool same_geometry(const Image *a, const Image *b) {
-    return has_pixels(a) && a->height == b->height && a->width == b->width;
-}
+bool same_size(const Image *a, const Image *b) { return a->height == b->height && a->width == b->width; }
 
 // Pixels of the picture shifted by (dx, dy) into the clone copy, where the
 // source pixel lies in the picture.
@@ -45,11 +43,15 @@ template <class FS, class FD> void shift_into(const Image *pic, Image *copy, int
     }
 }
 
-bool brushable(const Image *img) { return has_pixels(img) && (img->bitCount == 24 || img->bitCount == 32); }
+// A picture with a pixel block of a brush's bit counts. Its size may be
+// empty: the prepared copy then cannot be made, unless the slot holds one.
+bool brushable(const Image *img) {
+    return img != nullptr && img->bits != nullptr && (img->bitCount == 24 || img->bitCount == 32) && rows_inside(img);
+}
 
 // Whether the slot holds a prepared image for the picture made with `tag`.
 bool cache_matches(Image **cache, const Image *picture, uint32_t tag) {
-    return cache != nullptr && *cache != nullptr && same_geometry(*cache, picture) && (*cache)->tag == tag;
+    return cache != nullptr && *cache != nullptr && same_size(*cache, picture) && (*cache)->tag == tag;
 }
 
 // The picture with its red, green and blue planes passed through the zanto
@@ -109,11 +111,11 @@ extern "C" {
 
 int32_t PX_Mimic(Image *picture, int32_t srcX, int32_t srcY, const Image *reference, int32_t dstX, int32_t dstY,
                  int32_t cx, int32_t cy, int32_t r, int32_t reload, Image **cache) {
-    if (!has_pixels(picture) || cache == nullptr) return 0;
+    if (picture == nullptr || picture->bits == nullptr || cache == nullptr || !rows_inside(picture)) return 0;
+    // A reference without pixels reads as zeros, as PX_Img_Copy reads it.
     const Image *base = reference != nullptr ? reference : picture;
-    if (!has_pixels(base)) return 0;
     Image *copy = *cache;
-    if (copy != nullptr && reload == 0 && same_geometry(copy, base) && copy->bitCount == base->bitCount) {
+    if (copy != nullptr && reload == 0 && same_size(copy, base) && copy->bitCount == base->bitCount) {
         if (r != 0) PointArea_Copy(picture, copy, cx, cy, r);
         return 1;
     }
@@ -141,9 +143,11 @@ int32_t alg_Img_Blending(Image *src, Image **out) {
     Image *tinted = nullptr;
     alg_Blending(src, nullptr, 0, 0, PXTint{201, 189, 203}, 0, &tinted);
     ImagePtr owned(tinted);
-    if (!owned) return 0;
-    Image *target = out == nullptr ? src : acquire_result(src, out);
-    if (target == nullptr) return 0;
+    // The output slot is prepared from the source whether or not the tint
+    // could be made.
+    Image *target = src;
+    if (out != nullptr) target = src != nullptr ? prepare_slot(src, out) : nullptr;
+    if (target == nullptr || !owned) return 0;
     PX_Img_Copy(target, owned.get());
     return 1;
 }

@@ -31,7 +31,6 @@ extern "C" {
 
 int32_t ImageExposure(const Image *src, Image **dst, int32_t delta) {
     if (!has_pixels(src) || dst == nullptr) return 0;
-    if (*dst != nullptr && !has_pixels(*dst)) return 0;
     Image *h = nullptr, *s = nullptr, *l = nullptr, *a = nullptr;
     if (!Split(src, &h, &s, &l, src->bitCount == 32 ? &a : nullptr, kHsl)) return 0;
     shift_plane(l, delta);

@@ -181,27 +181,37 @@ void MakeMapping(int32_t table[256], float lowFraction, float highThreshold) {
 }
 
 int32_t ImageAutoGradationProcess(const Image *src, Image **dst, int32_t amount) {
-    if (dst == nullptr || !has_pixels(src)) return 0;
+    if (src == nullptr || dst == nullptr || !rows_inside(src)) return 1;
+    if (src->width <= 0 || src->height <= 0) {
+        prepare_slot(src, dst); // no pixel to write
+        return 1;
+    }
     // Working memory comes first, so its failure leaves the slot as it was.
+    const ReadView view(src);
     Buffer<LocalScreen> tables = alloc_buffer<LocalScreen>(1);
     Buffer<uint32_t> rows = alloc_buffer<uint32_t>(checked_size(static_cast<uint64_t>(src->width) + 2, 3));
-    if (!tables || !rows) return 0;
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return 0;
+    if (!view.ok() || !tables || !rows) return 1;
+    Image *out = prepare_slot(src, dst);
+    if (!has_pixels(out)) return 1;
+    const Image *in = view.get();
     amount = clamp_to(amount, 0, 100);
     int64_t hist[256] = {};
-    with_format(src->bitCount, [&](auto f) { channel_histogram<decltype(f)>(src, hist); });
+    with_format(in->bitCount, [&](auto f) { channel_histogram<decltype(f)>(in, hist); });
     int32_t map[256];
     make_mapping(hist, 0.0005f, 0.0005f, map);
-    with_formats(src, out, [&](auto fs, auto fd) {
-        auto_levels<decltype(fs), decltype(fd)>(src, out, map, amount, tables[0], rows.get());
+    with_formats(in, out, [&](auto fs, auto fd) {
+        auto_levels<decltype(fs), decltype(fd)>(in, out, map, amount, tables[0], rows.get());
     });
     return 1;
 }
 
 void ImageAutoGradationProcess1(const Image *src, Image **dst, int32_t, int32_t gammaFlag) {
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return;
+    if (src == nullptr || dst == nullptr || !rows_inside(src)) return;
+    const ReadView view(src);
+    if (!view.ok()) return;
+    Image *out = prepare_slot(src, dst);
+    if (!has_pixels(out)) return;
+    const Image *in = view.get();
     uint8_t gamma[256];
     if (gammaFlag != 0)
         BuildTable(gamma, 0.8333333f);
@@ -211,13 +221,13 @@ void ImageAutoGradationProcess1(const Image *src, Image **dst, int32_t, int32_t 
     // The stretch of the brighter half would be written first and then
     // overwritten everywhere by the darker half's, so only the latter is made.
     int64_t green[256] = {}, dark[256] = {};
-    with_format(src->bitCount, [&](auto f) { green_and_dark_histograms<decltype(f)>(src, green, dark); });
+    with_format(in->bitCount, [&](auto f) { green_and_dark_histograms<decltype(f)>(in, green, dark); });
     int32_t map[256];
     make_mapping(dark, 0.0f, 0.0f, map);
     uint8_t table[3][256];
     for (int32_t i = 0; i < 256; ++i)
         table[0][i] = table[1][i] = table[2][i] = gamma[map[i]];
-    with_formats(src, out, [&](auto fs, auto fd) { map_pixels<decltype(fs), decltype(fd)>(src, out, table); });
+    with_formats(in, out, [&](auto fs, auto fd) { map_pixels<decltype(fs), decltype(fd)>(in, out, table); });
 }
 
 } // extern "C"

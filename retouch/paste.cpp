@@ -88,9 +88,12 @@ void paste_rect(Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t x0
 
 template <class Rule>
 int32_t paste(Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t r, double innerFactor, int64_t level) {
-    if (!has_pixels(dst) || !has_pixels(src)) return 0;
-    if (r == 0) return 0;
+    if (dst == nullptr || src == nullptr || r == 0) return 0;
+    // A destination whose rows overrun its block, or a source claiming a block
+    // beyond what the library handles, is refused.
+    if (!rows_inside(dst) || !block_claim_ok(src)) return 0;
     const int32_t w = dst->width, h = dst->height;
+    if (w <= 0 || h <= 0) return 1; // no pixel to paste into
     if (static_cast<uint32_t>(cx) >= static_cast<uint32_t>(w)) cx = w - 1;
     if (static_cast<uint32_t>(cy) >= static_cast<uint32_t>(h)) cy = h - 1;
     int32_t ss = 0;
@@ -101,7 +104,9 @@ int32_t paste(Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t r, d
     default: return 1;
     }
     // The source is read in the destination's layout; rows and columns it
-    // does not hold are left unchanged.
+    // does not hold (none without a pixel block) are left unchanged, and a
+    // destination without a block takes nothing.
+    if (dst->bits == nullptr || src->bits == nullptr) return 1;
     const int64_t srcCols = src->pitch / ss;
     const int64_t x0 = std::max<int64_t>(static_cast<int64_t>(cx) - r, 0);
     const int64_t x1 = std::min<int64_t>({static_cast<int64_t>(cx) + r, w - 1, srcCols - 1});

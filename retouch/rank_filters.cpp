@@ -70,8 +70,10 @@ int32_t getpos(const int32_t *values, int32_t count, int32_t value) {
 }
 
 int32_t Best_Color(Image *img, int32_t size) {
-    if (!has_pixels(img) || size > kMaxBestColorSize || img->bitCount != 8) return 0;
+    if (img == nullptr || img->bits == nullptr || size > kMaxBestColorSize || img->bitCount != 8 || !rows_inside(img))
+        return 0;
     const int32_t w = img->width, h = img->height;
+    if (w <= 0 || h <= 0) return 1;
     if (size < 2) {
         // One value or none: the third place of the cleared list is 0.
         for (int32_t y = 0; y < h; ++y)
@@ -103,12 +105,19 @@ int32_t Best_Color(Image *img, int32_t size) {
 }
 
 void MoreLight(const Image *src, int32_t size, Image **dst) {
-    if (!has_pixels(src) || dst == nullptr || size > kMaxMoreLightSize) return;
+    if (src == nullptr || dst == nullptr || size > kMaxMoreLightSize || !rows_inside(src)) return;
+    if (src->width <= 0 || src->height <= 0) {
+        prepare_slot(src, dst); // no pixel to write
+        return;
+    }
+    const ReadView view(src);
+    if (!view.ok()) return;
+    const Image *in = view.get();
     const int32_t w = src->width, h = src->height;
     Buffer<uint8_t> own;
     size_t stride = 0;
     bool failed = false;
-    const uint8_t *plane = index_plane(src, own, stride, failed);
+    const uint8_t *plane = index_plane(in, own, stride, failed);
     if (failed) return;
     Buffer<uint8_t> lift = alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h)));
     if (!lift) return;
@@ -135,10 +144,10 @@ void MoreLight(const Image *src, int32_t size, Image **dst) {
     }
     // The result is prepared only once the lift map stands, so a call short
     // of working memory leaves the slot as it was.
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return;
-    with_formats(src, out, [&](auto fs, auto fd) {
-        lift_pixels<decltype(fs), decltype(fd)>(src, out, lift.get(), static_cast<size_t>(w), kLiftWeight, kLiftWeight,
+    Image *out = prepare_slot(src, dst);
+    if (!has_pixels(out)) return;
+    with_formats(in, out, [&](auto fs, auto fd) {
+        lift_pixels<decltype(fs), decltype(fd)>(in, out, lift.get(), static_cast<size_t>(w), kLiftWeight, kLiftWeight,
                                                 kLiftWeight);
     });
 }

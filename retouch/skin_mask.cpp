@@ -112,7 +112,7 @@ void clear_marks(Image *mask) {
 extern "C" {
 
 int32_t CreateFaceMaskImg(const Image *src, Image **mask) {
-    if (!has_pixels(src) || mask == nullptr) return 0;
+    if (src == nullptr || src->bits == nullptr || mask == nullptr || !rows_inside(src)) return 0;
     free_Image(mask, 0);
     ImagePtr m = make_image(src->width, src->height, 8);
     if (!m) return 0;
@@ -125,14 +125,13 @@ int32_t CreateFaceMaskImg(const Image *src, Image **mask) {
 }
 
 int32_t SmileDetect(const Image *src, Image **dst, int32_t) {
-    if (dst == nullptr) return 0;
-    // The mask first: a call short of memory leaves the slot as it was.
+    if (src == nullptr || dst == nullptr) return 1;
+    // The slot is prepared first; the mask is copied in only when it could
+    // be made (a source without pixels has none).
+    Image *out = prepare_slot(src, dst);
     Image *mask = nullptr;
-    if (!CreateFaceMaskImg(src, &mask)) return 0;
-    ImagePtr owned(mask);
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return 0;
-    PX_Img_Copy(out, mask);
+    if (CreateFaceMaskImg(src, &mask) && out != nullptr) PX_Img_Copy(out, mask);
+    free_Image(&mask, 0);
     return 1;
 }
 

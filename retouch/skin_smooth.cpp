@@ -59,36 +59,50 @@ bool spot_map(const Image *mask, uint8_t *spots) {
 extern "C" {
 
 int32_t alg_Img_smooth_1(const Image *src, Image **dst) {
-    Image *out = acquire_result(src, dst);
+    if (src == nullptr || dst == nullptr) return 0;
+    Image *out = prepare_slot(src, dst);
     if (out == nullptr) return 0;
     const int32_t w = src->width, h = src->height;
     Buffer<uint8_t> spots = alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h)));
     if (!spots) return 0;
-    // A mask that cannot be made fails the call like the spot map: left
-    // unchecked, it would read as no skin and pass the source off as smoothed.
-    Image *mask = nullptr;
-    const bool ok = CreateFaceMaskImg(src, &mask) && spot_map(mask, spots.get());
-    free_Image(&mask, 0);
-    if (!ok) return 0;
-    with_formats(src, out, [&](auto fs, auto fd) {
-        lift_pixels<decltype(fs), decltype(fd)>(src, out, spots.get(), static_cast<size_t>(w), kSpotBlue, kSpotGreen,
-                                                kSpotRed);
+    if (!has_pixels(out)) return 1;
+    // A source without pixels has no mask: no spots, and it reads as 0. A
+    // mask that cannot be made otherwise fails the call like the spot map:
+    // left unchecked, it would read as no skin and pass the source off as
+    // smoothed.
+    const ReadView in(src);
+    if (!in.ok()) return 0;
+    if (src->bits != nullptr) {
+        Image *mask = nullptr;
+        const bool ok = CreateFaceMaskImg(src, &mask) && spot_map(mask, spots.get());
+        free_Image(&mask, 0);
+        if (!ok) return 0;
+    }
+    with_formats(in.get(), out, [&](auto fs, auto fd) {
+        lift_pixels<decltype(fs), decltype(fd)>(in.get(), out, spots.get(), static_cast<size_t>(w), kSpotBlue,
+                                                kSpotGreen, kSpotRed);
     });
     return 1;
 }
 
 void alg_Img_smooth(const Image *src, Image **dst) {
+    // A source the smoothing refuses outright leaves the slot's image as the
+    // caller's, not to be brightened.
+    if (src == nullptr || dst == nullptr || !rows_inside(src)) return;
     alg_Img_smooth_1(src, dst);
-    if (dst != nullptr && *dst != nullptr) LightUP(*dst);
+    if (*dst != nullptr) LightUP(*dst);
 }
 
 int32_t alg_Img_Skin(const Image *src, Image **dst, int32_t lighten) {
-    if (!has_pixels(src) || dst == nullptr) return 0;
+    if (src == nullptr || dst == nullptr || !rows_inside(src)) return 1;
     uint8_t tone[256];
     for (int32_t i = 0; i < 256; ++i)
         tone[i] = static_cast<uint8_t>((52 * i + 75 * ZANTOFILTER[i] + 63) / 127);
-    if (!alg_Img_smooth_1(src, dst)) return 0;
+    // The brightening passes and the tone curve run on whatever the smoothing
+    // left in the slot, also a prepared image it could not write.
+    alg_Img_smooth_1(src, dst);
     Image *out = *dst;
+    if (!has_pixels(out)) return 1;
     const int32_t lightUps = lighten != 0 ? 2 : 1;
     if (out->bitCount == 8 || out->bitCount == 24 || out->bitCount == 32) {
         // Byte channels store every intermediate value exactly, so the
@@ -110,8 +124,8 @@ int32_t alg_Img_Skin(const Image *src, Image **dst, int32_t lighten) {
 }
 
 int32_t LightUP(Image *img) {
-    if (!has_pixels(img)) return 0;
-    map_channels(img, ZANTOMOPI);
+    if (img == nullptr || !rows_inside(img)) return 0;
+    if (has_pixels(img)) map_channels(img, ZANTOMOPI);
     return 1;
 }
 

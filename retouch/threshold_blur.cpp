@@ -72,21 +72,26 @@ extern "C" {
 void thresholdBlur(int32_t, int32_t, int32_t size, int32_t amount, const Image *src, Image **dst) {
     size = clamp_to(size, 1, 10);
     amount = clamp_to(amount, 0, 100);
-    if (!has_pixels(src) || dst == nullptr) return;
+    if (src == nullptr || dst == nullptr || !rows_inside(src)) return;
+    if (src->width <= 0 || src->height <= 0) {
+        prepare_slot(src, dst); // no pixel to write
+        return;
+    }
     // Working rows first: a call short of memory leaves the slot as it was.
+    const ReadView view(src);
     const size_t padded = static_cast<size_t>(src->width) + 2 * static_cast<size_t>(size);
     Buffer<uint32_t> colours = alloc_buffer<uint32_t>(padded);
     Buffer<uint8_t> dark = alloc_buffer<uint8_t>(padded);
-    if (!colours || !dark) return;
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return;
+    if (!view.ok() || !colours || !dark) return;
+    Image *out = prepare_slot(src, dst);
+    if (!has_pixels(out)) return;
     int32_t taps[21], ntaps = 0;
     for (int32_t k = 0; k <= 2 * size; ++k)
         if (matrixX[size - 1][k] != 0.0f) taps[ntaps++] = k;
     const Curves cv = make_curves(amount);
     if (ntaps == 0) return;
-    with_formats(src, out, [&](auto fs, auto fd) {
-        blur_rows<decltype(fs), decltype(fd)>(src, out, size, taps, ntaps, cv, colours.get(), dark.get());
+    with_formats(view.get(), out, [&](auto fs, auto fd) {
+        blur_rows<decltype(fs), decltype(fd)>(view.get(), out, size, taps, ntaps, cv, colours.get(), dark.get());
     });
 }
 

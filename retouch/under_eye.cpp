@@ -71,7 +71,11 @@ void brighten(Image *img, int32_t level) {
     map_channels(img, table);
 }
 
-bool brushable(const Image *img) { return has_pixels(img) && (img->bitCount == 24 || img->bitCount == 32); }
+// A picture with a pixel block of the brush's bit counts; an empty size
+// leaves the lightened copy unmade, unless the slot holds one.
+bool brushable(const Image *img) {
+    return img != nullptr && img->bits != nullptr && (img->bitCount == 24 || img->bitCount == 32) && rows_inside(img);
+}
 
 // A new brightened copy of the picture tagged with level, or null.
 Image *brightened_copy(const Image *img, int32_t level) {
@@ -106,12 +110,12 @@ int32_t alg_QuHeiYanQuan(Image *img, int32_t cx, int32_t cy, int32_t r, int32_t 
     if (!brushable(img)) return 0;
     ImagePtr temp;
     Image *copy = nullptr;
-    if (cache != nullptr && *cache != nullptr && has_pixels(*cache) && (*cache)->height == img->height &&
-        (*cache)->width == img->width && (*cache)->tag == static_cast<uint32_t>(level)) {
+    if (cache != nullptr && *cache != nullptr && (*cache)->height == img->height && (*cache)->width == img->width &&
+        (*cache)->tag == static_cast<uint32_t>(level)) {
         copy = *cache;
         if (refresh != 0) {
             PX_Img_Copy(copy, img);
-            brighten(copy, level);
+            if (has_pixels(copy)) brighten(copy, level);
         }
     } else {
         if (cache != nullptr) free_Image(cache, 0);

@@ -21,6 +21,7 @@
 #include <cstdint>
 
 #include "core/internal/math.hpp"
+#include "core/internal/memory.hpp"
 
 namespace pxfx {
 
@@ -149,6 +150,35 @@ template <class F> struct Sampler {
     int32_t w, h;
     explicit Sampler(const Image *image) : im(image), w(image->width), h(image->height) {}
     uint32_t at(int32_t x, int32_t y) const { return F::load(F::crow(im, clamp_coord(y, h)), clamp_coord(x, w)); }
+};
+
+// The pixels a kernel reads from a record that may have no pixel block. The
+// pixel readers read such a record as 0; for the byte formats (8, 16, 24 and
+// 32 bits) the view stands in a record of the same size and bit count whose
+// rows all lie on one zeroed row (pitch 0), so row loops read those zeros
+// too. Any other record is used as it is. ok() is false when the zeroed row
+// cannot be had.
+class ReadView {
+  public:
+    explicit ReadView(const Image *im) : im_(im) {
+        const uint32_t bc = im->bitCount;
+        if (im->bits != nullptr || im->width <= 0 || im->height <= 0 || (bc != 8 && bc != 16 && bc != 24 && bc != 32))
+            return;
+        zeros_ = alloc_zeroed<uint8_t>(static_cast<size_t>(min_row_bytes(bc, im->width)));
+        stand_in_ = *im;
+        stand_in_.bits = zeros_.get();
+        stand_in_.pitch = 0;
+        im_ = &stand_in_;
+    }
+    ReadView(const ReadView &) = delete;
+    ReadView &operator=(const ReadView &) = delete;
+    bool ok() const { return im_ != &stand_in_ || zeros_ != nullptr; }
+    const Image *get() const { return im_; }
+
+  private:
+    const Image *im_;
+    Image stand_in_{};
+    Buffer<uint8_t> zeros_;
 };
 
 } // namespace pxfx

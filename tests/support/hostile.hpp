@@ -103,7 +103,7 @@ template <class R> std::vector<HeldPtr<R>> broken(const std::vector<int32_t> &fo
         v.push_back(held("null pixels", 9, 7, bc, row, 0, 0));
         v.push_back(held("zero width", 0, 7, bc, row, size_t(row) * 7, 2));
         v.push_back(held("negative height", 9, -7, bc, row, 64, 3));
-        v.push_back(held("INT_MIN width", INT_MIN, 7, bc, row, 64, 4));
+        v.push_back(held("INT_MIN width", INT_MIN, 7, bc, row, size_t(row) * 7, 4));
         v.push_back(held("block over 2^32 bytes", 65536, 65536, bc, padded_pitch(65536, bc), 64, 5));
         v.push_back(held("INT_MAX height", 9, INT_MAX, bc, row, 64, 6));
         if (bc >= 8) v.push_back(held("pitch below a row", 9, 7, bc, 9 * bc / 8 - 1, size_t(9 * bc / 8 - 1) * 7, 7));
