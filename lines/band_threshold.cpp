@@ -124,19 +124,26 @@ int32_t GetMaxHtoThrod2(const uint32_t hist[256], int32_t total) {
 }
 
 int32_t BinImg(Image *img, Image **out) {
-    if (!is_plane(img)) return 0;
+    if (!lines::markable(img)) return 0;
+    // Without columns there is nothing to read or write; otherwise the
+    // thresholding reads every pixel, which needs a block.
+    const bool empty = img->width <= 0;
+    if (!empty && img->bits == nullptr) return 0;
     // The marking's scratch comes first, so that a failure touches nothing.
     Buffer<int32_t> scratch;
-    if (img->height > 1) {
+    if (!lines::marks_nothing(img)) {
         scratch = lines::line_scratch(img);
         if (!scratch) return 0;
     }
+    // The slot's image is replaced even when the new one cannot be made (an
+    // empty width makes none): the work then goes into the input.
     Image *dst = img;
     if (out != nullptr && *out != img) {
         free_Image(out, 0);
         *out = malloc_Image(img->width, img->height, static_cast<int32_t>(img->bitCount));
         if (*out != nullptr) dst = *out;
     }
+    if (empty) return 1;
     lines::band_threshold(img, dst);
     lines::remove_isolated_dots(dst);
     if (scratch) lines::mark_line_bands(dst, scratch.get());

@@ -164,7 +164,7 @@ void mark_line_bands(Image *img, int32_t *scratch) {
         y = e + 1;
     }
 
-    mark_rows(img, a, c, h1, cols > 0 ? cols : 0);
+    mark_rows(img, a, c, h1, cols);
 }
 
 } // namespace pxfx::lines
@@ -172,8 +172,10 @@ void mark_line_bands(Image *img, int32_t *scratch) {
 extern "C" {
 
 int32_t DetectLines(Image *img) {
-    if (!is_plane(img)) return 0;
-    if (img->height == 1) return 1;
+    if (!lines::markable(img)) return 0;
+    if (lines::marks_nothing(img)) return 1;
+    // Marking a record without pixels would write through its missing block.
+    if (img->bits == nullptr) return 0;
     Buffer<int32_t> scratch = lines::line_scratch(img);
     if (!scratch) return 0;
     lines::mark_line_bands(img, scratch.get());

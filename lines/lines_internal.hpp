@@ -7,13 +7,17 @@
 
 #include <cstdint>
 
+#include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 
 namespace pxfx::lines {
 
-// Smallest plane RecognizeYUV accepts. Its sample strips read columns 50..79
-// and width - 70 .. width - 41 from row 10 on, and its boundary line runs from
-// column 65 to column width - 55, so at least one column must lie between them.
+// Smallest plane RecognizeYUV accepts. The boundary's mean level is taken
+// over columns 65 .. width - 56, which hold no column below 121 (the mean
+// would divide by zero, and at 120 the line's slope too). Below 13 rows the
+// sample strips, which start at row 10 and end 3 rows above the bottom, walk
+// no row, so both boundary rows are height - 2 and the mean always reads rows
+// height .. height + 5, below the picture.
 inline constexpr int32_t kMinRecognizeWidth = 121;
 inline constexpr int32_t kMinRecognizeHeight = 13;
 
@@ -38,11 +42,25 @@ void band_threshold(const Image *src, Image *dst);
 // A 1 between two pixels that are not 1 becomes 255.
 void remove_isolated_dots(Image *img);
 
-// Scratch of the line-band marking of a plane of two rows or more (three
-// words per row but one); empty when it cannot be had.
+// True for an 8-bit record that the line-band marking can run on: rows its
+// block holds, at least one row (its scratch lists have height - 1 entries
+// and are cleared; none could be cleared for fewer), and a width from which
+// width - 10 can be formed. Such a record without pixels may still be marked
+// when marks_nothing holds.
+inline bool markable(const Image *img) {
+    return img != nullptr && img->bitCount == 8 && rows_inside(img) && img->height > 0 && img->width >= INT32_MIN + 10;
+}
+
+// True when the marking of a markable record touches no pixel: one row has no
+// pair of rows to compare, and it marks columns 0 .. width - 11 only.
+inline bool marks_nothing(const Image *img) { return img->height == 1 || img->width <= 10; }
+
+// Scratch of the line-band marking of a plane with pixels for which
+// marks_nothing does not hold (three words per row but one); empty when it
+// cannot be had.
 Buffer<int32_t> line_scratch(const Image *img);
 
-// Marks the line bands of a binarised plane of two rows or more in place.
+// Marks the line bands of such a binarised plane in place.
 void mark_line_bands(Image *img, int32_t *scratch);
 
 } // namespace pxfx::lines

@@ -43,13 +43,17 @@ Buffer<uint8_t> column_histograms(int32_t cols) {
     return alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(cols), kLevels));
 }
 
-// Rows 3 .. h - 4, columns 7 .. w - 9: the 10th smallest of the column's five
-// pixels of rows y - 2 .. y + 2 and the fourteen other pixels of row y in
-// columns x - 7 .. x + 7. The rank is tracked along the row.
+// Narrowest planes with a column to filter: the cross filters columns
+// 7 .. width - 9, the box columns 2 .. width - 5.
+constexpr int32_t kCrossMinWidth = 16, kBoxMinWidth = 7;
+
+// Rows 3 .. h - 4, columns 7 .. w - 9 (at least one): the 10th smallest of
+// the column's five pixels of rows y - 2 .. y + 2 and the fourteen other
+// pixels of row y in columns x - 7 .. x + 7. The rank is tracked along the
+// row.
 bool cross_median(const Image *img, Image *res) {
     const int32_t w = img->width, h = img->height;
     const int32_t x0 = 7, x1 = w - 9;
-    if (x1 < x0) return true;
     Buffer<uint8_t> block = column_histograms(x1 - x0 + 1);
     if (!block) return false;
     uint8_t *const hists = block.get();
@@ -104,13 +108,12 @@ bool cross_median(const Image *img, Image *res) {
     return true;
 }
 
-// Rows 3 .. h - 4, columns 2 .. w - 5: the 13th smallest of the 5 x 5 block
-// around the pixel. Each column's block histogram carries its own rank down
-// the picture.
+// Rows 3 .. h - 4, columns 2 .. w - 5 (at least one): the 13th smallest of
+// the 5 x 5 block around the pixel. Each column's block histogram carries its
+// own rank down the picture.
 bool box_median(const Image *img, Image *res) {
     const int32_t w = img->width, h = img->height;
     const int32_t x0 = 2, x1 = w - 5;
-    if (x1 < x0) return true;
     const int32_t cols = x1 - x0 + 1;
     Buffer<uint8_t> block = column_histograms(cols);
     Buffer<RankTracker> trackers = alloc_buffer<RankTracker>(static_cast<size_t>(cols));
@@ -143,10 +146,16 @@ bool box_median(const Image *img, Image *res) {
     return true;
 }
 
-template <class Filter> int32_t run_median(Image *img, Image **out, Filter filter) {
-    if (!is_plane(img) || img->height < 5) return 0;
+// A plane narrower than minWidth has no column to filter: nothing is read
+// and the result is a new image as malloc_Image makes it, also for a record
+// without pixels. Wider planes have their column histograms filled from rows
+// 0..4, which need a block of five rows or more.
+template <class Filter> int32_t run_median(Image *img, Image **out, int32_t minWidth, Filter filter) {
+    if (img == nullptr || img->bitCount != 8 || !rows_inside(img)) return 0;
+    const bool filters = img->width >= minWidth;
+    if (filters && (img->bits == nullptr || img->height < 5)) return 0;
     ImagePtr res = make_image(img->width, img->height, 8);
-    if (!res || !filter(img, res.get())) return 0;
+    if (!res || (filters && !filter(img, res.get()))) return 0;
     return lines::deliver(img, out, std::move(res));
 }
 
@@ -155,11 +164,15 @@ template <class Filter> int32_t run_median(Image *img, Image **out, Filter filte
 extern "C" {
 
 int32_t MyEdge(Image *img, Image **out) {
-    if (!is_plane(img)) return 0;
-    ImagePtr res = make_image(img->width, img->height, 8);
+    if (img == nullptr || img->bitCount != 8 || !rows_inside(img)) return 0;
+    // Pixels are read only on planes of three rows and three columns or more;
+    // smaller ones, with or without pixels, give a new image as it is made.
+    const int32_t w = img->width, h = img->height;
+    const int32_t rows = w >= 3 && h >= 3 ? h - 2 : 0;
+    if (rows > 0 && img->bits == nullptr) return 0;
+    ImagePtr res = make_image(w, h, 8);
     if (!res) return 0;
-    const int32_t w = img->width;
-    for (int32_t y = 0; y + 2 < img->height; ++y) {
+    for (int32_t y = 0; y < rows; ++y) {
         const uint8_t *ra = row_ptr(img, y), *rb = row_ptr(img, y + 2);
         uint8_t *o = row_ptr(res.get(), y);
         for (int32_t x = 1; x < w - 1; ++x) {
@@ -170,8 +183,8 @@ int32_t MyEdge(Image *img, Image **out) {
     return lines::deliver(img, out, std::move(res));
 }
 
-int32_t MyFliter(Image *img, Image **out) { return run_median(img, out, cross_median); }
+int32_t MyFliter(Image *img, Image **out) { return run_median(img, out, kCrossMinWidth, cross_median); }
 
-int32_t MyFliter1(Image *img, Image **out) { return run_median(img, out, box_median); }
+int32_t MyFliter1(Image *img, Image **out) { return run_median(img, out, kBoxMinWidth, box_median); }
 
 } // extern "C"

@@ -164,8 +164,11 @@ void ImgDecode(Image *img, Image **out) {
 // n <= 255 f + 25 the error n (m - 2^23 / f) / 2^23 stays below 0.002, less
 // than the 1 / f that separates n / f from the next integer, and n m < 2^32.
 Image *MyResample2(Image *img, int32_t factor) {
-    if (factor < 2 || factor > 49 || !is_plane(img)) return nullptr;
+    if (factor < 2 || factor > 49 || img == nullptr || img->bitCount != 8 || !rows_inside(img)) return nullptr;
     const int32_t w = img->width, h = img->height;
+    // A plane of one row is read by nothing but the copy of its last row; a
+    // taller one needs its block.
+    if (img->bits == nullptr && h > 1) return nullptr;
     const int64_t newHeight = static_cast<int64_t>(factor) * (h - 1) + 1;
     if (newHeight > INT32_MAX) return nullptr;
     Image *res = malloc_Image(w, static_cast<int32_t>(newHeight), 8);
@@ -180,8 +183,9 @@ Image *MyResample2(Image *img, int32_t factor) {
                 o[x] = static_cast<uint8_t>(((a[x] * wa + b[x] * k + round) * m) >> 23);
         }
     }
-    // The last row lies exactly on the last source row.
-    std::memcpy(row_ptr(res, res->height - 1), row_ptr(img, h - 1), static_cast<size_t>(w));
+    // The last row lies exactly on the last source row; without a block it
+    // stays as malloc_Image made it.
+    if (img->bits != nullptr) std::memcpy(row_ptr(res, res->height - 1), row_ptr(img, h - 1), static_cast<size_t>(w));
     // A plane below the straightening's minimum size is returned as it is; a
     // straightening that runs out of memory fails the call.
     if (RecognizeYUV(res, nullptr) == 0 && w >= lines::kMinRecognizeWidth && res->height >= lines::kMinRecognizeHeight)

@@ -3,6 +3,8 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <climits>
+#include <cstring>
 #include <vector>
 
 #include "support/test_images.hpp"
@@ -43,7 +45,7 @@ Owned reference_edge(const Image *src) {
 // Every size around the windows, on random planes; odd seeds keep eight
 // levels (0..3, 8..11) so that ranks fall on ties and differences straddle
 // the edge marker's step of 9.
-void check(int32_t (*filter)(Image *, Image **), Owned (*reference)(const Image *), int32_t minHeight) {
+void check(int32_t (*filter)(Image *, Image **), Owned (*reference)(const Image *)) {
     const int32_t sizes[][2] = {{1, 5}, {6, 7}, {7, 9}, {15, 8}, {16, 8}, {17, 5}, {19, 6}, {23, 11}, {45, 33}};
     uint32_t seed = 1;
     for (auto [w, h] : sizes) {
@@ -55,15 +57,69 @@ void check(int32_t (*filter)(Image *, Image **), Owned (*reference)(const Image 
         ASSERT_EQ(filter(src.get(), &handed), 1);
         EXPECT_EQ(diff(handed.get(), want.get()), "") << w << "x" << h;
     }
-    EXPECT_EQ(minHeight > 1 ? filter(random_image(30, minHeight - 1, 8, 9).get(), nullptr) : 0, 0);
 }
 
 } // namespace
 
 TEST(RankFilters, MediansAndEdgeMarkerMatchStraightforwardVersions) {
-    check(MyFliter, reference_median<true>, 5);
-    check(MyFliter1, reference_median<false>, 5);
-    check(MyEdge, reference_edge, 1);
+    check(MyFliter, reference_median<true>);
+    check(MyFliter1, reference_median<false>);
+    check(MyEdge, reference_edge);
+}
+
+// A filter whose windows fit no column or row reads nothing and delivers a
+// new plane as malloc_Image makes it (all 255), with or without pixels; one
+// that would read rows the plane lacks, or a missing block, refuses; empty
+// and negative sizes have no result plane.
+TEST(RankFilters, SmallPlanesAndRecordsWithoutPixels) {
+    struct Case {
+        int32_t (*filter)(Image *, Image **);
+        int32_t w, h;
+        bool pixels;
+        int32_t result;
+    };
+    const Case cases[] = {
+        {MyFliter, 15, 1, true, 1},      {MyFliter, 15, 30, false, 1}, {MyFliter, 16, 4, true, 0},
+        {MyFliter, 16, 6, true, 1},      {MyFliter, 16, 9, false, 0},  {MyFliter, 0, 5, true, 0},
+        {MyFliter1, 6, 2, true, 1},      {MyFliter1, 6, 9, false, 1},  {MyFliter1, 7, 4, true, 0},
+        {MyFliter1, 7, 6, true, 1},      {MyFliter1, 7, 9, false, 0},  {MyFliter1, 5, -2, true, 0},
+        {MyEdge, 2, 9, false, 1},        {MyEdge, 9, 2, true, 1},      {MyEdge, 3, 3, false, 0},
+        {MyEdge, INT32_MIN, 4, true, 0},
+    };
+    uint32_t seed = 40;
+    for (const Case &k : cases) {
+        Owned held = random_image(std::max(k.w, 1), std::max(k.h, 1), 8, seed++), before = clone(held.get());
+        Image rec = *held;
+        rec.width = k.w, rec.height = k.h;
+        if (!k.pixels) rec.bits = nullptr;
+        Slot handed;
+        EXPECT_EQ(k.filter(&rec, &handed), k.result) << k.w << "x" << k.h;
+        EXPECT_EQ(k.result ? diff(handed.get(), make(k.w, k.h, 8).get()) : diff(held.get(), before.get()), "");
+        EXPECT_EQ(handed.get() != nullptr, k.result == 1);
+        // In place: a plane with pixels becomes all 255.
+        EXPECT_EQ(k.filter(&rec, nullptr), k.result);
+        EXPECT_EQ(diff(held.get(), k.result && k.pixels ? make(k.w, k.h, 8).get() : before.get()), "");
+    }
+}
+
+// An image already in the slot receives the result through PX_Img_Copy,
+// clamped to its size and converted to its bit count; a slot record without
+// pixels is left as it is. 1 in both cases.
+TEST(RankFilters, DeliveryIntoTheSlotsImage) {
+    Owned src = random_image(6, 5, 8, 4), edges = reference_edge(src.get()), want = make(8, 3, 24);
+    for (int32_t y = 0; y < 3; ++y)
+        for (int32_t x = 0; x < 8; ++x)
+            SetPixelColor(want.get(), x, y, GetPixelColor(edges.get(), x, y));
+    Slot wider;
+    wider.image = malloc_Image(8, 3, 24);
+    ASSERT_EQ(MyEdge(src.get(), &wider), 1);
+    EXPECT_EQ(diff(wider.get(), want.get()), "");
+    for (Image hollow : {Image{6, 5, 8, nullptr, 8, 0}, Image{2, 9, 24, nullptr, 8, 3}}) {
+        const Image kept = hollow;
+        Image *slot = &hollow;
+        EXPECT_EQ(MyEdge(src.get(), &slot), 1);
+        EXPECT_TRUE(slot == &hollow && std::memcmp(&hollow, &kept, sizeof(Image)) == 0);
+    }
 }
 
 TEST(RGB_Reverse, SwapsRedAndBlueOfColourPixelsOnly) {
@@ -72,4 +128,16 @@ TEST(RGB_Reverse, SwapsRedAndBlueOfColourPixelsOnly) {
         ASSERT_EQ(RGB_Reverse(im.get()), 1);
         EXPECT_EQ(diff(im.get(), filled(3, 2, bc, bc < 24 ? 0x80112233u : 0x80332211u).get()), "") << bc;
     }
+    // Empty sizes swap nothing (1); no block, or rows past the block, is 0.
+    const int32_t sizes[][2] = {{0, 2}, {3, -2}, {INT32_MIN, 2}, {3, 0}};
+    Owned im = filled(3, 2, 24, 0x112233u), kept = clone(im.get());
+    for (auto [w, h] : sizes) {
+        Image rec = *im;
+        rec.width = w, rec.height = h;
+        EXPECT_EQ(RGB_Reverse(&rec), 1) << w << "x" << h;
+    }
+    Image hollow = *im, narrow = *im;
+    hollow.bits = nullptr, narrow.pitch = 8;
+    EXPECT_EQ(RGB_Reverse(&hollow) + RGB_Reverse(&narrow), 0);
+    EXPECT_EQ(diff(im.get(), kept.get()), "");
 }

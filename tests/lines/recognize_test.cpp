@@ -74,6 +74,10 @@ TEST(Straighten, FollowsTheStripBoundariesAndReadsClamped) {
 TEST(RecognizeYUV, RefusesPlanesSmallerThanItsStripsAndDelivers) {
     EXPECT_EQ(RecognizeYUV(tilted(120, 100).get(), nullptr), 0);
     EXPECT_EQ(RecognizeYUV(tilted(200, 12).get(), nullptr), 0);
+    Owned page = tilted(200, 100);
+    Image hollow = *page;
+    hollow.bits = nullptr;
+    EXPECT_EQ(RecognizeYUV(&hollow, nullptr), 0);
     for (auto [w, h] : {std::pair{121, 13}, {131, 40}, {200, 100}}) {
         Owned im = random_image(w, h, 8, static_cast<uint32_t>(w)), inPlace = clone(im.get());
         ASSERT_EQ(RecognizeYUV(inPlace.get(), nullptr), 1);
@@ -99,6 +103,18 @@ TEST(MyResample2, InterpolatesRowsWithRounding) {
     }
     EXPECT_EQ(MyResample2(src.get(), 1), nullptr);
     EXPECT_EQ(MyResample2(src.get(), 50), nullptr);
+    // One row is only copied; without a block it is a new row of 255, and a
+    // taller record without one is refused.
+    Image row = *src;
+    row.height = 1;
+    Owned copied(MyResample2(&row, 7));
+    ASSERT_NE(copied, nullptr);
+    EXPECT_TRUE(std::equal(src->bits, src->bits + 17, copied->bits) && copied->height == 1);
+    row.bits = nullptr;
+    Owned blank(MyResample2(&row, 7));
+    EXPECT_EQ(blank ? diff(blank.get(), make(17, 1, 8).get()) : "null", "");
+    row.height = 2;
+    EXPECT_EQ(MyResample2(&row, 7), nullptr);
 }
 
 TEST(CheckMaxSame, RunsStartAtTheFirstLabelValue) {
@@ -108,12 +124,20 @@ TEST(CheckMaxSame, RunsStartAtTheFirstLabelValue) {
     EXPECT_EQ(longest({1, -1, -1, -1, 2, 2}), (Ints{0, -9, -9})); // -1 never counts
     // A first value that is no index starts at index 0.
     EXPECT_EQ(longest({-3, -3, -3, 0}), (Ints{2, 0, 3}));
+    // Two labels end their only run uncounted; fewer give no run at all.
+    for (int32_t n : {-1, 0, 1, 2}) {
+        int32_t first = -9, last = -9;
+        EXPECT_EQ(CheckMaxSame(Ints{0, 0}.data(), n, &first, &last) + first + last, -18) << n;
+    }
 }
 
 TEST(CombineMinSpace, MergesCloseIntervalsAndDropsShortOnes) {
     EXPECT_EQ(combine({0, 10, 12, 15, 30, 31, 40, 60}, 5), (Ints{0, 15, 40, 60}));
     // minGap 0 means 2; an absorbed interval's end is taken even when smaller.
     EXPECT_EQ(combine({0, 20, 3, 8, 40, 45, 46, 47}, 0), (Ints{0, 8, 40, 47}));
+    Ints kept = {0, 10};
+    EXPECT_EQ(CombineMinSpace(kept.data(), -1, 5) + CombineMinSpace(kept.data(), 0, 5), 0);
+    EXPECT_EQ(kept, (Ints{0, 10}));
 }
 
 TEST(CheckLapOver, CrossingIntervalWinsElseTheNextOneIsReported) {
@@ -126,4 +150,8 @@ TEST(CheckLapOver, CrossingIntervalWinsElseTheNextOneIsReported) {
     EXPECT_EQ(lap(list, 60, 70), (Ints{0, 0, 0}));
     // An interval from the query's end that does not pass it stops the walk.
     EXPECT_EQ(lap({25, 25, 30, 40}, 0, 25), (Ints{0, 0, 0}));
+    // An empty list (n of 0 or less) leaves the empty interval.
+    int32_t s = 5, e = 9;
+    EXPECT_EQ(CheckLapOver(list.data(), -1, &s, &e) + s + e, 0);
+    EXPECT_EQ(lap({}, 5, 9), (Ints{0, 0, 0}));
 }

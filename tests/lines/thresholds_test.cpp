@@ -2,6 +2,7 @@
 // the band codes written on synthetic binarised pages of horizontal lines.
 #include <gtest/gtest.h>
 
+#include <climits>
 #include <vector>
 
 #include "lines/lines_internal.hpp"
@@ -13,7 +14,7 @@ TEST(Threshold, SpreadTestOtsuAndFloor) {
     uint32_t h[256] = {}, empty[256] = {}, two[256] = {}, three[256] = {};
     std::fill(h + 100, h + 170, 10u);
     h[0] = h[255] = 10; // tails within the outer 1/32 are no spread
-    EXPECT_EQ(GetMaxHtoThrod2(h, -5) + GetMaxHtoThrod2(empty, 0), 2 * 255);
+    EXPECT_EQ(GetMaxHtoThrod2(h, -5) + GetMaxHtoThrod2(empty, 0) + GetMaxHtoThrod2(empty, 50), 3 * 255);
     // Otsu: ties go to the later level, and the level is at least 60.
     two[30] = two[220] = 1000;
     EXPECT_EQ(GetMaxHtoThrod2(two, 0) + GetMaxHtoThrod2(two, 2000), 2 * 219);
@@ -55,6 +56,35 @@ TEST(BinImg, SlotGetsAFreshImageAndTheInputStays) {
     EXPECT_EQ(diff(self, inPlace.get()), "");
 }
 
+// No columns: nothing to work on, and the slot's image is released for a
+// plane that cannot be made. Refused with the slot untouched: a missing block
+// with columns to read, no rows, and widths whose width - 10 overflows.
+TEST(BinImg, EmptyWidthsReleaseTheSlotAndOthersAreRefused) {
+    struct Case {
+        int32_t w, h;
+        bool pixels;
+        int32_t result;
+    };
+    const Case cases[] = {{0, 7, true, 1}, {-5, 3, false, 1}, {INT32_MIN + 10, 7, true, 1}, {9, 7, false, 0},
+                          {9, 0, true, 0}, {9, -1, true, 0},  {INT32_MIN + 9, 7, true, 0}};
+    for (const Case &k : cases) {
+        Owned held = random_image(9, 7, 8, 11), before = clone(held.get());
+        Image rec = *held;
+        rec.width = k.w, rec.height = k.h;
+        if (!k.pixels) rec.bits = nullptr;
+        Slot slot;
+        slot.image = malloc_Image(2, 2, 8);
+        Image *given = slot.get();
+        EXPECT_EQ(BinImg(&rec, &slot), k.result) << k.w << "x" << k.h;
+        if (k.result == 1)
+            EXPECT_EQ(slot.get(), nullptr);
+        else
+            EXPECT_TRUE(slot.get() == given && diff(given, make(2, 2, 8).get()).empty());
+        EXPECT_EQ(BinImg(&rec, nullptr), k.result);
+        EXPECT_EQ(diff(held.get(), before.get()), "");
+    }
+}
+
 namespace {
 
 // DetectLines on a white 100 x 120 page (255) with one-row dark lines (1),
@@ -89,7 +119,26 @@ TEST(DetectLines, MarksLineBandsOnSyntheticPagesAndSurvivesTinyOnes) {
     check_page({20, 40, 60, 80, 100}, {0,  8,  25,  9,  21, 0, 22, 38, 125, 39, 41,  0, 42,  58,  175, 59,  61,  0,
                                        62, 78, 225, 79, 81, 0, 82, 98, 25,  99, 101, 0, 102, 117, 75,  118, 118, 0},
                true);
-    // Tiny and wrong planes.
-    for (auto [w, h] : {std::pair{1, 1}, {3, 2}, {12, 3}, {11, 40}, {40, 2}})
+    // Tiny planes that are marked.
+    for (auto [w, h] : {std::pair{12, 3}, {11, 40}, {40, 2}})
         EXPECT_EQ(DetectLines(random_image(w, h, 8, 5).get()), 1) << w << "x" << h;
+    // One row, or 10 columns and fewer, leave nothing to mark (1, untouched),
+    // with or without pixels. Refused: a wider and taller record without
+    // pixels, no rows, and a width whose width - 10 overflows.
+    struct Case {
+        int32_t w, h;
+        bool pixels;
+        int32_t result;
+    };
+    const Case cases[] = {{1, 1, true, 1},   {40, 1, true, 1}, {40, 1, false, 1}, {10, 40, true, 1},
+                          {9, 7, false, 1},  {0, 7, true, 1},  {-7, 7, true, 1},  {INT32_MIN + 10, 3, true, 1},
+                          {11, 7, false, 0}, {9, 0, true, 0},  {9, -7, true, 0},  {INT32_MIN + 9, 3, true, 0}};
+    for (const Case &k : cases) {
+        Owned held = random_image(40, 40, 8, 6), before = clone(held.get());
+        Image rec = *held;
+        rec.width = k.w, rec.height = k.h;
+        if (!k.pixels) rec.bits = nullptr;
+        EXPECT_EQ(DetectLines(&rec), k.result) << k.w << "x" << k.h;
+        EXPECT_EQ(diff(held.get(), before.get()), "");
+    }
 }
