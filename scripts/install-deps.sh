@@ -2,8 +2,10 @@
 # Installs the Debian packages that building and testing pxfx needs, skipping
 # those already present. Runs as root (or through sudo when available).
 set -euo pipefail
-# libopencv-dev and libopencv-contrib-dev serve only the comparison benchmarks.
-packages=(cmake ninja-build g++ make pkg-config libgtest-dev libbenchmark-dev libpng-dev libjpeg-dev
+# The picture libraries serve the pxfx tool; libopencv-dev and
+# libopencv-contrib-dev serve only the comparison benchmarks.
+packages=(cmake ninja-build g++ make pkg-config libgtest-dev libbenchmark-dev
+          libpng-dev libjpeg-dev libwebp-dev libheif-dev libexif-dev liblcms2-dev libstb-dev
           libopencv-dev libopencv-contrib-dev)
 missing=()
 for p in "${packages[@]}" "$@"; do

@@ -3,7 +3,7 @@
 #   scripts/run-fuzzers.sh [SECONDS_PER_TARGET] [TARGET...]   (default 60 s each)
 #   scripts/run-fuzzers.sh --total SECONDS [TARGET...]        (SECONDS split over the targets)
 # TARGET names a target without its prefix (core, color, effects, deform,
-# toolkit, retouch, lines, operations); all of them by default.
+# toolkit, retouch, lines, operations, picture); all of them by default.
 # Every target runs even when an earlier one fails; the script exits 1 when
 # any target reported a crash, sanitizer error, leak or timeout. Reproducers
 # are written to fuzz/findings/; the corpus grows in build-fuzz/corpus/, seeded
@@ -21,7 +21,7 @@ elif [ -n "${1:-}" ] && [ -z "${1//[0-9]/}" ]; then
   shift
 fi
 targets=("$@")
-[ ${#targets[@]} -gt 0 ] || targets=(core color effects deform toolkit retouch lines operations)
+[ ${#targets[@]} -gt 0 ] || targets=(core color effects deform toolkit retouch lines operations picture)
 if [ -n "$total" ]; then
   per_target=$((total / ${#targets[@]}))
   [ "$per_target" -ge 1 ] || per_target=1

@@ -1,13 +1,16 @@
+// Pictures in and out: the format is recognised by its first bytes, decoded
+// by its library, converted to sRGB and turned upright; outputs are written
+// in the format of their extension with the metadata it can carry.
 #include "image_io.hpp"
 
-#include <jpeglib.h>
-#include <png.h>
-
-#include <csetjmp>
 #include <cstdio>
 #include <cstring>
+#include <fstream>
+#include <iterator>
 #include <memory>
-#include <vector>
+
+#include "picture_adjust.hpp"
+#include "picture_formats.hpp"
 
 namespace pxio {
 
@@ -28,273 +31,182 @@ std::string lower_extension(const std::string &path) {
     return ext;
 }
 
-uint8_t *row(const Image *im, int32_t y) { return im->bits + static_cast<size_t>(y) * im->pitch; }
-
-// Blue, green, red (and alpha) bytes of any Image, one row at a time.
-void read_bgra(const Image *im, int32_t y, uint8_t *out) {
-    for (int32_t x = 0; x < im->width; ++x) {
-        const uint32_t c = GetPixelColor(im, x, y);
-        out[4 * x] = static_cast<uint8_t>(c), out[4 * x + 1] = static_cast<uint8_t>(c >> 8);
-        out[4 * x + 2] = static_cast<uint8_t>(c >> 16), out[4 * x + 3] = static_cast<uint8_t>(c >> 24);
-    }
+bool starts_with(const uint8_t *data, size_t size, size_t at, const char *text) {
+    const size_t n = std::strlen(text);
+    return size >= at + n && std::memcmp(data + at, text, n) == 0;
 }
 
-Image *read_png(const std::string &path, std::string *error) {
-    png_image png{};
-    png.version = PNG_IMAGE_VERSION;
-    if (!png_image_begin_read_from_file(&png, path.c_str())) {
-        *error = path + ": " + png.message;
-        return nullptr;
-    }
-    const bool alpha = (png.format & PNG_FORMAT_FLAG_ALPHA) != 0;
-    png.format = alpha ? PNG_FORMAT_BGRA : PNG_FORMAT_BGR;
-    Image *im = malloc_Image(static_cast<int32_t>(png.width), static_cast<int32_t>(png.height), alpha ? 32 : 24);
-    if (im == nullptr) {
-        png_image_free(&png);
-        *error = path + ": picture too large";
-        return nullptr;
-    }
-    if (!png_image_finish_read(&png, nullptr, im->bits, static_cast<png_int_32>(im->pitch), nullptr)) {
-        *error = path + ": " + png.message;
-        free_Image(&im, 0);
-        return nullptr;
-    }
-    return im;
+// HEIF files open with a file-type box naming one of these brands.
+bool is_heif(const uint8_t *data, size_t size) {
+    if (!starts_with(data, size, 4, "ftyp")) return false;
+    for (const char *brand : {"heic", "heix", "hevc", "hevx", "heim", "heis", "mif1", "msf1", "avif", "avis"})
+        if (starts_with(data, size, 8, brand)) return true;
+    return false;
 }
 
-bool write_png(const std::string &path, const Image *im, std::string *error) {
-    png_image png{};
-    png.version = PNG_IMAGE_VERSION;
-    png.width = static_cast<png_uint_32>(im->width);
-    png.height = static_cast<png_uint_32>(im->height);
-    const void *rows = im->bits;
-    png_int_32 stride = static_cast<png_int_32>(im->pitch);
-    std::vector<uint8_t> converted;
-    if (im->bitCount == 8) {
-        png.format = PNG_FORMAT_GRAY;
-    } else if (im->bitCount == 24) {
-        png.format = PNG_FORMAT_BGR;
-    } else {
-        png.format = PNG_FORMAT_BGRA;
-        if (im->bitCount != 32) {
-            converted.resize(static_cast<size_t>(im->width) * 4 * im->height);
-            for (int32_t y = 0; y < im->height; ++y)
-                read_bgra(im, y, converted.data() + static_cast<size_t>(y) * im->width * 4);
-            for (size_t i = 3; i < converted.size(); i += 4)
-                converted[i] = 255;
-            rows = converted.data();
-            stride = im->width * 4;
-        }
-    }
-    File f(std::fopen(path.c_str(), "wb"));
-    if (!f) {
-        *error = path + ": cannot open for writing";
-        return false;
-    }
-    if (!png_image_write_to_stdio(&png, f.get(), 0, rows, stride, nullptr)) {
-        *error = path + ": " + png.message;
-        return false;
-    }
-    return true;
-}
+using Decoder = bool (*)(const uint8_t *, size_t, uint64_t, Decoded *, std::string *);
 
-struct JpegError {
-    jpeg_error_mgr mgr;
-    std::jmp_buf jump;
-    char message[JMSG_LENGTH_MAX];
-};
-
-void jpeg_fail(j_common_ptr info) {
-    auto *err = reinterpret_cast<JpegError *>(info->err);
-    (*info->err->format_message)(info, err->message);
-    std::longjmp(err->jump, 1);
-}
-
-Image *read_jpeg(const std::string &path, std::string *error) {
-    File f(std::fopen(path.c_str(), "rb"));
-    if (!f) {
-        *error = path + ": cannot open";
-        return nullptr;
-    }
-    jpeg_decompress_struct info{};
-    JpegError err{};
-    info.err = jpeg_std_error(&err.mgr);
-    err.mgr.error_exit = jpeg_fail;
-    Image *im = nullptr;
-    std::vector<uint8_t> line;
-    if (setjmp(err.jump)) {
-        *error = path + ": " + err.message;
-        jpeg_destroy_decompress(&info);
-        free_Image(&im, 0);
-        return nullptr;
-    }
-    jpeg_create_decompress(&info);
-    jpeg_stdio_src(&info, f.get());
-    jpeg_read_header(&info, TRUE);
-    info.out_color_space = JCS_RGB;
-    jpeg_start_decompress(&info);
-    im = malloc_Image(static_cast<int32_t>(info.output_width), static_cast<int32_t>(info.output_height), 24);
-    if (im == nullptr) {
-        *error = path + ": picture too large";
-        jpeg_destroy_decompress(&info);
-        return nullptr;
-    }
-    line.resize(static_cast<size_t>(info.output_width) * 3);
-    while (info.output_scanline < info.output_height) {
-        const int32_t y = static_cast<int32_t>(info.output_scanline);
-        JSAMPROW p = line.data();
-        jpeg_read_scanlines(&info, &p, 1);
-        uint8_t *out = row(im, y);
-        for (size_t x = 0; x < info.output_width; ++x) {
-            out[3 * x] = line[3 * x + 2];
-            out[3 * x + 1] = line[3 * x + 1];
-            out[3 * x + 2] = line[3 * x];
-        }
-    }
-    jpeg_finish_decompress(&info);
-    jpeg_destroy_decompress(&info);
-    return im;
-}
-
-bool write_jpeg(const std::string &path, const Image *im, std::string *error) {
-    File f(std::fopen(path.c_str(), "wb"));
-    if (!f) {
-        *error = path + ": cannot open for writing";
-        return false;
-    }
-    jpeg_compress_struct info{};
-    JpegError err{};
-    info.err = jpeg_std_error(&err.mgr);
-    err.mgr.error_exit = jpeg_fail;
-    std::vector<uint8_t> line(static_cast<size_t>(im->width) * 4);
-    std::vector<uint8_t> rgb(static_cast<size_t>(im->width) * 3);
-    if (setjmp(err.jump)) {
-        *error = path + ": " + err.message;
-        jpeg_destroy_compress(&info);
-        return false;
-    }
-    jpeg_create_compress(&info);
-    jpeg_stdio_dest(&info, f.get());
-    info.image_width = static_cast<JDIMENSION>(im->width);
-    info.image_height = static_cast<JDIMENSION>(im->height);
-    info.input_components = 3;
-    info.in_color_space = JCS_RGB;
-    jpeg_set_defaults(&info);
-    jpeg_set_quality(&info, 92, TRUE);
-    jpeg_start_compress(&info, TRUE);
-    for (int32_t y = 0; y < im->height; ++y) {
-        read_bgra(im, y, line.data());
-        for (int32_t x = 0; x < im->width; ++x) {
-            rgb[3 * x] = line[4 * x + 2];
-            rgb[3 * x + 1] = line[4 * x + 1];
-            rgb[3 * x + 2] = line[4 * x];
-        }
-        JSAMPROW p = rgb.data();
-        jpeg_write_scanlines(&info, &p, 1);
-    }
-    jpeg_finish_compress(&info);
-    jpeg_destroy_compress(&info);
-    return true;
-}
-
-uint32_t le32(const uint8_t *p) { return p[0] | p[1] << 8 | p[2] << 16 | static_cast<uint32_t>(p[3]) << 24; }
-
-// Uncompressed 8-, 24- and 32-bit BMP files, bottom-up or top-down.
-Image *read_bmp(const std::string &path, std::string *error) {
-    int32_t size = 0;
-    unsigned char *file = PX_ReadMemFile(path.c_str(), &size);
-    if (file == nullptr) {
-        *error = path + ": cannot read";
-        return nullptr;
-    }
-    std::unique_ptr<unsigned char, void (*)(void *)> owner(file, PX_ReleaseMemFile);
-    if (size < 54 || file[0] != 'B' || file[1] != 'M') {
-        *error = path + ": not a BMP file";
-        return nullptr;
-    }
-    const uint32_t offset = le32(file + 10);
-    const int32_t width = static_cast<int32_t>(le32(file + 18));
-    const int32_t rawHeight = static_cast<int32_t>(le32(file + 22));
-    const uint32_t bits = file[28] | file[29] << 8;
-    const uint32_t compression = le32(file + 30);
-    if ((bits != 8 && bits != 24 && bits != 32) || (compression != 0 && compression != 3) || width <= 0 ||
-        rawHeight == 0 || rawHeight == INT32_MIN) {
-        *error = path + ": unsupported BMP layout";
-        return nullptr;
-    }
-    const int32_t height = rawHeight < 0 ? -rawHeight : rawHeight;
-    Image *im = malloc_Image(width, height, static_cast<int32_t>(bits));
-    if (im == nullptr) {
-        *error = path + ": picture too large";
-        return nullptr;
-    }
-    const uint64_t need = static_cast<uint64_t>(offset) + static_cast<uint64_t>(im->pitch) * height;
-    if (need > static_cast<uint64_t>(size)) {
-        free_Image(&im, 0);
-        *error = path + ": truncated BMP file";
-        return nullptr;
-    }
-    for (int32_t y = 0; y < height; ++y) {
-        const int32_t src = rawHeight > 0 ? height - 1 - y : y;
-        std::memcpy(row(im, y), file + offset + static_cast<size_t>(src) * im->pitch, im->pitch);
-    }
-    return im;
-}
-
-// BMP files show their first row at the bottom; write a flipped copy so the
-// picture stands upright.
-bool write_bmp(const std::string &path, const Image *im, std::string *error) {
-    Image *flipped = malloc_Image(im->width, im->height, static_cast<int32_t>(im->bitCount));
-    if (flipped == nullptr) {
-        *error = "out of memory";
-        return false;
-    }
-    for (int32_t y = 0; y < im->height; ++y)
-        std::memcpy(row(flipped, y), row(im, im->height - 1 - y), im->pitch);
-    const bool ok = saveBmp(path.c_str(), flipped) == 1;
-    free_Image(&flipped, 0);
-    if (!ok) *error = path + ": cannot write";
-    return ok;
+Decoder decoder_for(const uint8_t *data, size_t size, const char **format) {
+    const uint8_t png[8] = {0x89, 'P', 'N', 'G', '\r', '\n', 0x1A, '\n'};
+    if (size >= 8 && std::memcmp(data, png, 8) == 0) return *format = "PNG", decode_png;
+    if (size >= 3 && data[0] == 0xFF && data[1] == 0xD8 && data[2] == 0xFF) return *format = "JPEG", decode_jpeg;
+    if (starts_with(data, size, 0, "BM")) return *format = "BMP", decode_bmp;
+    if (starts_with(data, size, 0, "RIFF") && starts_with(data, size, 8, "WEBP")) return *format = "WebP", decode_webp;
+    if (is_heif(data, size)) return *format = "HEIF", decode_heif;
+    return nullptr;
 }
 
 } // namespace
 
-Image *read_image(const std::string &path, std::string *error) {
-    unsigned char magic[8] = {};
-    {
-        File f(std::fopen(path.c_str(), "rb"));
-        if (!f) {
-            *error = path + ": cannot open";
-            return nullptr;
-        }
-        if (std::fread(magic, 1, sizeof magic, f.get()) < 2) {
-            *error = path + ": not a picture";
-            return nullptr;
-        }
+bool size_allowed(uint64_t w, uint64_t h, uint64_t maxPixels, std::string *error) {
+    if (w == 0 || h == 0) {
+        *error = "picture without pixels";
+        return false;
     }
-    if (magic[0] == 0x89 && magic[1] == 'P' && magic[2] == 'N' && magic[3] == 'G') return read_png(path, error);
-    if (magic[0] == 0xFF && magic[1] == 0xD8) return read_jpeg(path, error);
-    if (magic[0] == 'B' && magic[1] == 'M') return read_bmp(path, error);
-    *error = path + ": not a PNG, JPEG or BMP file";
-    return nullptr;
+    if (w > maxPixels || h > maxPixels / w) {
+        *error = "picture of " + std::to_string(w) + " x " + std::to_string(h) + " pixels is above the limit of " +
+                 std::to_string(maxPixels) + " pixels (--max-pixels)";
+        return false;
+    }
+    return true;
+}
+
+ImagePtr new_picture(uint32_t w, uint32_t h, bool alpha, std::string *error) {
+    ImagePtr im;
+    if (w <= static_cast<uint32_t>(INT32_MAX) && h <= static_cast<uint32_t>(INT32_MAX))
+        im.reset(malloc_Image(static_cast<int32_t>(w), static_cast<int32_t>(h), alpha ? 32 : 24));
+    if (!im) *error = "picture too large for memory";
+    return im;
+}
+
+void bgra_row(const Image *im, int32_t y, uint8_t *out, bool keepAlpha, const uint32_t *background) {
+    const bool alpha = im->bitCount == 32;
+    for (int32_t x = 0; x < im->width; ++x, out += 4) {
+        const uint32_t c = GetPixelColor(im, x, y);
+        const uint32_t a = alpha ? c >> 24 : 255;
+        for (int i = 0; i < 3; ++i) {
+            uint32_t v = (c >> (8 * i)) & 255;
+            if (background != nullptr && a != 255)
+                v = (v * a + ((*background >> (8 * i)) & 255) * (255 - a) + 127) / 255;
+            out[i] = static_cast<uint8_t>(v);
+        }
+        out[3] = static_cast<uint8_t>(keepAlpha && background == nullptr ? a : 255);
+    }
+}
+
+std::vector<uint8_t> exif_from_tiff(const uint8_t *tiff, size_t size) {
+    static const uint8_t header[kExifHeader] = {'E', 'x', 'i', 'f', 0, 0};
+    if (size >= kExifHeader && std::memcmp(tiff, header, kExifHeader) == 0) return {tiff, tiff + size};
+    std::vector<uint8_t> exif(header, header + kExifHeader);
+    exif.insert(exif.end(), tiff, tiff + size);
+    return exif;
+}
+
+bool decode_picture(const uint8_t *data, size_t size, const std::string &name, const ReadOptions &options,
+                    Image **image, Metadata *meta, std::string *error) {
+    const char *format = "";
+    const Decoder decode = decoder_for(data, size, &format);
+    if (decode == nullptr) {
+        *error = name + ": not a PNG, JPEG, BMP, WebP or HEIF file";
+        return false;
+    }
+    Decoded d;
+    if (!decode(data, size, options.maxPixels, &d, error)) {
+        *error = name + ": " + format + ": " + *error;
+        return false;
+    }
+    // Colour: the pixels go to sRGB unless the profile is to be kept with
+    // them; a profile that is not an RGB one, or sRGB itself, is dropped.
+    const ProfileKind kind = profile_kind(d.meta.icc);
+    if (kind == ProfileKind::Rgb && !options.keepProfile && convert_to_srgb(d.image.get(), d.meta.icc))
+        d.meta.icc.clear();
+    if (kind != ProfileKind::Rgb) d.meta.icc.clear();
+    const int orientation = take_orientation(&d.meta.exif);
+    if (orientation != 1 && !d.upright) {
+        ImagePtr upright = orient(d.image.get(), orientation, error);
+        if (!upright) {
+            *error = name + ": " + *error;
+            return false;
+        }
+        d.image = std::move(upright);
+    }
+    *image = d.image.release();
+    if (meta != nullptr) *meta = std::move(d.meta);
+    return true;
+}
+
+bool read_picture(const std::string &path, const ReadOptions &options, Image **image, Metadata *meta,
+                  std::string *error) {
+    std::ifstream in(path, std::ios::binary);
+    if (!in) {
+        *error = path + ": cannot open";
+        return false;
+    }
+    const std::vector<uint8_t> data{std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+    if (in.bad()) {
+        *error = path + ": cannot read";
+        return false;
+    }
+    return decode_picture(data.data(), data.size(), path, options, image, meta, error);
+}
+
+Image *read_image(const std::string &path, std::string *error) {
+    Image *im = nullptr;
+    return read_picture(path, ReadOptions{}, &im, nullptr, error) ? im : nullptr;
 }
 
 bool known_output(const std::string &path) {
     const std::string ext = lower_extension(path);
-    return ext == "png" || ext == "jpg" || ext == "jpeg" || ext == "bmp";
+    return ext == "png" || ext == "jpg" || ext == "jpeg" || ext == "bmp" || ext == "webp";
 }
 
-bool write_image(const std::string &path, const Image *image, std::string *error) {
-    if (image == nullptr || image->bits == nullptr) {
+bool write_picture(const std::string &path, const Image *image, const Metadata &meta, const WriteOptions &options,
+                   std::string *error) {
+    if (image == nullptr || image->bits == nullptr || image->width <= 0 || image->height <= 0) {
         *error = "no picture to write";
         return false;
     }
     const std::string ext = lower_extension(path);
-    if (ext == "png") return write_png(path, image, error);
-    if (ext == "jpg" || ext == "jpeg") return write_jpeg(path, image, error);
-    if (ext == "bmp") return write_bmp(path, image, error);
-    *error = path + ": unknown output type (use .png, .jpg or .bmp)";
-    return false;
+    if (!known_output(path)) {
+        *error = path + ": unknown output type (use .png, .jpg, .webp or .bmp)";
+        return false;
+    }
+    bool ok = false;
+    if (ext == "bmp") {
+        ok = encode_bmp(path, image, error);
+    } else {
+        File f(std::fopen(path.c_str(), "wb"));
+        if (!f) {
+            *error = path + ": cannot open for writing";
+            return false;
+        }
+        if (ext == "png")
+            ok = encode_png(f.get(), image, meta, options, error);
+        else if (ext == "webp")
+            ok = encode_webp(f.get(), image, meta, options, error);
+        else
+            ok = encode_jpeg(f.get(), image, meta, options, error);
+        ok = std::fclose(f.release()) == 0 && ok;
+    }
+    if (!ok) {
+        std::remove(path.c_str());
+        *error = path + ": " + (error->empty() ? "cannot write" : *error);
+    }
+    return ok;
+}
+
+bool write_image(const std::string &path, const Image *image, std::string *error) {
+    return write_picture(path, image, Metadata{}, WriteOptions{}, error);
+}
+
+bool parse_colour(const std::string &text, uint32_t *rgb) {
+    if (text == "white") return *rgb = 0xFFFFFF, true;
+    if (text == "black") return *rgb = 0x000000, true;
+    if (text == "gray" || text == "grey") return *rgb = 0x808080, true;
+    const std::string hex = !text.empty() && text[0] == '#' ? text.substr(1) : text;
+    if (hex.size() != 6 || hex.find_first_not_of("0123456789abcdefABCDEF") != std::string::npos) return false;
+    *rgb = static_cast<uint32_t>(std::stoul(hex, nullptr, 16));
+    return true;
 }
 
 } // namespace pxio

@@ -4,6 +4,7 @@
 
 #include <atomic>
 #include <chrono>
+#include <cstdint>
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
@@ -26,10 +27,19 @@ constexpr int kOk = 0, kFailed = 1, kUsage = 2;
 const char *kUsageText = "usage:\n"
                          "  pxfx list                                   every operation and its parameters\n"
                          "  pxfx help OPERATION                         one operation\n"
-                         "  pxfx apply OPERATION [--PARAM VALUE ...] IN OUT\n"
-                         "  pxfx apply OPERATION [--PARAM VALUE ...] IN... -o DIR [-j N] [--ext png|jpg|bmp]\n"
+                         "  pxfx apply OPERATION [--PARAM VALUE ...] [PICTURE OPTIONS] IN OUT\n"
+                         "  pxfx apply OPERATION [--PARAM VALUE ...] [PICTURE OPTIONS] IN... -o DIR [-j N]\n"
+                         "             [--ext png|jpg|webp|bmp]\n"
                          "  pxfx gallery [PHOTO] -o DIR                 every operation on one photo, as HTML\n"
-                         "Pictures are read from PNG, JPEG or BMP; the output type follows the extension.\n";
+                         "Pictures are read from PNG, JPEG, BMP, WebP or HEIF, turned upright and converted\n"
+                         "to sRGB; the output type follows the extension (PNG, JPEG, WebP or BMP).\n"
+                         "Picture options:\n"
+                         "  --quality N        JPEG and WebP quality, 1..100 (default 92)\n"
+                         "  --compression N    PNG compression, 0..9 (default 1, fast)\n"
+                         "  --background C     colour under transparent pixels in JPEG output, #RRGGBB (white)\n"
+                         "  --max-pixels N     refuse larger inputs (default 268435456)\n"
+                         "  --keep-profile     keep the input's colour profile instead of converting to sRGB\n"
+                         "  --strip            write no EXIF and no colour profile\n";
 
 std::string describe_formats(uint32_t f) {
     std::string s;
@@ -98,13 +108,54 @@ struct Job {
     std::string outputDir; // batch mode
     std::string ext = "png";
     unsigned threads = 1;
+    pxio::ReadOptions reading;
+    pxio::WriteOptions writing;
 };
+
+// Parses a whole number in lo..hi; false when the text is not one.
+bool parse_whole(const std::string &text, long long lo, long long hi, long long *out) {
+    char *end = nullptr;
+    const long long v = std::strtoll(text.c_str(), &end, 10);
+    if (text.empty() || *end != '\0' || v < lo || v > hi) return false;
+    *out = v;
+    return true;
+}
+
+// Takes a picture option at argv[i] (and its value); 0 when it is none, 1 when
+// taken, 2 after printing a usage error.
+int picture_option(Job &job, int argc, char **argv, int &i) {
+    const std::string a = argv[i];
+    if (a == "--strip") return job.writing.strip = true, 1;
+    if (a == "--keep-profile") return job.reading.keepProfile = true, 1;
+    if (a != "--quality" && a != "--compression" && a != "--background" && a != "--max-pixels") return 0;
+    if (i + 1 >= argc) {
+        std::fprintf(stderr, "pxfx: %s needs a value\n", a.c_str());
+        return 2;
+    }
+    const std::string v = argv[++i];
+    long long n = 0;
+    bool ok = true;
+    if (a == "--quality")
+        ok = parse_whole(v, 1, 100, &n), job.writing.quality = static_cast<int>(n);
+    else if (a == "--compression")
+        ok = parse_whole(v, 0, 9, &n), job.writing.compression = static_cast<int>(n);
+    else if (a == "--max-pixels")
+        ok = parse_whole(v, 1, INT64_MAX, &n), job.reading.maxPixels = static_cast<uint64_t>(n);
+    else
+        ok = pxio::parse_colour(v, &job.writing.background);
+    if (!ok) {
+        std::fprintf(stderr, "pxfx: %s: invalid value '%s' (see 'pxfx help')\n", a.c_str(), v.c_str());
+        return 2;
+    }
+    return 1;
+}
 
 // Reads, converts, runs and writes one picture; the output appears only when
 // complete (written under a temporary name, then renamed).
 bool process(const Job &job, const std::string &in, const std::string &out, std::string *error) {
-    Image *src = pxio::read_image(in, error);
-    if (src == nullptr) return false;
+    Image *src = nullptr;
+    pxio::Metadata meta;
+    if (!pxio::read_picture(in, job.reading, &src, &meta, error)) return false;
     Image *ready = pxop::convert_for(*job.op, src);
     free_Image(&src, 0);
     if (ready == nullptr) {
@@ -121,7 +172,7 @@ bool process(const Job &job, const std::string &in, const std::string &out, std:
     const fs::path temp =
         target.parent_path() / (".pxfx-" + std::to_string(getpid()) + "-" +
                                 std::to_string(std::hash<std::string>{}(out)) + "-" + target.filename().string());
-    const bool written = pxio::write_image(temp.string(), result, error);
+    const bool written = pxio::write_picture(temp.string(), result, meta, job.writing, error);
     free_Image(&result, 0);
     std::error_code ec;
     if (!written) {
@@ -209,9 +260,11 @@ int cmd_apply(int argc, char **argv) {
         } else if (a == "--ext") {
             job.ext = argv[++i];
             if (!pxio::known_output("x." + job.ext)) {
-                std::fprintf(stderr, "pxfx: --ext takes png, jpg or bmp\n");
+                std::fprintf(stderr, "pxfx: --ext takes png, jpg, webp or bmp\n");
                 return kUsage;
             }
+        } else if (const int taken = picture_option(job, argc, argv, i); taken != 0) {
+            if (taken == 2) return kUsage;
         } else if (a.rfind("--", 0) == 0) {
             size_t k = 0;
             while (k < job.op->params.size() && job.op->params[k].name != a.substr(2))
@@ -237,7 +290,7 @@ int cmd_apply(int argc, char **argv) {
         job.output = job.inputs.back();
         job.inputs.pop_back();
         if (!pxio::known_output(job.output)) {
-            std::fprintf(stderr, "pxfx: %s: unknown output type (use .png, .jpg or .bmp)\n", job.output.c_str());
+            std::fprintf(stderr, "pxfx: %s: unknown output type (use .png, .jpg, .webp or .bmp)\n", job.output.c_str());
             return kUsage;
         }
         std::string error;

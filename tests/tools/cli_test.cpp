@@ -69,6 +69,19 @@ TEST_F(Cli, FormatsAndBatches) {
     Owned png(pxio::read_image(p("a.png"), &error));
     EXPECT_EQ(diff(bmp.get(), png.get()), "");
 
+    // Pictures from a phone: turned upright, written in each output format
+    // with the picture options.
+    const std::string sideways = (fs::path(PXFX_TEST_DATA_DIR) / "pictures" / "orientation-6.jpg").string();
+    for (const char *out : {"up.png", "up.webp", "up.jpg", "up.bmp"}) {
+        ASSERT_EQ(run("apply negative --quality 80 --compression 9 --strip --keep-profile --background '#102030' " +
+                      sideways + " " + p(out)),
+                  0)
+            << out;
+        Owned up(pxio::read_image(p(out), &error));
+        ASSERT_TRUE(up) << error;
+        EXPECT_EQ(up->width, 48) << out;
+    }
+
     EXPECT_EQ(run("apply neon " + p("colour.png") + " " + p("alpha.png") + " -o " + p("batch") + " -j 2"), 0);
     EXPECT_TRUE(fs::exists(p("batch/colour-neon.png")));
     EXPECT_TRUE(fs::exists(p("batch/alpha-neon.png")));
@@ -84,6 +97,10 @@ TEST_F(Cli, ErrorsExitNonZeroAndLeaveNoOutput) {
     EXPECT_EQ(run("apply sketch " + p("colour.png")), 2);
     EXPECT_EQ(run("apply sketch --no-such-param 3 " + p("colour.png") + " " + out), 2);
     EXPECT_EQ(run("apply sketch " + p("colour.png") + " " + p("no-dir/x.png")), 1);
+    for (const char *bad : {"--quality 0", "--quality 101", "--compression 10", "--background nope", "--max-pixels 0",
+                            "--max-pixels x", "--quality"})
+        EXPECT_EQ(run("apply sketch " + std::string(bad) + " " + p("colour.png") + " " + out), 2) << bad;
+    EXPECT_EQ(run("apply sketch --max-pixels 14399 " + p("colour.png") + " " + out), 1);
     EXPECT_EQ(run("frobnicate"), 2);
     EXPECT_EQ(run(""), 2);
     EXPECT_EQ(run("--help"), 0);
