@@ -195,16 +195,35 @@ bool smooth_in_place(Image *image, int32_t size, int32_t offset) {
 namespace pxfx {
 
 int32_t box_filter(Image *image, int32_t size, int32_t offset, bool runningSums) {
-    if (!has_pixels(image) || image->bitCount < 8 || size <= 0 || size > kMaxBoxSize) return 0;
+    if (!has_pixels(image) || image->bitCount < 8 || size == 0 || size < -kMaxBoxSize || size > kMaxBoxSize) return 0;
+    // The result is made in a new white image and copied back with
+    // PX_Img_Copy: the whole block, padding bytes (255) included, when the
+    // image has the new image's pitch; otherwise pixel by pixel, a 32-bit
+    // image keeping its own alpha. Smoothing in place gives the same only in
+    // the first case.
     const bool direct = image->bitCount == 8 || image->bitCount == 24 || image->bitCount == 32;
-    if (runningSums && direct && smooth_in_place(image, size, offset)) return 1;
+    const bool wholeBlock = direct && image->pitch == fresh_pitch(image->width, image->bitCount);
+    if (size > 0 && runningSums && wholeBlock && smooth_in_place(image, size, offset)) {
+        const size_t used = static_cast<size_t>(image->width) * (image->bitCount / 8);
+        for (int32_t y = 0; y < image->height; ++y)
+            std::memset(row_ptr(image, y) + used, 255, image->pitch - used);
+        return 1;
+    }
     ImagePtr work = make_image(image->width, image->height, static_cast<int32_t>(image->bitCount));
     if (!work) return 0;
-    switch (image->bitCount) {
-    case 8: smooth_any<1>(image, work.get(), size, offset, runningSums); break;
-    case 24: smooth_any<3>(image, work.get(), size, offset, runningSums); break;
-    case 32: smooth_any<4>(image, work.get(), size, offset, runningSums); break;
-    default: break; // the working image stays white
+    if (size < 0 && direct) {
+        // A negative size makes every box empty: each channel is its sum 0
+        // divided by size^2, plus the offset, clamped.
+        const uint8_t flat = static_cast<uint8_t>(std::clamp(offset, 0, 255));
+        for (int32_t y = 0; y < image->height; ++y)
+            std::memset(row_ptr(work.get(), y), flat, static_cast<size_t>(image->width) * (image->bitCount / 8));
+    } else if (size > 0) {
+        switch (image->bitCount) {
+        case 8: smooth_any<1>(image, work.get(), size, offset, runningSums); break;
+        case 24: smooth_any<3>(image, work.get(), size, offset, runningSums); break;
+        case 32: smooth_any<4>(image, work.get(), size, offset, runningSums); break;
+        default: break; // the working image stays white
+        }
     }
     PX_Img_Copy(image, work.get());
     return 1;
@@ -217,7 +236,7 @@ extern "C" {
 int32_t Filter_fast(Image *image, int32_t size, int32_t offset) { return box_filter(image, size, offset, true); }
 
 int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength) {
-    if (!has_pixels(src)) return 0;
+    if (src == nullptr || src->bits == nullptr || !rows_inside(src)) return 0;
     Image *target = const_cast<Image *>(src);
     bool made = false;
     if (out != nullptr) {
@@ -225,16 +244,15 @@ int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength) {
             *out = malloc_Image(src->width, src->height, static_cast<int32_t>(src->bitCount));
             if (*out == nullptr) return 0;
             made = true;
-        } else if (!has_pixels(*out)) {
-            return 0;
         }
         target = *out;
         PX_Img_Copy(target, src);
     }
     const int32_t size = strength <= 3 ? 0 : std::min(strength, 100) / 10;
-    // Sizes of 0 and pictures below 8 bits are left as they are; any other
-    // refusal of the box filter is its working image failing.
-    if (size == 0 || target->bitCount < 8 || Filter_fast(target, size, 0) == 1) return 1;
+    // What the box filter refuses (a size of 0, a target without pixels or
+    // below 8 bits) is left as it is; a picture it takes fails only when its
+    // working image cannot be made.
+    if (size == 0 || !has_pixels(target) || target->bitCount < 8 || Filter_fast(target, size, 0) == 1) return 1;
     if (made) free_Image(out, 0);
     return 0;
 }

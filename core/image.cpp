@@ -42,8 +42,8 @@ extern "C" {
 
 Image *malloc_Image(int32_t width, int32_t height, int32_t bitCount) {
     if (width <= 0 || height <= 0) return nullptr;
-    const uint32_t stored = (bitCount == 16 || bitCount == 24 || bitCount == 32) ? static_cast<uint32_t>(bitCount) : 8;
-    const uint64_t pitch = ((static_cast<uint64_t>(width) * stored + 31) / 32) * 4;
+    const uint32_t stored = stored_bit_count(bitCount);
+    const uint64_t pitch = fresh_pitch(width, bitCount);
     const uint64_t bytes = pitch * static_cast<uint64_t>(height);
     if (bytes > kMaxBlockBytes) return nullptr;
 

@@ -30,15 +30,14 @@ ChannelTables light_tables(uint32_t percent, uint32_t channel) {
     return t;
 }
 
-// trunc((v - 128) * f + 128.0) clamped to 0..255, f = (contrast + 100) / 100.
-// f and the product are single precision; the literal 128.0 makes the sum a
-// double, which decides products just below a whole number (60 * 1.05f =
-// 62.9999962 gives 190, where a single-precision sum would round to 191).
+// trunc((v - 128) * f + 128) clamped to 0..255, f = (contrast + 100) / 100,
+// all in single precision: the sum rounds products just below a whole number
+// up (60 * 1.05f = 62.9999962, plus 128 gives 191).
 void contrast_table(int32_t contrast, uint8_t *t) {
-    const float f = static_cast<float>(static_cast<float>(static_cast<int64_t>(contrast) + 100) / 100.0);
+    const float f = static_cast<float>(static_cast<int64_t>(contrast) + 100) / 100.0f;
     for (int32_t i = 0; i < 256; ++i) {
-        const double v = static_cast<double>(static_cast<float>(i - 128) * f) + 128.0;
-        t[i] = v >= 255.0 ? 255 : (v < 0.0 ? 0 : static_cast<uint8_t>(v));
+        const float v = static_cast<float>(i - 128) * f + 128.0f;
+        t[i] = v >= 255.0f ? 255 : (v < 0.0f ? 0 : static_cast<uint8_t>(v));
     }
 }
 

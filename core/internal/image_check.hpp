@@ -33,6 +33,15 @@ constexpr uint64_t min_row_bytes(uint32_t bitCount, int32_t width) {
     }
 }
 
+// The bit count malloc_Image stores for a requested one, and the pitch it
+// gives a row of `width` pixels (width > 0).
+constexpr uint32_t stored_bit_count(int64_t bitCount) {
+    return bitCount == 16 || bitCount == 24 || bitCount == 32 ? static_cast<uint32_t>(bitCount) : 8;
+}
+constexpr uint64_t fresh_pitch(int32_t width, int64_t bitCount) {
+    return ((static_cast<uint64_t>(width) * stored_bit_count(bitCount) + 31) / 32) * 4;
+}
+
 // True when the record's geometry is usable (pixels may still be null).
 // Blocks above kMaxBlockBytes are refused, so for a valid record every pixel
 // count and byte offset fits in 31 bits, on 32-bit targets too.

@@ -132,25 +132,30 @@ PXFX_API int32_t PX_IMG_Emboss1(const Image *src, Image **out);
  * divided by size * size, truncated) of the size x size box from
  * (x - size/2, y - size/2), edges repeated, plus offset, clamped to 0..255.
  * 8-, 24- and 32-bit images; the alpha of 32-bit images is smoothed and offset
- * too. A 16-bit image (or any other bit count of 8 or more) is not smoothed:
- * it receives the untouched white working image, as the filter always did,
- * and the call returns 1. Sums are exact at every size (no 32-bit wrap).
- * The 8-, 24- and 32-bit images are smoothed in place, keeping only the
- * source rows still needed (size / 2 + 2 rows); when that memory cannot be had
- * a whole working image is used instead.
+ * too. The result is that of a new white working image copied back with
+ * PX_Img_Copy: an image with malloc_Image's pitch takes the whole block, so its
+ * row padding becomes 255; one with another pitch takes the pixels only, and a
+ * 32-bit one then keeps its own alpha. A 16-bit image (or any other bit count
+ * of 8 or more) is not smoothed: it receives the untouched white working image,
+ * as the filter always did, and the call returns 1. A negative size makes every
+ * box empty: each channel becomes the offset, clamped. Sums are exact at every
+ * size (no 32-bit wrap). Images with malloc_Image's pitch are smoothed in place,
+ * keeping only the source rows still needed (size / 2 + 2 rows); when that
+ * memory cannot be had a whole working image is used instead.
  * Returns 1 when processed, 0 (image unchanged) when the image is null, has
- * no pixels or fewer than 8 bits, size is 0, negative or above 2^20, or no
- * working memory can be had. */
+ * no pixels (an empty size among them) or fewer than 8 bits, size is 0 or
+ * beyond +-2^20, or no working memory can be had. */
 PXFX_API int32_t Filter_fast(Image *image, int32_t size, int32_t offset);
 /* Box smoothing by a strength: size min(strength, 100) / 10, nothing for a
  * strength of 3 or less (a plain copy). With out null src itself is smoothed;
  * else src is copied into *out (created when null; an existing image is used
- * whatever its size and bit count) and *out smoothed (a picture of fewer
- * than 8 bits is left as it is, as Filter_fast leaves it). Returns 1, or 0
- * when src has no pixels, *out holds a record without pixels, or *out cannot
- * be made; also 0 when the smoothing's working image cannot be made: src is
- * then unchanged, an *out made by the call released (null), an existing *out
- * left holding the plain copy. */
+ * whatever its size and bit count, one without pixels taking nothing) and *out
+ * smoothed (a picture Filter_fast refuses, such as one of fewer than 8 bits or
+ * of an empty size, is left as it is). Returns 1, or 0 when src or its pixel
+ * block is null, its rows overrun its block, or *out cannot be made; also 0
+ * when the smoothing's working
+ * image cannot be made: src is then unchanged, an *out made by the call
+ * released (null), an existing *out left holding the plain copy. */
 PXFX_API int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength);
 
 #ifdef __cplusplus

@@ -76,10 +76,10 @@ PXFX_API uint32_t my(Image *src, Image **dst);
  * percent 0 clears every byte of the result (alpha and padding included). 1 or 0. */
 PXFX_API uint32_t PX_IMG_Light_Alter(Image *src, Image **dst, uint32_t percent, uint32_t channel);
 /* Contrast about mid-gray by a percent through a 256-entry table:
- * trunc((v - 128) * f + 128.0) clamped, f = (contrast + 100) / 100 in single
- * precision (contrast + 100 formed without overflow), the product single and
- * the sum double precision. Contrast 0 copies the pixel block byte for byte
- * (only as many bytes as both blocks hold). 1 or 0. */
+ * trunc((v - 128) * f + 128) clamped, f = (contrast + 100) / 100, all in
+ * single precision (contrast + 100 formed without overflow): contrast 5 takes
+ * 188 to 191, 228 to 233, 248 to 254. Contrast 0 copies the pixel block byte
+ * for byte (only as many bytes as both blocks hold). 1 or 0. */
 PXFX_API uint32_t PX_IMG_Ballance(Image *src, Image **dst, int32_t contrast);
 /* Soft glow: a 1-2-1 Gaussian blur of the source (Filter) taken to half
  * brightness and +5 % contrast as PX_IMG_Light_Alter and PX_IMG_Ballance

@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <climits>
 #include <cmath>
+#include <cstring>
 #include <random>
 #include <vector>
 
@@ -178,9 +179,32 @@ TEST(FilterFast, MatchesFullBoxSumsAndRefusesBadSizesAsDoesSmooth) {
     ASSERT_EQ(Filter_fast(ramp.get(), 4000, 0), 1); // columns -2000..1999: 1999 read 255
     EXPECT_EQ(ramp->bits[0], 255 * 1999 / 4000);
     Owned img = random_image(6, 5, 24, 3), before = clone(img.get());
-    for (int32_t size : {0, -3, INT32_MIN, pxfx::kMaxBoxSize + 1})
+    for (int32_t size : {0, INT32_MIN, pxfx::kMaxBoxSize + 1})
         EXPECT_EQ(Filter_fast(img.get(), size, 0), 0);
     EXPECT_EQ(diff(img.get(), before.get()), "");
+    // A negative size sums empty boxes: every channel is the offset, clamped.
+    ASSERT_EQ(Filter_fast(img.get(), -3, 77), 1);
+    EXPECT_EQ(diff(img.get(), filled(6, 5, 24, 0x4D4D4D).get()), "");
+    // The result is copied back as PX_Img_Copy copies the white working
+    // image: with malloc_Image's pitch the whole block, padding made 255;
+    // with another pitch the pixels only, a 32-bit image keeping its alpha.
+    Owned padded = random_image(5, 3, 24, 4); // pitch 16: one padding byte a row
+    ASSERT_EQ(Filter_fast(padded.get(), 3, 0), 1);
+    for (int32_t y = 0; y < 3; ++y)
+        EXPECT_EQ(padded->bits[16 * y + 15], 255) << y;
+    Owned wide = random_image(4, 3, 32, 5), wideBefore = clone(wide.get());
+    Image loose = *wide; // rows of 16 bytes read as three pixels: a pitch malloc_Image would not give
+    loose.width = 3, loose.pitch = 16;
+    Owned fresh = make(3, 3, 32), smoothed;
+    for (int32_t y = 0; y < 3; ++y)
+        std::memcpy(fresh->bits + 12 * y, wide->bits + 16 * y, 12);
+    smoothed = reference_box(fresh.get(), 2, 9);
+    ASSERT_EQ(Filter_fast(&loose, 2, 9), 1);
+    for (int32_t y = 0; y < 3; ++y)
+        for (int32_t i = 0; i < 16; ++i) {
+            const uint8_t got = wide->bits[16 * y + i], old = wideBefore->bits[16 * y + i];
+            EXPECT_EQ(got, i >= 12 || i % 4 == 3 ? old : smoothed->bits[12 * y + i]) << y << " " << i;
+        }
     // PX_IMG_Smooth: a box of min(strength, 100) / 10, slots and in place.
     Owned src = random_image(9, 8, 32, 5), want = reference_box(src.get(), 10, 0);
     Slot out, gray;
@@ -190,7 +214,8 @@ TEST(FilterFast, MatchesFullBoxSumsAndRefusesBadSizesAsDoesSmooth) {
     EXPECT_EQ(gray.get(), kept);
     ASSERT_EQ(PX_IMG_Smooth(src.get(), nullptr, 150), 1); // in place
     EXPECT_EQ(diff(src.get(), want.get()), "");
-    Image hollow = *src, *hp = &hollow;
+    Image hollow = *src, *hp = &hollow; // an existing result without pixels takes nothing
     hollow.bits = nullptr;
-    EXPECT_EQ(PX_IMG_Smooth(src.get(), &hp, 50), 0);
+    EXPECT_EQ(PX_IMG_Smooth(src.get(), &hp, 50), 1);
+    EXPECT_EQ(hp, &hollow);
 }

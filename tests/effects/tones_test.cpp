@@ -79,7 +79,8 @@ TEST(Tones, HandComputedPixelsInEveryFormat) {
         {light(100, 2), in, in},
         {light(0xFFFFFFFFu, 1), in, rgba(10, 255, 30, 77)}, // no wrap
         {contrast(5), rgba(0, 255, 128, 1), rgba(0, 255, 128, 1)},
-        {contrast(5), rgba(188, 100, 228, 1), rgba(190, 98, 232, 1)}, // 60 * 1.05f = 62.9999962, + 128.0 in double
+        {contrast(5), rgba(188, 100, 228, 1), rgba(191, 98, 233, 1)}, // 60 * 1.05f = 62.9999962, + 128 in float
+        {contrast(5), rgba(248, 127, 129, 1), rgba(254, 126, 129, 1)},
         {contrast(-100), rgba(3, 200, 255, 1), rgba(128, 128, 128, 1)},
     };
     for (const auto &c : cases) {
