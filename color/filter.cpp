@@ -421,7 +421,11 @@ int32_t Filter(Image *src, const int32_t *kernel, int32_t size, int32_t divisor,
     if (!has_pixels(src)) return 0;
     if (size > 0 && (kernel == nullptr || checked_size(static_cast<uint64_t>(size), static_cast<uint64_t>(size)) == 0))
         return 0;
-    if (dst != nullptr) return has_pixels(dst) ? run_filter(src, kernel, size, divisor, offset, mask, dst, gray) : 0;
+    if (dst != nullptr) {
+        // A destination without pixels, or of an empty size, takes nothing.
+        if (!rows_inside(dst)) return 0;
+        return has_pixels(dst) ? run_filter(src, kernel, size, divisor, offset, mask, dst, gray) : 1;
+    }
     ImagePtr work = make_image(src->width, src->height, static_cast<int32_t>(src->bitCount));
     if (!work || run_filter(src, kernel, size, divisor, offset, mask, work.get(), gray) == 0) return 0;
     PX_Img_Copy(src, work.get());

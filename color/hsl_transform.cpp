@@ -61,19 +61,26 @@ template <class F> void transform_rows(const Image *src, Image *dst, const Map *
     }
 }
 
+// An 8-bit plane with a pixel block whose rows it holds; its size may be empty.
+bool shiftable(const Image *plane) {
+    return plane != nullptr && plane->bits != nullptr && plane->bitCount == 8 && rows_inside(plane);
+}
+
 } // namespace
 
 extern "C" {
 
 int32_t BaseTran_Hue(Image *plane, int32_t amount) {
-    if (!is_plane(plane)) return 0;
+    if (!shiftable(plane)) return 0;
+    if (plane->width <= 0 || plane->height <= 0) return 1;
     Map m;
     hue_map(amount, m);
     return map_plane(plane, m);
 }
 
 int32_t BaseTran_LS(Image *plane, int32_t amount) {
-    if (!is_plane(plane)) return 0;
+    if (!shiftable(plane)) return 0;
+    if (plane->width <= 0 || plane->height <= 0) return 1;
     Map m;
     linear_map(amount, m);
     return map_plane(plane, m);
@@ -81,7 +88,6 @@ int32_t BaseTran_LS(Image *plane, int32_t amount) {
 
 int32_t PX_IMG_Transform(const Image *src, Image **out, int32_t amount, int32_t component) {
     if (out == nullptr || !has_pixels(src)) return 0;
-    if (*out != nullptr && !has_pixels(*out)) return 0;
     Map maps[3];
     for (int i = 0; i < 3; ++i)
         for (int v = 0; v < 256; ++v)

@@ -3,6 +3,8 @@
 // walk rows and run the conversion inline, specialised per format and mode.
 #include <pxfx/color.h>
 
+#include <initializer_list>
+
 #include "color/colorspace.hpp"
 #include "core/internal/cpu.hpp"
 #include "core/internal/image_check.hpp"
@@ -49,7 +51,8 @@ struct PlaneRows {
     const Image *im;
     bool direct;
     uint8_t *scratch = nullptr;
-    PlaneRows(const Image *plane, int32_t width) : im(plane), direct(plane->bitCount == 8 && plane->width >= width) {}
+    PlaneRows(const Image *plane, int32_t width)
+        : im(plane), direct(plane->bitCount == 8 && plane->width >= width && has_pixels(plane)) {}
     const uint8_t *row(int32_t y, int32_t width) const {
         if (direct) return row_ptr(im, y < im->height ? y : im->height - 1);
         for (int32_t x = 0; x < width; ++x)
@@ -110,7 +113,9 @@ void combine_any(Image *out, const PlaneRows &r1, const PlaneRows &r2, const Pla
 extern "C" {
 
 int32_t Split(const Image *src, Image **plane1, Image **plane2, Image **plane3, Image **alphaPlane, int32_t mode) {
-    if (!has_pixels(src) || plane1 == nullptr || plane2 == nullptr || plane3 == nullptr) return 0;
+    if (src == nullptr || src->bits == nullptr || !rows_inside(src) || plane1 == nullptr || plane2 == nullptr ||
+        plane3 == nullptr)
+        return 0;
     if (plane1 == plane2 || plane1 == plane3 || plane2 == plane3) return 0;
     if (alphaPlane != nullptr && (alphaPlane == plane1 || alphaPlane == plane2 || alphaPlane == plane3)) return 0;
     const int32_t w = src->width, h = src->height;
@@ -139,8 +144,10 @@ int32_t Split(const Image *src, Image **plane1, Image **plane2, Image **plane3, 
 }
 
 Image *Combine(const Image *plane1, const Image *plane2, const Image *plane3, const Image *alphaPlane, int32_t mode) {
-    if (!has_pixels(plane1) || !has_pixels(plane2) || !has_pixels(plane3)) return nullptr;
-    if (alphaPlane != nullptr && !has_pixels(alphaPlane)) return nullptr;
+    // Planes are read as GetPixelIndex reads them: one without pixels as 0.
+    if (plane1 == nullptr || plane2 == nullptr || plane3 == nullptr) return nullptr;
+    for (const Image *p : {plane1, plane2, plane3, alphaPlane})
+        if (p != nullptr && !rows_inside(p)) return nullptr;
     const int32_t w = plane1->width, h = plane1->height;
     if (plane2->width < w || plane3->width < w || plane2->height < h) return nullptr;
     PlaneRows r1(plane1, w), r2(plane2, w), r3(plane3, w);

@@ -264,35 +264,47 @@ PXPoint WeightedCentroid(const int32_t *points, const double *weights, int32_t c
 }
 
 int32_t DeformationFunc(Image *src, Image *dst, const DeformationPair *pairs, int32_t count) {
-    if (!has_pixels(src) || !has_pixels(dst) || src->width != dst->width || src->height != dst->height || count < 0 ||
-        (count > 0 && pairs == nullptr))
+    if (src == nullptr || dst == nullptr || src->width != dst->width || src->height != dst->height ||
+        (count > 0 && pairs == nullptr) || dst->bits == nullptr || !rows_inside(src) || !rows_inside(dst))
         return 0;
+    // A negative count names no pair: the warp runs without any.
+    if (count < 0) count = 0;
     const int32_t w = src->width, h = src->height;
+    if (w <= 0 || h <= 0) {
+        // No pixel to map: only the background fill of the block claimed,
+        // black since no source pixel can be read.
+        if (h > 0 && block_claim_ok(dst)) std::memset(dst->bits, 0, block_bytes(dst));
+        return 1;
+    }
+    // A source without pixels reads as 0 everywhere.
+    const ReadView view(src);
     int32_t n = 0;
     for (int32_t i = 0; i < count; ++i)
         n += inside(pairs[i], w, h);
     Buffer<ControlPoint> pts = alloc_buffer<ControlPoint>(static_cast<size_t>(n));
     Buffer<double> weights = alloc_buffer<double>(checked_size(static_cast<uint64_t>(n), static_cast<uint64_t>(w)));
     Buffer<uint8_t> mask = alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h)));
-    if (!mask || (n > 0 && (!pts || !weights))) return 0;
+    if (!view.ok() || !mask || (n > 0 && (!pts || !weights))) return 0;
     for (int32_t i = 0, j = 0; i < count; ++i) {
         const DeformationPair &p = pairs[i];
         if (!inside(p, w, h)) continue;
         pts[j++] = {static_cast<int32_t>(p.srcX), static_cast<int32_t>(p.srcY), static_cast<int32_t>(p.dstX),
                     static_cast<int32_t>(p.dstY)};
     }
-    const Warp k{src, dst, w, h, pts.get(), n, weights.get(), mask.get()};
-    with_formats(src, dst, [&](auto s, auto d) { warp<decltype(s), decltype(d)>(k); });
+    const Warp k{view.get(), dst, w, h, pts.get(), n, weights.get(), mask.get()};
+    with_formats(view.get(), dst, [&](auto s, auto d) { warp<decltype(s), decltype(d)>(k); });
     fill_warp_holes(dst, mask.get());
     return 1;
 }
 
 int32_t DeformationImage(Image *src, const DeformationPair *pairs, uint32_t count, Image **dst) {
-    if (src == nullptr || count > static_cast<uint32_t>(INT32_MAX) || (count > 0 && pairs == nullptr)) return 0;
+    // A count above 2^31 - 1 reaches the warp as a negative one: no pair.
+    const int32_t n = count > static_cast<uint32_t>(INT32_MAX) ? -1 : static_cast<int32_t>(count);
+    if (src == nullptr || (n > 0 && pairs == nullptr)) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
     if (!has_pixels(out)) return 1;
-    return DeformationFunc(src, out, pairs, static_cast<int32_t>(count));
+    return DeformationFunc(src, out, pairs, n);
 }
 
 } // extern "C"

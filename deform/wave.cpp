@@ -145,10 +145,13 @@ int32_t create_wave(int16_t *map, int32_t width, int32_t height, int32_t cx, int
 }
 
 int32_t render_wave(Image *src, Image *dst, const int16_t *map, int32_t, int32_t) {
-    if (map == nullptr || !has_pixels(src) || !has_pixels(dst) || src->width != dst->width ||
+    if (map == nullptr || src == nullptr || !rows_inside(src) || !has_pixels(dst) || src->width != dst->width ||
         src->height != dst->height)
         return 1;
-    with_formats(src, dst, [&](auto s, auto d) { render<decltype(s), decltype(d)>(src, dst, map); });
+    // A source without pixels reads as 0 everywhere.
+    const ReadView view(src);
+    if (!view.ok()) return 1;
+    with_formats(view.get(), dst, [&](auto s, auto d) { render<decltype(s), decltype(d)>(view.get(), dst, map); });
     return 1;
 }
 

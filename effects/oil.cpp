@@ -163,7 +163,8 @@ uint32_t imOil_1(Image *src, Image **dst) {
 }
 
 int32_t ColorCompress(Image *plane, int32_t levels) {
-    if (!is_plane(plane) || levels < 1) return 0;
+    if (plane == nullptr || plane->bits == nullptr || plane->bitCount != 8 || !rows_inside(plane) || levels < 1)
+        return 0;
     const int32_t group = 256 / levels + (256 % levels != 0 ? 1 : 0);
     uint32_t count[256] = {};
     for (int32_t y = 0; y < plane->height; ++y) {

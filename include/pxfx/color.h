@@ -46,10 +46,11 @@ PXFX_API uint32_t XYZtoRGB(uint32_t colour);
  * planes of its size (first component, second, third) and, when alphaPlane is
  * not null, an alpha plane. Images already held in the slots are released;
  * the new planes belong to the caller. If the alpha plane cannot be made,
- * *alphaPlane is null and the call still succeeds. Returns 1, or 0 when src is
- * null or has no pixels, when any of the three plane slots is null (a partial
- * set is refused, nothing is touched), when two slots are the same pointer, or
- * when a plane cannot be made (the three slots are then released and null).
+ * *alphaPlane is null and the call still succeeds. Returns 1, or 0 when src or
+ * its pixel block is null or its rows overrun its block, when any of the three
+ * plane slots is null (a partial set is refused, nothing is touched), when two
+ * slots are the same pointer, or when a plane cannot be made (an empty size
+ * among them: the three slots are then released and null).
  * A slot may hold src itself: the old images are released after the split,
  * an image held in two slots once. */
 PXFX_API int32_t Split(const Image *src, Image **plane1, Image **plane2, Image **plane3, Image **alphaPlane,
@@ -58,10 +59,10 @@ PXFX_API int32_t Split(const Image *src, Image **plane1, Image **plane2, Image *
  * plane1's size: 32-bit with an alpha plane, else 24-bit. plane2 and plane3
  * must be at least as wide as plane1 and plane2 at least as high; a lower
  * plane3 and an alpha plane of any size are read with edge clamping. Planes
- * are read as GetPixelIndex does (a plane of more than 8 bits reads as 0).
- * Returns null when a plane is null or has no pixels (the alpha plane too,
- * when given), on the size rules above, or when memory runs out. Caller owns
- * the result. */
+ * are read as GetPixelIndex does (a plane of more than 8 bits, or without a
+ * pixel block, reads as 0). Returns null when one of the three planes is null,
+ * a plane's rows overrun its block, on the size rules above, for an empty
+ * plane1, or when memory runs out. Caller owns the result. */
 PXFX_API Image *Combine(const Image *plane1, const Image *plane2, const Image *plane3, const Image *alphaPlane,
                         int32_t mode);
 
@@ -69,8 +70,9 @@ PXFX_API Image *Combine(const Image *plane1, const Image *plane2, const Image *p
 
 /* Shifts every value of an 8-bit hue plane by (amount * 255 - 25500) / 100
  * (amount 100: none, 0: -255, 200: +255), wrapping by 255 past either end.
- * The step is computed exactly for any amount. 1, or 0 when plane is null,
- * has no pixels or is not 8-bit. */
+ * The step is computed exactly for any amount. 1 (a plane of an empty size has
+ * nothing to shift), or 0 when plane or its pixel block is null, its rows
+ * overrun its block, or it is not 8-bit. */
 PXFX_API int32_t BaseTran_Hue(Image *plane, int32_t amount);
 /* Shifts an 8-bit saturation or lightness plane by the same step, clamped to
  * 0..255. 1 or 0 as BaseTran_Hue. */
@@ -80,9 +82,9 @@ PXFX_API int32_t BaseTran_LS(Image *plane, int32_t amount);
  * HSL, into *out: a 32-bit picture with the source's alpha. An image already
  * in *out receives it through PX_Img_Copy (keeping its size and bit count);
  * with *out null a 32-bit source gets the 32-bit picture itself and other
- * sources a new image of their own bit count. Returns 1, or 0 when src or out
- * is null, src has no pixels, *out holds a record without pixels, or memory
- * runs out (*out is then unchanged). */
+ * sources a new image of their own bit count (a record in *out without pixels
+ * takes nothing). Returns 1, or 0 when src or out is null, src has no pixels
+ * (an empty size among them), or memory runs out (*out is then unchanged). */
 PXFX_API int32_t PX_IMG_Transform(const Image *src, Image **out, int32_t amount, int32_t component);
 
 /* ---- Kernel convolution ------------------------------------------------------ */
@@ -110,8 +112,10 @@ PXFX_API extern const float matrixX[10][21];
  *    alpha when size <= 0 (no taps: every channel is the clamped offset).
  *  - Other result bit counts are not written (in place, a 16-bit src thus
  *    turns white).
- * Returns 1, or 0 when src or a given dst has no pixels, the kernel is null
- * with size > 0, size * size exceeds 2^31 - 1, or memory runs out. */
+ * Returns 1, or 0 when src has no pixels (or an empty size, or rows its block
+ * cannot hold), a given dst's rows overrun its block, the kernel is null with
+ * size > 0, size * size exceeds 2^31 - 1, or memory runs out. A given dst
+ * without a pixel block or of an empty size takes nothing (1). */
 PXFX_API int32_t Filter(Image *src, const int32_t *kernel, int32_t size, int32_t divisor, int32_t offset,
                         const Image *mask, Image *dst, int32_t gray);
 /* 3 x 3 mean into *out (reused when its width, height and bit count match,

@@ -77,24 +77,31 @@ PXFX_API int32_t create_wave(int16_t *map, int32_t width, int32_t height, int32_
 /* Moves each interior pixel by the mean of its neighbours' map values (left and
  * right for x, above and below for y); a displacement leaving the picture
  * leaves the pixel in place; the outer rows and columns are copied. cx and cy
- * are accepted and ignored. Always 1; writes nothing when the map is null,
- * either record lacks pixels, or their widths or heights differ. Records of
- * different bit counts are converted as GetPixelColor / SetPixelColor do. */
+ * are accepted and ignored. Always 1; writes nothing when the map is null, dst
+ * lacks pixels, src's rows overrun its block, or their widths or heights
+ * differ. A source without pixels reads as 0 (every pixel of dst becomes 0).
+ * Records of different bit counts are converted as GetPixelColor /
+ * SetPixelColor do. */
 PXFX_API int32_t render_wave(Image *src, Image *dst, const int16_t *map, int32_t cx, int32_t cy);
 
 /* ---- Free-form warp --------------------------------------------------------------- */
 
 /* Rigid moving-least-squares warp of src by `count` control pairs into *dst. 1 or 0.
  * Refused with 0 and the slot untouched: a null source, pairs null while count
- * is non-zero, a count above 2^31 - 1, a null slot or a source without pixels.
+ * is non-zero (up to 2^31 - 1), a null slot or a source without pixels. A count
+ * above 2^31 - 1 reaches the warp as a negative one: no pair. A result image
+ * without pixels (a reused one, or of an empty size) is drawn into by nothing.
  * After the result rule, DeformationFunc's result is returned: on its failure
  * (working memory) the slot holds the result image unwarped. */
 PXFX_API int32_t DeformationImage(Image *src, const DeformationPair *pairs, uint32_t count, Image **dst);
 /* The warp itself, from src into dst of the same size, with hole filling. 1, or
- * 0 with dst untouched when either record lacks pixels, their sizes differ,
- * count is negative, pairs is null with a positive count, or the working memory
- * (width x height bytes, plus 16 + 8 x width bytes per used pair, each block
- * at most 2^31 - 1 bytes) cannot be had. Bit counts may differ: colours are
+ * 0 with dst untouched when either record is null, their sizes differ, pairs
+ * is null with a positive count, dst has no pixel block, either record's rows
+ * overrun its block, or the working memory (width x height bytes, plus 16 +
+ * 8 x width bytes per used pair, each block at most 2^31 - 1 bytes) cannot be
+ * had. A negative count uses no pair; a source without pixels reads as 0 (the
+ * background is then black); an empty size maps nothing and only clears the
+ * block dst claims to the black background. Bit counts may differ: colours are
  * then converted as GetPixelColor / SetPixelColor do.
  *  - A pair with any coordinate whose truncation falls outside the picture
  *    (NaN and infinities included) is skipped entirely: it marks, copies and

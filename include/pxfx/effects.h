@@ -119,7 +119,9 @@ PXFX_API uint32_t imOil(Image *src, Image **dst, int32_t r);
 PXFX_API uint32_t imOil_1(Image *src, Image **dst);
 /* Quantises an 8-bit plane in place: values fall in groups of ceil(256 / levels)
  * and each maps to its group's most frequent value (the lowest on a tie).
- * 0 for a plane that is null, without pixels or not 8-bit, and for levels < 1. */
+ * 1; 0 for a plane that is null, without a pixel block or not 8-bit, whose rows
+ * overrun its block, and for levels < 1. A plane of an empty size has nothing to
+ * quantise (1). */
 PXFX_API int32_t ColorCompress(Image *plane, int32_t levels);
 
 /* ---- Channel shift with curve tables -------------------------------------------- */

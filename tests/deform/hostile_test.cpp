@@ -18,6 +18,12 @@ Contract<Image> two(const char *name, int64_t (*f)(C &), int64_t failure = 0) {
     return {name, all, f, failure, 2, {}, false, true};
 }
 
+// A source without pixels reads as 0 instead of being refused.
+Contract<Image> accepting_no_pixels(Contract<Image> c) {
+    c.accepts = {"null pixels"};
+    return c;
+}
+
 } // namespace
 
 TEST(Hostile, Deformations) {
@@ -32,9 +38,10 @@ TEST(Hostile, Deformations) {
         {"Bathroom_Transform", all, [](C &c) { return Bathroom_Transform(c.a, c.slot); }},
         {"Wave_Transform", all, [](C &c) { return Wave_Transform(c.a, c.slot, c.p); }},
         warp,
-        two("DeformationFunc", [](C &c) -> int64_t { return DeformationFunc(c.a, c.b, pairs, 4); }),
-        two(
-            "render_wave", [](C &c) -> int64_t { return render_wave(c.a, c.b, wave_map, c.p, c.p); }, kNoResult),
+        accepting_no_pixels(
+            two("DeformationFunc", [](C &c) -> int64_t { return DeformationFunc(c.a, c.b, pairs, 4); })),
+        accepting_no_pixels(two(
+            "render_wave", [](C &c) -> int64_t { return render_wave(c.a, c.b, wave_map, c.p, c.p); }, kNoResult)),
     });
 }
 
@@ -42,11 +49,31 @@ TEST(Hostile, DeformationScalars) {
     auto pic = good<Image>(9, 7, 24, 1);
     const auto before = pic->snapshot();
     Image *slot = nullptr, *p = &pic->record;
-    EXPECT_EQ(DeformationImage(p, nullptr, 2, &slot) + DeformationImage(p, pairs, 0x80000000u, &slot) +
-                  DeformationFunc(p, p, nullptr, 2) + DeformationFunc(p, p, pairs, -1) +
+    EXPECT_EQ(DeformationImage(p, nullptr, 2, &slot) + DeformationFunc(p, p, nullptr, 2) +
                   render_wave(p, p, nullptr, 0, 0),
               1);
     EXPECT_TRUE(slot == nullptr && pic->snapshot() == before);
+    // Counts that name no pair (negative, or above 2^31 - 1 as the warp's
+    // signed count) warp without pairs: every pixel goes to the centroid
+    // (0, 0) of an empty set, the rest is filled from there.
+    Image *none = nullptr;
+    auto twin = good<Image>(9, 7, 24, 3);
+    Image *q = &twin->record;
+    ASSERT_EQ(DeformationImage(p, pairs, 0x80000000u, &slot) + DeformationImage(p, nullptr, 0, &none) +
+                  DeformationFunc(p, q, pairs, -1),
+              3);
+    EXPECT_EQ(pxtest::diff(slot, none), "");
+    EXPECT_EQ(pxtest::diff(q, none), "");
+    free_Image(&slot, 0);
+    free_Image(&none, 0);
+    // A source without pixels reads as 0: black background, black pixels.
+    auto hollow = good<Image>(9, 7, 24, 2);
+    hollow->record.bits = nullptr;
+    ASSERT_EQ(DeformationFunc(&hollow->record, q, pairs, 4), 1);
+    EXPECT_TRUE(std::all_of(twin->block.begin(), twin->block.end(), [](uint8_t v) { return v == 0; }));
+    auto waved = good<Image>(9, 7, 32, 4);
+    ASSERT_EQ(render_wave(&hollow->record, &waved->record, wave_map, 0, 0), 1);
+    EXPECT_TRUE(std::all_of(waved->block.begin(), waved->block.end(), [](uint8_t v) { return v == 0; }));
     const int32_t xy[] = {INT_MAX, INT_MIN};
     const double weights[] = {1e300};
     for (int32_t v : kExtremes) {

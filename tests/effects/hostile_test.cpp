@@ -48,7 +48,11 @@ TEST(Hostile, Effects) {
          .formats = {24, 32},
          .call = [](C &c) { return imOil_1(c.a, c.slot); },
          .falls_back_on_failure = true}, // 1 with an empty slot when the joined image cannot be made
-        {.name = "ColorCompress", .formats = {8}, .call = [](C &c) { return ColorCompress(c.a, c.p); }, .slot = false},
+        {.name = "ColorCompress",
+         .formats = {8},
+         .call = [](C &c) { return ColorCompress(c.a, c.p); },
+         .slot = false,
+         .accepts = {"zero width", "negative height", "INT_MIN width"}},
         effect("PX_IMG_Alter", [](C &c) { return PX_IMG_Alter(c.a, c.slot, c.p, ~c.p, c.p, c.p); }),
     });
 }
