@@ -5,6 +5,7 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
+#include <iterator>
 #include <string>
 
 #include "image_io.hpp"
@@ -101,6 +102,15 @@ TEST_F(Cli, ErrorsExitNonZeroAndLeaveNoOutput) {
                             "--max-pixels x", "--quality"})
         EXPECT_EQ(run("apply sketch " + std::string(bad) + " " + p("colour.png") + " " + out), 2) << bad;
     EXPECT_EQ(run("apply sketch --max-pixels 14399 " + p("colour.png") + " " + out), 1);
+    // Cut files of each format fail the same way, leaving no output.
+    fs::create_directory(p("cut"));
+    for (const char *name : {"orientation-3.jpg", "rle4.bmp", "alpha.webp", "coffee.heic", "rgb16.png"}) {
+        std::ifstream in(fs::path(PXFX_TEST_DATA_DIR) / "pictures" / name, std::ios::binary);
+        const std::string whole{std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+        const fs::path cut = dir / "cut" / name;
+        std::ofstream(cut, std::ios::binary) << whole.substr(0, whole.size() * 2 / 3);
+        EXPECT_EQ(run("apply negative " + cut.string() + " " + out), 1) << name;
+    }
     EXPECT_EQ(run("frobnicate"), 2);
     EXPECT_EQ(run(""), 2);
     EXPECT_EQ(run("--help"), 0);
@@ -108,7 +118,8 @@ TEST_F(Cli, ErrorsExitNonZeroAndLeaveNoOutput) {
     EXPECT_EQ(run("list"), 0);
     for (const auto &entry : fs::directory_iterator(dir)) {
         const std::string name = entry.path().filename().string();
-        EXPECT_TRUE(name == "colour.png" || name == "alpha.png" || name == "colour.bmp" || name == "corrupt.png")
+        EXPECT_TRUE(name == "colour.png" || name == "alpha.png" || name == "colour.bmp" || name == "corrupt.png" ||
+                    name == "cut")
             << "left behind: " << name;
     }
 }
