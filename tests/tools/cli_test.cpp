@@ -11,19 +11,17 @@
 #include "image_io.hpp"
 #include "operations.hpp"
 #include "support/test_images.hpp"
+#include "tools/temp_dir.hpp"
 
 namespace fs = std::filesystem;
 using namespace pxtest;
 
 namespace {
 
-class Cli : public ::testing::Test {
+class Cli : public InTempDir {
   protected:
-    fs::path dir;
     void SetUp() override {
-        char tmpl[] = "/tmp/pxfx_cli_XXXXXX";
-        ASSERT_NE(mkdtemp(tmpl), nullptr);
-        dir = tmpl;
+        InTempDir::SetUp();
         std::string error;
         Owned colour = random_image(160, 90, 24, 1);
         Owned alpha = random_image(131, 47, 32, 2);
@@ -31,7 +29,6 @@ class Cli : public ::testing::Test {
         ASSERT_TRUE(pxio::write_image((dir / "alpha.png").string(), alpha.get(), &error)) << error;
         ASSERT_TRUE(pxio::write_image((dir / "colour.bmp").string(), colour.get(), &error)) << error;
     }
-    void TearDown() override { fs::remove_all(dir); }
     static int run(const std::string &args) {
         const int status = std::system((std::string(PXFX_CLI) + " " + args + " >/dev/null 2>&1").c_str());
         return WIFEXITED(status) ? WEXITSTATUS(status) : -1;

@@ -18,6 +18,7 @@
 
 #include "image_io.hpp"
 #include "support/test_images.hpp"
+#include "tools/temp_dir.hpp"
 
 namespace fs = std::filesystem;
 using namespace pxtest;
@@ -66,16 +67,7 @@ std::pair<std::string, int> make_and_orientation(const std::vector<uint8_t> &exi
     return {make, orientation};
 }
 
-class PictureFiles : public ::testing::Test {
-  protected:
-    fs::path dir;
-    void SetUp() override {
-        char tmpl[] = "/tmp/pxfx_pictures_XXXXXX";
-        ASSERT_NE(mkdtemp(tmpl), nullptr);
-        dir = tmpl;
-    }
-    void TearDown() override { fs::remove_all(dir); }
-};
+using PictureFiles = InTempDir;
 
 } // namespace
 
