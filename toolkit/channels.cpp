@@ -10,18 +10,29 @@ using namespace pxfx::packed;
 extern "C" {
 
 int32_t PXImage_BlueEnhancement(PXImage *img) {
-    if (!px_usable(img)) return 0;
+    if (img == nullptr || img->data == nullptr || !px_rows_inside(img)) return 0;
     if (img->bitcount == 8 || img->bitcount == 16) return 1;
     if (img->bitcount != 24) return 0;
-    const size_t n = px_block(img);
+    // An image without pixel rows has no byte to invert: n is 0.
+    const size_t n = px_held(img);
     for (size_t i = 0; i < n; ++i)
         img->data[i] = static_cast<uint8_t>(255 - img->data[i]);
     return 1;
 }
 
 int32_t PXImage_GreenChannel(PXImage *img) {
-    if (!px_usable(img) || (img->bitcount != 24 && img->bitcount != 32)) return 0;
-    const size_t bpp = static_cast<size_t>(px_bytes(img->bitcount));
+    if (img == nullptr || img->data == nullptr || !px_rows_inside(img)) return 0;
+    if (img->bitcount != 24 && img->bitcount != 32) return 0;
+    const int32_t size = px_bytes(img->bitcount);
+    // Without pixel rows: the scratch copy of the image's size gets no block
+    // for a count of 0 or below (0). With both sizes negative it would, no
+    // pixel is visited, and copying the unwritten scratch back is left out
+    // (1, image unchanged).
+    if (!px_usable(img)) {
+        const int64_t bytes = block_size(img->width, img->height, size);
+        return bytes != kNoSize && bytes > 0 ? 1 : 0;
+    }
+    const auto bpp = static_cast<size_t>(size);
     const size_t pixels = px_block(img) / bpp;
     uint8_t *p = img->data;
     for (size_t i = 0; i < pixels; ++i, p += bpp)

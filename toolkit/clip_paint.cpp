@@ -109,7 +109,7 @@ int32_t blue_stretch(uint8_t *plane, int32_t width, int32_t height) {
 extern "C" {
 
 PXImage *PXImage_Effect_Clip(const PXImage *photo, const PXImage *frame) {
-    if (!px_usable(photo) || (photo->bitcount != 8 && photo->bitcount != 24)) return nullptr;
+    if (photo == nullptr || !px_rows_inside(photo) || (photo->bitcount != 8 && photo->bitcount != 24)) return nullptr;
     if (!px_usable(frame) || frame->bitcount != 24 || frame->width < kWindowLeft + kWindowCols ||
         frame->height < kWindowTop + kWindowRows)
         return nullptr;
@@ -117,8 +117,9 @@ PXImage *PXImage_Effect_Clip(const PXImage *photo, const PXImage *frame) {
     if (out == nullptr) return nullptr;
     std::memcpy(out->data, frame->data, px_block(frame));
     const int32_t pb = px_bytes(photo->bitcount);
-    const size_t photoPixels = static_cast<size_t>(photo->width) * static_cast<size_t>(photo->height);
-    for (int32_t r = 0; r < kWindowRows; ++r) {
+    // A photo without data or pixel rows has no pixel to show: the frame stays.
+    const size_t photoPixels = px_held(photo) / static_cast<size_t>(pb);
+    for (int32_t r = 0; r < kWindowRows && photoPixels != 0; ++r) {
         uint8_t *row = out->data + (static_cast<size_t>(kWindowTop + r) * frame->width + kWindowLeft) * 3;
         const size_t photoRow = static_cast<size_t>(r) * static_cast<size_t>(photo->width);
         for (int32_t c = 0; c < kWindowCols; ++c) {

@@ -15,9 +15,16 @@ using namespace pxfx::packed;
 
 namespace {
 
-bool geometry_input_ok(const PXImage *src) {
-    return px_usable(src) && (src->bitcount == 8 || src->bitcount == 16 || src->bitcount == 24);
+bool geometry_bits(const PXImage *src) { return src->bitcount == 8 || src->bitcount == 16 || src->bitcount == 24; }
+
+// The turns refuse a null record, null data and other bit counts.
+bool turn_input_ok(const PXImage *src) {
+    return src != nullptr && src->data != nullptr && geometry_bits(src) && px_rows_inside(src);
 }
+
+// v held to 0 .. n - 1 with the crop's rule: below 0 gives 0, n or above gives
+// n - 1 (so for n <= 0 every value gives 0 or n - 1).
+constexpr int64_t hold(int64_t v, int64_t n) { return v < 0 ? 0 : (v >= n ? n - 1 : v); }
 
 constexpr int32_t kTile = 32;
 
@@ -108,11 +115,12 @@ void quarter_turn(const uint8_t *src, int32_t w, int32_t h, uint8_t *dst, int32_
 }
 
 PXImage *rotate_quarter(const PXImage *src, bool clockwise) {
-    if (!geometry_input_ok(src)) return nullptr;
+    if (!turn_input_ok(src)) return nullptr;
     const int32_t w = src->width, h = src->height;
-    const int64_t outWidth = (int64_t{h} + 7) / 8 * 8;
+    const int64_t outWidth = floor8(int64_t{h} + 7);
     PXImage *out = px_new(outWidth, w, src->bitcount);
-    if (out == nullptr) return nullptr;
+    // Both sizes negative: no rows to turn, the block stays cleared.
+    if (out == nullptr || w < 0) return out;
     const auto ow = static_cast<int32_t>(outWidth);
     switch (src->bitcount) {
     case 8: quarter_turn<1>(src->data, w, h, out->data, ow, clockwise); break;
@@ -137,25 +145,34 @@ template <int32_t B> void half_turn(const uint8_t *src, int32_t w, int32_t h, ui
 extern "C" {
 
 PXImage *PXImage_Crop(const PXImage *src, const PXRect *rect) {
-    if (rect == nullptr || !geometry_input_ok(src)) return nullptr;
-    const int32_t w = src->width, h = src->height, bpp = px_bytes(src->bitcount);
-    const int32_t L = clamp_coord(rect->left, w), R = clamp_coord(rect->right, w);
-    const int32_t T = clamp_coord(rect->top, h), B = clamp_coord(rect->bottom, h);
-    int32_t W = (R - L + 8) / 8 * 8;
+    if (rect == nullptr || src == nullptr || !geometry_bits(src) || !px_rows_inside(src)) return nullptr;
+    const int64_t w = src->width, h = src->height;
+    const int32_t bpp = px_bytes(src->bitcount);
+    const int64_t L = hold(rect->left, w), R = hold(rect->right, w);
+    const int64_t T = hold(rect->top, h), B = hold(rect->bottom, h);
+    int64_t W = floor8(R - L + 8);
     if (W > w) W = w;
-    const int32_t H = T - B + 1;
-    if (W <= 0 || H <= 0) return nullptr;
-    PXImage *out = px_new(W, H, src->bitcount);
-    if (out == nullptr) return nullptr;
+    if (W < 0) W = 0;
+    const int64_t H = T - B + 1;
+    const int64_t bytes = block_size(W, H, bpp);
+    if (bytes == kNoSize) return nullptr;
+    // An empty width or a height of 0 or below asks for no block (data null)
+    // and copies nothing.
+    PXImage *out = px_record(W, H, src->bitcount, bytes);
+    if (out == nullptr || bytes <= 0) return out;
     // Each row copy is W pixels from column L of the packed block; past the
-    // row end it continues on the next source row, and past the block end
-    // the result is cleared.
-    const size_t block = px_block(src), rowBytes = static_cast<size_t>(W) * bpp;
-    for (int32_t r = B; r <= T; ++r) {
-        const size_t from = (static_cast<size_t>(r) * w + L) * bpp;
-        const size_t n = std::min(rowBytes, block - from);
+    // row end it continues on the next source row. Bytes outside the block
+    // read as 0: past its end, and all of them for a source without data or
+    // pixel rows (whose held rows can lie before the block).
+    const size_t block = px_held(src), rowBytes = static_cast<size_t>(W) * bpp;
+    for (int64_t r = B; r <= T; ++r) {
         uint8_t *to = out->data + static_cast<size_t>(r - B) * rowBytes;
-        std::memcpy(to, src->data + from, n);
+        size_t n = 0;
+        if (block != 0) {
+            const size_t from = static_cast<size_t>(r * w + L) * bpp;
+            n = std::min(rowBytes, block - from);
+            std::memcpy(to, src->data + from, n);
+        }
         std::memset(to + n, 0, rowBytes - n);
     }
     return out;
@@ -166,9 +183,10 @@ PXImage *PXImage_Rotate90(const PXImage *src) { return rotate_quarter(src, false
 PXImage *PXImage_Rotate270(const PXImage *src) { return rotate_quarter(src, true); }
 
 PXImage *PXImage_Rotate180(const PXImage *src) {
-    if (!geometry_input_ok(src)) return nullptr;
+    if (!turn_input_ok(src)) return nullptr;
     PXImage *out = px_new(src->width, src->height, src->bitcount);
-    if (out == nullptr) return nullptr;
+    // Both sizes negative: no rows to turn, the block stays cleared.
+    if (out == nullptr || src->width < 0) return out;
     switch (src->bitcount) {
     case 8: half_turn<1>(src->data, src->width, src->height, out->data); break;
     case 16: half_turn<2>(src->data, src->width, src->height, out->data); break;

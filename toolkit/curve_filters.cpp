@@ -23,13 +23,23 @@ constexpr int32_t arg_red(uint32_t c) { return static_cast<int32_t>(c & 255); }
 constexpr int32_t arg_green(uint32_t c) { return static_cast<int32_t>((c >> 8) & 255); }
 constexpr int32_t arg_blue(uint32_t c) { return static_cast<int32_t>((c >> 16) & 255); }
 
-// The masked filters accept no mask, or a valid 8-bit one.
-bool mask_usable(const Image *mask) { return mask == nullptr || is_plane(mask); }
+// Images the filters take: a pixel block of the bit count whose rows stay
+// inside it. Images of an empty or negative size have no samples to map.
+bool target_ok(const Image *img, uint32_t bitCount) {
+    return img != nullptr && img->bits != nullptr && img->bitCount == bitCount && rows_inside(img);
+}
+
+// The masked filters accept no mask, or an 8-bit one whose rows stay inside
+// its block. A mask without a pixel block reads as 0 everywhere and so
+// selects nothing; one of an empty or negative size leaves no area to visit.
+bool mask_usable(const Image *mask) { return mask == nullptr || (mask->bitCount == 8 && rows_inside(mask)); }
 
 // Maps the first `bpp * width` bytes of every row through m (bytes of one pixel
 // through m[0], m[1], ... in turn); with a mask, only the pixels of the
-// top-left area common to both records whose mask byte is non-zero.
+// top-left area common to both records whose mask byte is non-zero. Images
+// and masks without samples leave nothing to map.
 template <int Bpp> void apply(Image *img, const Map *m, const Image *mask) {
+    if (!has_pixels(img) || (mask != nullptr && !has_pixels(mask))) return;
     const int32_t w = mask ? std::min(mask->width, img->width) : img->width;
     const int32_t h = mask ? std::min(mask->height, img->height) : img->height;
     for (int32_t y = 0; y < h; ++y) {
@@ -53,7 +63,7 @@ void apply_plane(Image *img, const Map &m) { apply<1>(img, &m, nullptr); }
 
 // Levels outside 0..255 and the neutral 128 are refused.
 bool level_usable(const Image *img, int32_t level) {
-    return level >= 0 && level <= 255 && level != 128 && is_plane(img);
+    return level >= 0 && level <= 255 && level != 128 && target_ok(img, 8);
 }
 
 // Circular-arc curve through (0, 0) and (255, 255) bowed by the strength.
@@ -94,7 +104,7 @@ void invert_curve(Map &table) {
 extern "C" {
 
 int32_t ColorFilter(Image *img, uint32_t colour, const Image *mask) {
-    if (!has_pixels(img) || img->bitCount != 8 || !mask_usable(mask)) return 0;
+    if (!target_ok(img, 8) || !mask_usable(mask)) return 0;
     const float lumf = static_cast<float>(arg_red(colour)) * 0.2992f + static_cast<float>(arg_green(colour)) * 0.5868f +
                        static_cast<float>(arg_blue(colour)) * 0.114f;
     int32_t lum = static_cast<int32_t>(lumf);
@@ -109,7 +119,7 @@ int32_t ColorFilter(Image *img, uint32_t colour, const Image *mask) {
 }
 
 int32_t ColorFilter24(Image *img, uint32_t colour, const Image *mask) {
-    if (!has_pixels(img) || img->bitCount != 24 || !mask_usable(mask)) return 0;
+    if (!target_ok(img, 24) || !mask_usable(mask)) return 0;
     const uint32_t target[3] = {static_cast<uint32_t>(arg_blue(colour)), static_cast<uint32_t>(arg_green(colour)),
                                 static_cast<uint32_t>(arg_red(colour))};
     Map m[3];

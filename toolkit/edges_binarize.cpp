@@ -35,16 +35,24 @@ constexpr uint32_t word_gray(uint32_t s) { return (s & 0x7E0) >> 3; }
 extern "C" {
 
 int32_t PXImage_EdgeDetection(PXImage *img) {
-    if (!px_usable(img)) return 0;
+    if (!filter_input_ok(img)) return 0;
+    if (!px_usable(img)) return filter_without_rows(img);
     bool ok = true;
     if (!with_sample_format(img->bitcount, [&](auto f) { ok = edge_filter<decltype(f)>(img); })) return 1;
     return ok ? 1 : 0;
 }
 
 int32_t PXImage_GrayToBinarization(PXImage *img) {
-    if (!px_usable(img)) return 0;
+    if (!filter_input_ok(img)) return 0;
     const int32_t bits = img->bitcount;
     if (bits != 8 && bits != 16 && bits != 24) return 0;
+    // Without pixel rows: the grey plane of width x height bytes gets no
+    // block for a count of 0 or below (0). With both sizes negative it does,
+    // and no sample is read or mapped (1).
+    if (!px_usable(img)) {
+        const int64_t plane = block_size(img->width, img->height, 1);
+        return plane != kNoSize && plane > 0 ? 1 : 0;
+    }
     const size_t pixels = static_cast<size_t>(img->width) * static_cast<size_t>(img->height);
     uint8_t *d = img->data;
     Buffer<uint8_t> plane = alloc_buffer<uint8_t>(pixels);

@@ -137,7 +137,12 @@ int32_t expose_words(PXImage *img) {
 }
 
 int32_t auto_exposure(PXImage *img, bool fixedCurve) {
-    if (!px_usable(img)) return 0;
+    if (img == nullptr || img->data == nullptr || !px_rows_inside(img)) return 0;
+    if (img->bitcount != 8 && img->bitcount != 16 && img->bitcount != 24) return 0;
+    // Without pixel rows the histograms are empty: no running share exceeds
+    // the thresholds, so low = 0 (below the bright limit) and there is
+    // nothing to map.
+    if (!px_usable(img)) return 1;
     switch (img->bitcount) {
     case 8: return expose_gray(img, fixedCurve);
     case 16: return expose_words(img);

@@ -41,6 +41,25 @@ template <class Fn> bool with_sample_format(int32_t bitcount, Fn &&fn) {
     }
 }
 
+// True for records the in-place filters take: data, and rows that stay
+// inside the block (or none).
+inline bool filter_input_ok(const PXImage *img) {
+    return img != nullptr && img->data != nullptr && px_rows_inside(img);
+}
+
+// What the in-place filters give for an image without pixel rows (a width or
+// height of 0 or below). Bit counts other than 8, 16 and 24 return 1 before
+// any memory is needed. For those three the scratch image of width x height
+// pixels gets no block for a count of 0 or below (0); with both sizes
+// negative it does, no pixel is visited, and copying the unwritten scratch
+// back is left out (1, image unchanged).
+inline int32_t filter_without_rows(const PXImage *img) {
+    const int32_t bits = img->bitcount;
+    if (bits != 8 && bits != 16 && bits != 24) return 1;
+    const int64_t bytes = block_size(img->width, img->height, px_bytes(bits));
+    return bytes != kNoSize && bytes > 0 ? 1 : 0;
+}
+
 // Neighbourhood rows of `size` x `size` windows. Padded row r holds the
 // samples at columns -half .. width - 1 + half, sample (p, c) at index
 // (p + half) * C + c, read as the filters define their clamp: rows and

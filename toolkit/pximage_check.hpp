@@ -36,33 +36,75 @@ inline bool px_usable(const PXImage *im) {
                         static_cast<uint64_t>(bpp > 0 ? bpp : 1)) != 0;
 }
 
+// True when loops over the record stay inside its block: it has no data or
+// no rows and columns to visit (a width or height of 0 or below), or it is
+// usable. A record failing this claims a block its memory cannot hold.
+inline bool px_rows_inside(const PXImage *im) {
+    return im->data == nullptr || im->width <= 0 || im->height <= 0 || px_usable(im);
+}
+
 // Bytes of the pixel block of a usable record of a stored bit count.
 inline size_t px_block(const PXImage *im) {
     return static_cast<size_t>(im->width) * static_cast<size_t>(im->height) *
            static_cast<size_t>(px_bytes(im->bitcount));
 }
 
-// A new record with an uninitialised pixel block of width x height pixels,
-// or null when a size is not positive, the block is too large, or an
-// allocation fails (nothing is left allocated then).
-inline PXImage *px_new(int64_t width, int64_t height, int32_t bitcount) {
-    const int32_t bpp = px_bytes(bitcount);
-    if (width <= 0 || height <= 0 || bpp == 0) return nullptr;
-    const size_t bytes =
-        checked_size(static_cast<uint64_t>(width), static_cast<uint64_t>(height), static_cast<uint64_t>(bpp));
-    if (bytes == 0) return nullptr;
+// Bytes of the pixel block of any record: none without data or with a width
+// or height of 0 or below (such a record has no pixel rows).
+inline size_t px_held(const PXImage *im) { return px_usable(im) ? px_block(im) : 0; }
+
+// Marks a size that does not fit the 32-bit arithmetic of the toolkit.
+inline constexpr int64_t kNoSize = std::numeric_limits<int64_t>::min();
+
+// width x height x bpp as the toolkit's signed size arithmetic gives it: 0 for
+// an empty size, negative when exactly one size is negative, positive when
+// both are. kNoSize when a size or the product lies outside the signed 32-bit
+// range (the toolkit refuses such sizes instead of letting them wrap).
+inline int64_t block_size(int64_t width, int64_t height, int32_t bpp) {
+    constexpr int64_t lo = std::numeric_limits<int32_t>::min(), hi = std::numeric_limits<int32_t>::max();
+    if (width < lo || width > hi || height < lo || height > hi) return kNoSize;
+    const int64_t pixels = width * height;
+    if (pixels < -hi || pixels > hi) return kNoSize;
+    const int64_t bytes = pixels * bpp;
+    return bytes < -hi || bytes > hi ? kNoSize : bytes;
+}
+
+// A new record of width x height pixels (sizes from block_size) with a block
+// of `bytes` bytes. A count of 0 or below gives data null, as PX_malloc gives
+// no block for it. A positive block is left uninitialised. Null when the
+// record or a positive block cannot be allocated (nothing is left allocated).
+inline PXImage *px_record(int64_t width, int64_t height, int32_t bitcount, int64_t bytes) {
     auto *im = static_cast<PXImage *>(PX_malloc(sizeof(PXImage)));
     if (im == nullptr) return nullptr;
-    im->data = static_cast<uint8_t *>(PX_malloc(bytes));
-    if (im->data == nullptr) {
-        PX_free(im);
-        return nullptr;
+    im->data = nullptr;
+    if (bytes > 0) {
+        im->data = static_cast<uint8_t *>(PX_malloc(static_cast<size_t>(bytes)));
+        if (im->data == nullptr) {
+            PX_free(im);
+            return nullptr;
+        }
     }
     im->width = static_cast<int32_t>(width);
     im->height = static_cast<int32_t>(height);
     im->bitcount = bitcount;
     return im;
 }
+
+// A new record of width x height pixels for results whose loops run over its
+// rows, its block sized by block_size: uninitialised for positive sizes,
+// cleared when both sizes are negative (there are no rows to fill). Null when
+// that size is 0 or below (no block can be had, which these results treat as
+// a failed allocation) or does not fit, or when an allocation fails.
+inline PXImage *px_new(int64_t width, int64_t height, int32_t bitcount) {
+    const int64_t bytes = block_size(width, height, px_bytes(bitcount));
+    if (bytes == kNoSize || bytes <= 0) return nullptr;
+    PXImage *im = px_record(width, height, bitcount, bytes);
+    if (im != nullptr && width < 0) std::memset(im->data, 0, static_cast<size_t>(bytes));
+    return im;
+}
+
+// v rounded down (toward minus infinity) to a multiple of 8.
+constexpr int64_t floor8(int64_t v) { return v & ~int64_t{7}; }
 
 // 16-bit samples are little-endian words.
 inline uint32_t load16(const uint8_t *p) { return p[0] | static_cast<uint32_t>(p[1]) << 8; }

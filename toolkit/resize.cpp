@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstring>
 
 #include "core/internal/cpu.hpp"
 #include "core/internal/memory.hpp"
@@ -159,11 +160,22 @@ bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, 
 
 namespace {
 
-bool plane_args_ok(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, const uint8_t *dst, int32_t dstWidth,
-                   int32_t dstHeight) {
-    return src != nullptr && dst != nullptr && srcWidth > 0 && srcHeight > 0 && dstWidth > 0 && dstHeight > 0 &&
-           checked_size(static_cast<uint64_t>(srcWidth), static_cast<uint64_t>(srcHeight)) != 0 &&
-           checked_size(static_cast<uint64_t>(dstWidth), static_cast<uint64_t>(dstHeight)) != 0;
+// What the plane interpolation does before touching a pixel: -1 when it goes
+// on to interpolate, else its result. Null planes and sizes of 0 are refused
+// (0); a destination of negative width or height has empty row or column
+// loops, so nothing is read or written (1). A source of negative width or
+// height has no pixel rows, and its clamped indices (the size - 1) point
+// before the plane, so it is refused (0) whenever pixels would be written;
+// so are planes above kMaxBlockBytes.
+int32_t plane_outcome(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, const uint8_t *dst, int32_t dstWidth,
+                      int32_t dstHeight) {
+    if (src == nullptr || dst == nullptr || srcWidth == 0 || srcHeight == 0 || dstWidth == 0 || dstHeight == 0)
+        return 0;
+    if (dstWidth < 0 || dstHeight < 0) return 1;
+    if (srcWidth < 0 || srcHeight < 0) return 0;
+    const bool fits = checked_size(static_cast<uint64_t>(srcWidth), static_cast<uint64_t>(srcHeight)) != 0 &&
+                      checked_size(static_cast<uint64_t>(dstWidth), static_cast<uint64_t>(dstHeight)) != 0;
+    return fits ? -1 : 0;
 }
 
 } // namespace
@@ -172,7 +184,8 @@ extern "C" {
 
 int32_t DualLinearIntepol(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, uint8_t *dst, int32_t dstWidth,
                           int32_t dstHeight) {
-    if (!plane_args_ok(src, srcWidth, srcHeight, dst, dstWidth, dstHeight)) return 0;
+    const int32_t outcome = plane_outcome(src, srcWidth, srcHeight, dst, dstWidth, dstHeight);
+    if (outcome >= 0) return outcome;
     const float ry = static_cast<float>(srcHeight) / static_cast<float>(dstHeight);
     const float rx = static_cast<float>(srcWidth) / static_cast<float>(dstWidth);
     return interpolate_plane(src, srcWidth, srcHeight, 1, dst, dstWidth, dstHeight, 1, ry, rx) ? 1 : 0;
@@ -180,16 +193,30 @@ int32_t DualLinearIntepol(const uint8_t *src, int32_t srcWidth, int32_t srcHeigh
 
 int32_t DualLinearIntepol_KWB(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, uint8_t *dst, int32_t dstWidth,
                               int32_t dstHeight, float scale) {
-    if (!plane_args_ok(src, srcWidth, srcHeight, dst, dstWidth, dstHeight)) return 0;
+    if (dstWidth <= 0) return 0;
+    const int32_t outcome = plane_outcome(src, srcWidth, srcHeight, dst, dstWidth, dstHeight);
+    if (outcome >= 0) return outcome;
     return interpolate_plane(src, srcWidth, srcHeight, 1, dst, dstWidth, dstHeight, 1, scale, scale) ? 1 : 0;
 }
 
 PXImage *PXImage_Resize(const PXImage *src, int32_t newWidth, int32_t newHeight) {
-    if (!px_usable(src)) return nullptr;
+    if (src == nullptr || !px_rows_inside(src)) return nullptr;
     if (src->bitcount != 8 && src->bitcount != 16 && src->bitcount != 24) return nullptr;
+    const int32_t outBits = src->bitcount == 8 ? 8 : 24;
+    const int64_t bytes = block_size(newWidth, newHeight, px_bytes(outBits));
+    if (bytes == kNoSize) return nullptr;
+    // A new size of 0, or exactly one negative new size, asks for no block
+    // (data null) and the interpolation writes nothing.
+    PXImage *out = px_record(newWidth, newHeight, outBits, bytes);
+    if (out == nullptr || bytes <= 0) return out;
+    // Both new sizes negative: the block exists but the loops are empty. A
+    // source without data or pixel rows gives the interpolation nothing to
+    // read. Either way no result pixel is computed; the block is cleared.
+    if (newWidth < 0 || !px_usable(src)) {
+        std::memset(out->data, 0, static_cast<size_t>(bytes));
+        return out;
+    }
     const int32_t w = src->width, h = src->height;
-    PXImage *out = px_new(newWidth, newHeight, src->bitcount == 8 ? 8 : 24);
-    if (out == nullptr) return nullptr;
     const float ry = static_cast<float>(h) / static_cast<float>(newHeight);
     const float rx = static_cast<float>(w) / static_cast<float>(newWidth);
     bool ok = true;

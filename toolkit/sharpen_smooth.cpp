@@ -251,8 +251,9 @@ template <class F> bool median_smooth(PXImage *img, int32_t size) {
 extern "C" {
 
 int32_t PXImage_Sharpen(PXImage *img, int32_t strength) {
-    if (!px_usable(img) || strength == 0) return 0;
+    if (!filter_input_ok(img) || strength == 0) return 0;
     if (strength > 100) return 1;
+    if (!px_usable(img)) return filter_without_rows(img);
     const int32_t size = strength < 40 ? 3 : (strength < 80 ? 5 : 7);
     bool ok = true;
     if (!with_sample_format(img->bitcount, [&](auto f) { ok = sharpen<decltype(f)>(img, size); })) return 1;
@@ -260,7 +261,8 @@ int32_t PXImage_Sharpen(PXImage *img, int32_t strength) {
 }
 
 int32_t PXImage_Smooth(PXImage *img, int32_t strength) {
-    if (!px_usable(img) || strength == 0) return 0;
+    if (!filter_input_ok(img) || strength == 0) return 0;
+    if (!px_usable(img)) return filter_without_rows(img);
     const bool median = strength >= 60;
     const int32_t size = strength < 20 ? 3 : (strength < 40 ? 5 : (strength < 60 ? 7 : (strength < 80 ? 5 : 7)));
     bool ok = true;

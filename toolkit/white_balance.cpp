@@ -128,10 +128,16 @@ int32_t ProbabilityDensityValue(const uint8_t *plane, int32_t width, int32_t hei
 }
 
 int32_t PXImage_AutoWhiteBalance(PXImage *img, const PXPoint *pt) {
-    if (img == nullptr || pt == nullptr || !px_usable(img)) return 0;
-    if (img->bitcount == 24) return balance_colour(img, pt);
-    if (img->bitcount == 8) return balance_gray(img, pt);
-    return 0;
+    if (img == nullptr || pt == nullptr || img->data == nullptr || !px_rows_inside(img)) return 0;
+    if (img->bitcount != 8 && img->bitcount != 24) return 0;
+    // Without pixel rows: the scratch plane of width x height bytes gets no
+    // block for a count of 0 or below (0). With both sizes negative it would,
+    // and then no sample is mapped (1).
+    if (!px_usable(img)) {
+        const int64_t plane = block_size(img->width, img->height, 1);
+        return plane != kNoSize && plane > 0 ? 1 : 0;
+    }
+    return img->bitcount == 24 ? balance_colour(img, pt) : balance_gray(img, pt);
 }
 
 } // extern "C"

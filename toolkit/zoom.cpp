@@ -77,17 +77,16 @@ template <int32_t B> void zoom_out(const PXImage *src, PXImage *dst) {
     }
 }
 
-bool zoom_input_ok(const PXImage *src) {
-    return px_usable(src) && (src->bitcount == 8 || src->bitcount == 16 || src->bitcount == 24);
-}
+bool zoom_bits(const PXImage *src) { return src->bitcount == 8 || src->bitcount == 16 || src->bitcount == 24; }
 
-// Rectangle zoom: byte b of the source, gathered from row `startRow`, column
-// x on, w' bytes a row for as many rows as the source has, in a plane that
-// the interpolation reads as source width x source height. Positions outside
-// the source block, and plane bytes the gather does not reach, read as 0.
+// Rectangle zoom: byte b of the source (a usable record), gathered from row
+// `startRow`, column x on, w' bytes a row for as many rows as the source has,
+// in a plane that the interpolation reads as source width x source height.
+// Positions outside the source block, and plane bytes the gather does not
+// reach (all of them for w' below 1), read as 0.
 void gather_plane(const PXImage *src, int64_t startRow, int64_t x, int64_t gatherWidth, int32_t b, uint8_t *plane) {
     const int64_t sw = src->width, sh = src->height, pixels = sw * sh;
-    const int64_t size = sw * sh, filled = std::min(size, gatherWidth * sh);
+    const int64_t size = sw * sh, filled = gatherWidth > 0 ? std::min(size, gatherWidth * sh) : 0;
     for (int64_t i = 0; i < filled; ++i) {
         const int64_t r = i / gatherWidth, k = i % gatherWidth;
         const int64_t p = (startRow + r) * sw + x + k;
@@ -96,14 +95,37 @@ void gather_plane(const PXImage *src, int64_t startRow, int64_t x, int64_t gathe
     std::memset(plane + filled, 0, static_cast<size_t>(size - filled));
 }
 
+// The four byte planes of the rectangle, rw x rh bytes each, one after the
+// other. A source without data or pixel rows gives the interpolation nothing
+// it reads (it refuses an empty or negative source), so the planes stay 0.
+bool zoom_planes(const PXImage *src, int64_t startRow, int64_t x, int64_t gatherWidth, int32_t rw, int32_t rh,
+                 uint8_t *out) {
+    const size_t outSize = static_cast<size_t>(rw) * static_cast<size_t>(rh);
+    if (!px_usable(src)) {
+        std::memset(out, 0, outSize * 4);
+        return true;
+    }
+    Buffer<uint8_t> plane = alloc_buffer<uint8_t>(px_block(src) / 4);
+    if (!plane) return false;
+    const float ry = static_cast<float>(src->height) / static_cast<float>(rh);
+    const float rx = static_cast<float>(src->width) / static_cast<float>(rw);
+    for (int32_t b = 0; b < 4; ++b) {
+        gather_plane(src, startRow, x, gatherWidth, b, plane.get());
+        if (!interpolate_plane(plane.get(), src->width, src->height, 1, out + outSize * b, rw, rh, 1, ry, rx))
+            return false;
+    }
+    return true;
+}
+
 } // namespace
 
 extern "C" {
 
 PXImage *PXImage_ZoomIn(const PXImage *src) {
-    if (!zoom_input_ok(src)) return nullptr;
+    if (src == nullptr || src->data == nullptr || !zoom_bits(src) || !px_rows_inside(src)) return nullptr;
     PXImage *out = px_new(2 * int64_t{src->width}, 2 * int64_t{src->height}, src->bitcount);
-    if (out == nullptr) return nullptr;
+    // Both sizes negative: no rows to fill, the block stays cleared.
+    if (out == nullptr || src->width < 0) return out;
     bool ok;
     switch (src->bitcount) {
     case 8: ok = zoom_in<ByteSamples, 1>(src, out); break;
@@ -118,9 +140,15 @@ PXImage *PXImage_ZoomIn(const PXImage *src) {
 }
 
 PXImage *PXImage_ZoomOut(const PXImage *src) {
-    if (!zoom_input_ok(src)) return nullptr;
-    PXImage *out = px_new((src->width / 2 + 7) / 8 * 8, src->height / 2, src->bitcount);
-    if (out == nullptr) return nullptr;
+    if (src == nullptr || !zoom_bits(src) || !px_rows_inside(src)) return nullptr;
+    PXImage *out = px_new(floor8(src->width / 2 + 7), src->height / 2, src->bitcount);
+    // Both result sizes negative: no rows to fill, the block stays cleared.
+    if (out == nullptr || out->width < 0) return out;
+    // A source without data has no pixels to take: the result is cleared.
+    if (src->data == nullptr) {
+        std::memset(out->data, 0, px_block(out));
+        return out;
+    }
     switch (src->bitcount) {
     case 8: zoom_out<1>(src, out); break;
     case 16: zoom_out<2>(src, out); break;
@@ -132,36 +160,33 @@ PXImage *PXImage_ZoomOut(const PXImage *src) {
 int32_t PXImage_ROI_Zoom(const PXImage *src, PXImage *dst, const PXRect *rect, double scale, int32_t x, int32_t y) {
     if (dst == nullptr || src == nullptr || rect == nullptr || x < 0 || y < 0) return 0;
     const int64_t rectWidth = int64_t{rect->right} - rect->left, rectHeight = int64_t{rect->top} - rect->bottom;
-    if (rectWidth <= 0 || rectHeight <= 0 || src->bitcount != 32 || dst->bitcount != 32) return 0;
-    if (!(std::fabs(scale) >= 1e-13) || !px_usable(src) || !px_usable(dst)) return 0;
-    const double gw = static_cast<double>(rectWidth) / scale + 0.5;
-    const double gh = static_cast<double>(rectHeight) / scale + 0.5;
-    const double row0 = static_cast<double>(y) / scale + 0.5;
-    if (!(gw >= 1.0 && gw < 2147483648.0 && gh >= 1.0 && gh < 2147483648.0)) return 0;
-    if (!(row0 > -2147483649.0 && row0 < 2147483648.0)) return 0;
-    const auto gatherWidth = static_cast<int64_t>(gw), gatherHeight = static_cast<int64_t>(gh);
-    const auto startRow = static_cast<int64_t>(row0);
-    if (checked_size(static_cast<uint64_t>(gatherWidth), static_cast<uint64_t>(gatherHeight)) == 0) return 0;
+    if (rectWidth == 0 || rectHeight == 0 || src->bitcount != 32 || dst->bitcount != 32) return 0;
+    if (!(std::fabs(scale) >= 1e-13) || !px_rows_inside(src) || !px_rows_inside(dst)) return 0;
+    // The gather plane of w' x h' and the output plane of the rectangle's
+    // size: a count of 0 or below gets no block from PX_malloc, so the call
+    // fails; counts beyond 32 bits are refused.
+    const auto gatherWidth = trunc_sat<int32_t>(static_cast<double>(rectWidth) / scale + 0.5);
+    const auto gatherHeight = trunc_sat<int32_t>(static_cast<double>(rectHeight) / scale + 0.5);
+    const int64_t gatherBytes = block_size(gatherWidth, gatherHeight, 1);
+    const int64_t outBytes = block_size(rectWidth, rectHeight, 1);
+    if (gatherBytes == kNoSize || gatherBytes <= 0 || outBytes == kNoSize || outBytes <= 0) return 0;
+    // Both rectangle sizes negative: the interpolation and the writes have
+    // empty loops. A target without data or pixel rows takes no writes.
+    // Either way nothing gathered would be seen.
+    const size_t target = px_held(dst);
+    if (rectWidth < 0 || target == 0) return 1;
+    const int64_t startRow = trunc_sat<int32_t>(static_cast<double>(y) / scale + 0.5);
     // All four planes are interpolated before the target is written, so a
     // failure leaves it unchanged. Plane b of the gather reads source byte b
     // only, so a target sharing the source's block gives the same result.
-    const size_t outSize = checked_size(static_cast<uint64_t>(rectWidth), static_cast<uint64_t>(rectHeight));
-    const size_t planeSize = static_cast<size_t>(src->width) * static_cast<size_t>(src->height);
-    if (checked_size(outSize, 4) == 0) return 0;
-    Buffer<uint8_t> plane = alloc_buffer<uint8_t>(planeSize);
-    Buffer<uint8_t> out = alloc_buffer<uint8_t>(outSize * 4);
-    if (!plane || !out) return 0;
     const auto rw = static_cast<int32_t>(rectWidth), rh = static_cast<int32_t>(rectHeight);
-    const float ry = static_cast<float>(src->height) / static_cast<float>(rh);
-    const float rx = static_cast<float>(src->width) / static_cast<float>(rw);
-    for (int32_t b = 0; b < 4; ++b) {
-        gather_plane(src, startRow, x, gatherWidth, b, plane.get());
-        if (!interpolate_plane(plane.get(), src->width, src->height, 1, out.get() + outSize * b, rw, rh, 1, ry, rx))
-            return 0;
-    }
+    const size_t outSize = static_cast<size_t>(outBytes);
+    if (checked_size(outSize, 4) == 0) return 0;
+    Buffer<uint8_t> out = alloc_buffer<uint8_t>(outSize * 4);
+    if (!out || !zoom_planes(src, startRow, x, gatherWidth, rw, rh, out.get())) return 0;
     // Rows of the target run on into the next row past the row end, as in
     // the packed block; pixels past the block end are not written.
-    const int64_t dw = dst->width, dstPixels = dw * dst->height;
+    const int64_t dw = dst->width, dstPixels = static_cast<int64_t>(target / 4);
     for (int32_t b = 0; b < 4; ++b)
         for (int64_t r = 0; r < rh; ++r)
             for (int64_t c = 0; c < rw; ++c) {

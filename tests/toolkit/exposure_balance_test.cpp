@@ -118,6 +118,36 @@ TEST(WhiteBalance, MatchesLiteralVersionAtEdgesAndCorners) {
         }
 }
 
+// Records without pixel rows or data, one row per record: the results of
+// both exposures, white balance, inversion and green copy. The second table
+// of sizes allocates a scratch plane only when both sizes are negative.
+TEST(Channels, ToneFunctionsOnRecordsWithoutPixelRows) {
+    std::vector<uint8_t> block(64, 33);
+    const auto orig = block;
+    const PXPoint pt{1, 1};
+    const struct {
+        PXImage im;
+        int32_t exposure, balance, invert, green;
+    } cases[] = {
+        {{0, 7, 24, block.data()}, 1, 0, 1, 0},
+        {{9, -7, 24, block.data()}, 1, 0, 1, 0},
+        {{INT_MIN, 7, 24, block.data()}, 1, 0, 1, 0},
+        {{INT_MIN, -2, 24, block.data()}, 1, 0, 1, 0},
+        {{-3, -2, 24, block.data()}, 1, 1, 1, 1},
+        {{-3, -2, 8, block.data()}, 1, 1, 1, 0},
+        {{9, 7, 24, nullptr}, 0, 0, 0, 0},
+    };
+    for (auto c : cases) {
+        SCOPED_TRACE(std::to_string(c.im.width) + "x" + std::to_string(c.im.height));
+        EXPECT_EQ(PXImage_AutoExposure(&c.im), c.exposure);
+        EXPECT_EQ(PXImage_AutoExposure_1(&c.im), c.exposure);
+        EXPECT_EQ(PXImage_AutoWhiteBalance(&c.im, &pt), c.balance);
+        EXPECT_EQ(PXImage_BlueEnhancement(&c.im), c.invert);
+        EXPECT_EQ(PXImage_GreenChannel(&c.im), c.green);
+    }
+    EXPECT_EQ(block, orig);
+}
+
 TEST(Channels, InversionAndGreenCopy) {
     PX rgba = px_random(4, 3, 32, 10), a0 = px_clone(rgba.get());
     PX rgb = px_random(4, 3, 24, 9), r0 = px_clone(rgb.get());
@@ -175,6 +205,34 @@ TEST(ColorFilter, LevelMaps) {
         EXPECT_EQ(weighted_sum(map_of([&](Image *i) { return ColorFilter1(i, level); }).data()), want) << level;
         EXPECT_EQ(map_of([&](Image *i) { return ColorFilter_zanto(i, level); }), blend) << level;
     }
+}
+
+// Images of an empty or negative size have nothing to map (1); masks without
+// a pixel block or area select nothing (1, image unchanged); an image without
+// a pixel block is refused.
+TEST(ColorFilter, DegenerateImagesAndMasks) {
+    std::vector<uint8_t> block(256, 77);
+    const auto orig = block;
+    auto rec = [&](int32_t w, int32_t h, uint32_t bits, bool data = true) {
+        return Image{w, h, bits, data ? block.data() : nullptr, 16, 0};
+    };
+    const std::pair<Image, int32_t> images[] = {
+        {rec(0, 4, 8), 1}, {rec(5, -4, 8), 1}, {rec(INT_MIN, 4, 8), 1}, {rec(5, 4, 8, false), 0}};
+    for (auto [im, want] : images) {
+        Image im24 = im;
+        im24.bitCount = 24;
+        EXPECT_EQ(ColorFilter(&im, 0, nullptr) + ColorFilter1(&im, 200) + ColorFilter_zanto(&im, 200) +
+                      ColorFilter24(&im24, 0, nullptr),
+                  4 * want)
+            << im.width << "x" << im.height;
+    }
+    Owned gray = random_image(5, 4, 8, 3), rgb = random_image(5, 4, 24, 4);
+    Owned gray0 = clone(gray.get()), rgb0 = clone(rgb.get());
+    for (Image mask : {rec(5, 4, 8, false), rec(0, 4, 8), rec(5, -4, 8)}) {
+        EXPECT_EQ(ColorFilter(gray.get(), 0, &mask) + ColorFilter24(rgb.get(), 0, &mask), 2);
+        EXPECT_EQ(diff(gray.get(), gray0.get()) + diff(rgb.get(), rgb0.get()), "");
+    }
+    EXPECT_EQ(block, orig);
 }
 
 TEST(ColorFilter, TintMasks) {

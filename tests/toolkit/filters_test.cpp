@@ -80,6 +80,32 @@ TEST(Filters, SharpenSmoothAndEdgesMatchBruteForceWindows) {
     EXPECT_EQ(PXImage_Sharpen(rgba.get(), 50), 1);
 }
 
+// Records without pixel rows or data: bit counts a filter leaves alone give 1;
+// the others need a scratch image of width x height pixels, which an empty
+// size or one negative size does not get (0), and with both sizes negative
+// nothing is computed (1). Nothing is written either way.
+TEST(Filters, RecordsWithoutPixelRows) {
+    std::vector<uint8_t> block(64, 33);
+    const auto orig = block;
+    const struct {
+        PXImage im;
+        int32_t filters, binarize;
+    } cases[] = {
+        {{0, 7, 8, block.data()}, 0, 0},    {{0, 7, 12, block.data()}, 1, 0}, {{9, -7, 24, block.data()}, 0, 0},
+        {{-3, -2, 16, block.data()}, 1, 1}, {{9, 7, 8, nullptr}, 0, 0},       {{INT_MIN, -2, 8, block.data()}, 0, 0},
+    };
+    for (auto c : cases) {
+        SCOPED_TRACE(std::to_string(c.im.width) + "x" + std::to_string(c.im.height) + "x" +
+                     std::to_string(c.im.bitcount));
+        EXPECT_EQ(PXImage_Sharpen(&c.im, 50), c.filters);
+        EXPECT_EQ(PXImage_Smooth(&c.im, 50), c.filters);
+        EXPECT_EQ(PXImage_EdgeDetection(&c.im), c.filters);
+        EXPECT_EQ(PXImage_GrayToBinarization(&c.im), c.binarize);
+        EXPECT_EQ(PXImage_Sharpen(&c.im, 101), c.im.data ? 1 : 0); // no kernel above 100
+    }
+    EXPECT_EQ(block, orig);
+}
+
 TEST(Sort, PartitionExchangeOnAdversarialInputs) {
     std::mt19937 rng(5);
     for (int kind = 0; kind < 5; ++kind) { // sorted, reversed, equal, random, alternating extremes
@@ -136,6 +162,14 @@ TEST(Clip, PhotoShowsThroughDarkHolesInsideTheWindow) {
     }
     PX small = px_random(717, 564, 24, 1), photo = px_random(10, 10, 24, 1);
     EXPECT_EQ(PXImage_Effect_Clip(photo.get(), small.get()), nullptr);
+    // A photo without data or pixel rows shows nothing: a copy of the frame.
+    uint8_t block[64] = {};
+    for (const PXImage blank :
+         {PXImage{700, 300, 24, nullptr}, PXImage{0, 300, 8, block}, PXImage{700, -3, 24, block}}) {
+        PX out(PXImage_Effect_Clip(&blank, frame.get()));
+        ASSERT_TRUE(out);
+        EXPECT_EQ(bytes(out.get()), bytes(frame.get()));
+    }
 }
 
 TEST(Paint, TwoToneFromTheStretchedGreenPlane) {

@@ -2,7 +2,9 @@
 // straightforward per-pixel versions.
 #include <gtest/gtest.h>
 
+#include <climits>
 #include <cmath>
+#include <functional>
 #include <utility>
 
 #include "toolkit/px_images.hpp"
@@ -29,7 +31,7 @@ void ref_interp(const uint8_t *s, int sw, int sh, size_t ss, uint8_t *d, int dw,
     }
 }
 
-TEST(Resize, MatchesInvertedBilinearMappingAtEveryBitCountAndRejects) {
+TEST(Resize, MatchesInvertedBilinearMappingAtEveryBitCount) {
     // The last two take rows past the widest vector loops.
     const int sizes[][4] = {{1, 1, 3, 2}, {7, 5, 3, 9}, {13, 11, 26, 22}, {5, 1, 1, 5},
                             {9, 9, 4, 4}, {4, 4, 8, 8}, {100, 3, 151, 4}, {203, 4, 97, 3}};
@@ -55,7 +57,100 @@ TEST(Resize, MatchesInvertedBilinearMappingAtEveryBitCountAndRejects) {
     ref_interp(src->data, 6, 5, 1, want.data(), 7, 5, 1, 0.7f, 0.7f);
     EXPECT_EQ(got, want);
     EXPECT_EQ(DualLinearIntepol_KWB(src->data, 6, 5, got.data(), 7, 5, 0.0f), 1); // saturated coordinates
-    EXPECT_EQ(PXImage_Resize(src.get(), 0, 3), nullptr);
+}
+
+// Negative destination sizes leave empty loops (KWB refuses a width <= 0);
+// negative source sizes would read before the plane. Nothing is written.
+TEST(Resize, PlaneInterpolationOfDegenerateSizes) {
+    const uint8_t src[16] = {1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16};
+    const struct {
+        int32_t sw, sh, dw, dh, plain, kwb;
+    } cases[] = {{4, 4, -2, 3, 1, 0},   {4, 4, 3, -2, 1, 1}, {4, 4, -2, -2, 1, 0},
+                 {-4, 4, 3, 3, 0, 0},   {4, -4, 3, 3, 0, 0}, {-4, -4, 3, 3, 0, 0},
+                 {-4, -4, 3, -1, 1, 1}, {0, 4, -3, 3, 0, 0}, {4, 4, 0, -3, 0, 0}};
+    for (const auto &c : cases) {
+        std::vector<uint8_t> dst(16, 0xAB);
+        EXPECT_EQ(DualLinearIntepol(src, c.sw, c.sh, dst.data(), c.dw, c.dh), c.plain) << c.sw << "," << c.sh;
+        EXPECT_EQ(DualLinearIntepol_KWB(src, c.sw, c.sh, dst.data(), c.dw, c.dh, 1.0f), c.kwb) << c.dw << "," << c.dh;
+        EXPECT_EQ(dst, std::vector<uint8_t>(16, 0xAB));
+    }
+}
+
+// Records of every degenerate kind over one block, and sizes that are empty,
+// negative or beyond 32 bits: the record each geometry call makes.
+TEST(Geometry, DegenerateSourcesAndSizes) {
+    std::vector<uint8_t> block(4096, 9);
+    const auto orig = block;
+    auto rec = [&](int32_t w, int32_t h, int32_t bits) { return PXImage{w, h, bits, block.data()}; };
+    const PXImage g8 = rec(9, 7, 8), g16 = rec(9, 7, 16), g24 = rec(9, 7, 24), zeroW = rec(0, 7, 8),
+                  negH = rec(9, -7, 16), minW = rec(INT_MIN, 7, 8), minH = rec(9, INT_MIN, 8), negs8 = rec(-3, -9, 8),
+                  negs24 = rec(-16, -2, 24), flat = rec(-3, -7, 8), narrow = rec(-4, -2, 8);
+    const PXImage none{9, 7, 24, nullptr};
+    auto crop = [](const PXImage &im, PXRect r) { return PXImage_Crop(&im, &r); };
+    const PXRect r{1, 3, 3, 0};
+    const std::pair<std::function<PXImage *()>, const char *> cases[] = {
+        {[&] { return PXImage_Resize(&g8, 0, 3); }, "0x3x8 none"},
+        {[&] { return PXImage_Resize(&g24, 3, 0); }, "3x0x24 none"},
+        {[&] { return PXImage_Resize(&g16, -3, 3); }, "-3x3x24 none"},
+        {[&] { return PXImage_Resize(&g8, -70000, 3); }, "-70000x3x8 none"},
+        {[&] { return PXImage_Resize(&g8, -3, -2); }, "-3x-2x8 zeros"},
+        {[&] { return PXImage_Resize(&g24, -3, -2); }, "-3x-2x24 zeros"},
+        {[&] { return PXImage_Resize(&none, 3, 2); }, "3x2x24 zeros"},
+        {[&] { return PXImage_Resize(&zeroW, 4, 2); }, "4x2x8 zeros"},
+        {[&] { return PXImage_Resize(&negH, 4, 2); }, "4x2x24 zeros"},
+        {[&] { return PXImage_Resize(&minW, 4, 2); }, "4x2x8 zeros"},
+        {[&] { return PXImage_Resize(&g8, 70000, 70000); }, "null"},
+        {[&] { return PXImage_Resize(&g8, INT_MIN, 3); }, "null"},
+        // Crops: right < left, top < bottom and top = bottom - 1, then sources without pixel rows.
+        {[&] {
+             return crop(g8, {10, 3, 1, 1});
+         },
+         "0x3x8 none"},
+        {[&] {
+             return crop(g8, {2, 1, 5, 4});
+         },
+         "8x-2x8 none"},
+        {[&] {
+             return crop(g8, {2, 3, 5, 4});
+         },
+         "8x0x8 none"},
+        {[&] { return crop(none, r); }, "8x4x24 zeros"},
+        {[&] { return crop(zeroW, r); }, "0x4x8 none"},
+        {[&] { return crop(minW, r); }, "0x4x8 none"},
+        {[&] { return crop(negH, r); }, "8x1x16 zeros"}, // top and bottom held at -8
+        {[&] {
+             return crop(negH, {1, -1, 3, 0});
+         },
+         "8x9x16 zeros"},
+        {[&] {
+             return crop(negH, {1, 0, 3, -1});
+         },
+         "8x-7x16 none"},
+        {[&] {
+             return crop(minH, {1, -1, 3, 0});
+         },
+         "null"}, // height 2^31 + 2
+        // Turns and zooms: an empty block is a failed allocation; two negative sizes give a cleared one.
+        {[&] { return PXImage_Rotate90(&negs8); }, "-8x-3x8 zeros"},
+        {[&] { return PXImage_Rotate270(&negs8); }, "-8x-3x8 zeros"},
+        {[&] { return PXImage_Rotate90(&flat); }, "null"},
+        {[&] { return PXImage_Rotate90(&none); }, "null"},
+        {[&] { return PXImage_Rotate180(&negs24); }, "-16x-2x24 zeros"},
+        {[&] { return PXImage_Rotate180(&zeroW); }, "null"},
+        {[&] { return PXImage_ZoomIn(&negs24); }, "-32x-4x24 zeros"},
+        {[&] { return PXImage_ZoomIn(&negH); }, "null"},
+        {[&] { return PXImage_ZoomIn(&none); }, "null"},
+        {[&] { return PXImage_ZoomOut(&negs24); }, "-8x-1x24 zeros"},
+        {[&] { return PXImage_ZoomOut(&none); }, "8x3x24 zeros"},
+        {[&] { return PXImage_ZoomOut(&narrow); }, "null"},
+        {[&] { return PXImage_ZoomOut(&negH); }, "null"},
+        {[&] { return PXImage_ZoomOut(&zeroW); }, "null"},
+    };
+    for (const auto &[call, want] : cases) {
+        PX out(call());
+        EXPECT_EQ(px_shape(out.get()), want);
+    }
+    EXPECT_EQ(block, orig);
 }
 
 TEST(Crop, RoundsWidthUpAndRunsIntoFollowingRows) {
@@ -72,8 +167,6 @@ TEST(Crop, RoundsWidthUpAndRunsIntoFollowingRows) {
     PX all(PXImage_Crop(src.get(), &wide));
     EXPECT_EQ(all->width, 20);
     EXPECT_EQ(bytes(all.get()), bytes(src.get()));
-    const PXRect backwards{10, 3, 1, 1};
-    EXPECT_EQ(PXImage_Crop(src.get(), &backwards), nullptr);
 }
 
 TEST(Rotate, QuarterTurnsMapPixelsAndClearPadding) {
@@ -142,11 +235,47 @@ TEST(Zoom, RegionOfInterestScalesEachBytePlane) {
     EXPECT_EQ(bytes(dst.get()), bytes(want.get()));
     // Targets running past the block and gathers past the source stay inside.
     EXPECT_EQ(PXImage_ROI_Zoom(src.get(), dst.get(), &rect, 0.5, 25, 18), 1);
-    const PXRect flat{0, 0, 10, 0};
-    EXPECT_EQ(PXImage_ROI_Zoom(src.get(), dst.get(), &rect, 1e-14, 0, 0) +
-                  PXImage_ROI_Zoom(src.get(), dst.get(), &rect, -1.0, 0, 0) +
-                  PXImage_ROI_Zoom(src.get(), dst.get(), &flat, 1.0, 0, 0),
-              0);
+}
+
+// Degenerate pictures, rectangles and scales: the result, and whether the
+// rectangle at (3, 4) of the target was cleared (nothing gathered) or left.
+TEST(Zoom, RegionOfInterestOnDegenerateInput) {
+    PX src = px_random(16, 12, 32, 8);
+    std::vector<uint8_t> block(16 * 12 * 4, 5);
+    const PXImage none{16, 12, 32, nullptr}, zeroW{0, 12, 32, block.data()}, negH{16, -12, 32, block.data()};
+    const PXRect r{0, 8, 10, 0};
+    const struct {
+        const PXImage *from;
+        PXRect rect;
+        double scale;
+        int32_t result;
+        bool cleared;
+    } cases[] = {
+        {&none, r, 2.0, 1, true},
+        {&zeroW, r, 2.0, 1, true},
+        {&negH, r, 2.0, 1, true},
+        {src.get(), r, -1.0, 1, true},             // w' = -9, h' = -7: nothing gathered
+        {src.get(), {10, 0, 0, 8}, 2.0, 1, false}, // both sizes negative: nothing written
+        {src.get(), {0, 0, 10, 8}, 2.0, 0, false}, // one negative size: no output plane
+        {src.get(), {0, 8, 1, 0}, -1.0, 0, false}, // w' = 0: no gather plane
+        {src.get(), r, 1e300, 0, false},           // w' = 0
+        {src.get(), r, std::nan(""), 0, false},    // w' = 0
+        {src.get(), {0, 0, 0, -8}, 1.0, 0, false}, // width 0
+    };
+    for (const auto &c : cases) {
+        PX dst = px_make(30, 20, 32, 0xAA), want = px_clone(dst.get());
+        for (int y = 4; y < 12 && c.cleared; ++y)
+            std::memset(want->data + (y * 30 + 3) * 4, 0, 40);
+        EXPECT_EQ(PXImage_ROI_Zoom(c.from, dst.get(), &c.rect, c.scale, 3, 4), c.result) << c.scale;
+        EXPECT_EQ(bytes(dst.get()), bytes(want.get())) << c.scale;
+    }
+    // Targets without data or pixel rows take no writes.
+    PXImage noTarget{30, 20, 32, nullptr}, negTarget{30, -20, 32, block.data()};
+    const auto before = block;
+    EXPECT_EQ(PXImage_ROI_Zoom(src.get(), &noTarget, &r, 2.0, 3, 4) +
+                  PXImage_ROI_Zoom(src.get(), &negTarget, &r, 2.0, 3, 4),
+              2);
+    EXPECT_EQ(block, before);
 }
 
 TEST(Helpers, SimilaritySqrtAndPointInRect) {
@@ -156,6 +285,13 @@ TEST(Helpers, SimilaritySqrtAndPointInRect) {
     EXPECT_EQ(PXImage_IsSameImage(a.get(), b.get()) * 10 + PXImage_IsSameImage(words.get(), words.get()), 10);
     b->data[1] ^= 1;
     EXPECT_EQ(PXImage_IsSameImage(a.get(), b.get()), 0);
+    // Without pixel rows the sum is 0: 1 when the byte count is 0 or positive.
+    uint8_t block[64] = {};
+    const std::pair<PXImage, int32_t> rowless[] = {{{0, 7, 24, block}, 1}, {{-3, -2, 32, block}, 1},
+                                                   {{9, -7, 8, block}, 0}, {{INT_MIN, 7, 8, block}, 0},
+                                                   {{0, 7, 16, block}, 0}, {{0, 7, 8, nullptr}, 0}};
+    for (const auto &[im, want] : rowless)
+        EXPECT_EQ(PXImage_IsSameImage(&im, &im), want) << im.width << "x" << im.height;
 
     for (int32_t n : {0, 3, 4, 65535, 65536, 2147395599, 2147395600, 2147483647})
         EXPECT_EQ(px_sqrt(n), int32_t(std::floor(std::sqrt(double(n))))) << n;
