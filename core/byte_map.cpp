@@ -294,6 +294,4 @@ void tone_bytes_portable(const uint8_t *in, uint8_t *out, size_t pixels, int cha
         plain_tone<4>(in, out, pixels, t);
 }
 
-bool map_bytes_vectorised() { return pick<1>() != &plain<1>; }
-
 } // namespace pxfx

@@ -11,7 +11,6 @@
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
-#include "deform/deform_common.hpp"
 #include "deform/free_form.hpp"
 
 using namespace pxfx;
@@ -303,7 +302,9 @@ int32_t DeformationImage(Image *src, const DeformationPair *pairs, uint32_t coun
     if (src == nullptr || (n > 0 && pairs == nullptr)) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
+    // A reused result without a pixel block takes nothing; one of an empty
+    // size still gets the background over the block it claims.
+    if (out->bits == nullptr) return 1;
     return DeformationFunc(src, out, pairs, n);
 }
 

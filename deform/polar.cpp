@@ -8,7 +8,6 @@
 #include "core/internal/image_check.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
-#include "deform/deform_common.hpp"
 
 using namespace pxfx;
 

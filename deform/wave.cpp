@@ -13,7 +13,6 @@
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
-#include "deform/deform_common.hpp"
 
 using namespace pxfx;
 
@@ -156,8 +155,17 @@ int32_t render_wave(Image *src, Image *dst, const int16_t *map, int32_t, int32_t
 }
 
 uint32_t Wave_Transform(Image *src, Image **dst, int32_t amplitude) {
-    if (dst == nullptr || !has_pixels(src)) return 0;
+    if (dst == nullptr || src == nullptr || src->bits == nullptr || !rows_inside(src)) return 0;
     const int32_t w = src->width, h = src->height;
+    if (w <= 0 || h <= 0) {
+        // Nothing to ripple, but the map of height x stride x 2 bytes comes
+        // first (the stride being width + 3 rounded down to a multiple of 4):
+        // it has a size only when both sizes are negative, and then the
+        // result rule runs as usual.
+        const int64_t entries = ((int64_t{w} + 3) & ~int64_t{3}) * h;
+        if (entries <= 0 || entries > static_cast<int64_t>(kMaxBlockBytes) / 2) return 0;
+        return acquire_result(src, dst) != nullptr ? 1 : 0;
+    }
     Buffer<int16_t> map = alloc_zeroed<int16_t>(checked_size(static_cast<uint64_t>(h), map_stride(w)));
     if (!map) return 0;
     Image *out = acquire_result(src, dst);

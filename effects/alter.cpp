@@ -12,7 +12,7 @@ using namespace pxfx;
 
 namespace {
 
-// v + d clamped to 0..255; the sum wraps modulo 2^32 like the 32-bit original.
+// v + d clamped to 0..255; the sum wraps modulo 2^32, as 32-bit arithmetic does.
 uint8_t shifted(uint32_t v, int32_t d) { return clamp_u8(static_cast<int32_t>(v + static_cast<uint32_t>(d))); }
 
 // curve[i] = ((127 - w) i + w T[i] + 63) / 127 with w = |d|, low 8 bits kept.

@@ -3,6 +3,7 @@
 #include <pxfx/color.h>
 #include <pxfx/effects.h>
 
+#include <algorithm>
 #include <cstring>
 
 #include "core/internal/image_check.hpp"
@@ -105,6 +106,13 @@ template <class F, class TF> void glow(const Image *src, const Image *blur, Imag
 
 constexpr int32_t kGlowKernel[9] = {1, 2, 1, 2, 4, 2, 1, 2, 1};
 
+// Bytes of the block a record claims, pitch x height: none without a pixel
+// block or for a height below 1, and none for a claim above the largest block
+// the library handles. A reused result of an empty size may still claim rows.
+size_t claimed_bytes(const Image *im) {
+    return im->bits != nullptr && im->height > 0 && block_claim_ok(im) ? block_bytes(im) : 0;
+}
+
 } // namespace
 
 extern "C" {
@@ -112,12 +120,13 @@ extern "C" {
 uint32_t PX_IMG_Light_Alter(Image *src, Image **dst, uint32_t percent, uint32_t channel) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
+    // The copy and the clearing work on whole blocks, which a result of an
+    // empty size may have.
     if (percent == 100) {
         PX_Img_Copy(out, src);
     } else if (percent == 0) {
-        std::memset(out->bits, 0, block_bytes(out));
-    } else {
+        if (const size_t n = claimed_bytes(out); n > 0) std::memset(out->bits, 0, n);
+    } else if (has_pixels(out)) {
         map_channels(src, out, light_tables(percent, channel));
     }
     return 1;
@@ -128,14 +137,15 @@ uint32_t PX_IMG_Ballance(Image *src, Image **dst, int32_t contrast) {
     contrast_table(contrast, t.b);
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
     if (contrast == 0) {
-        // A plain byte copy of the blocks; a result with a larger block than
-        // the source's keeps its bytes beyond the source's block.
-        const size_t n = block_bytes(out) < block_bytes(src) ? block_bytes(out) : block_bytes(src);
-        std::memcpy(out->bits, src->bits, n);
+        // A plain byte copy of the blocks, also of records of an empty size
+        // that claim rows; a result with a larger block than the source's
+        // keeps its bytes beyond the source's block.
+        const size_t n = std::min(claimed_bytes(out), claimed_bytes(src));
+        if (n > 0) std::memmove(out->bits, src->bits, n);
         return 1;
     }
+    if (!has_pixels(out)) return 1;
     std::memcpy(t.g, t.b, 256);
     std::memcpy(t.r, t.b, 256);
     map_channels(src, out, t);

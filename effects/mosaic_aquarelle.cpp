@@ -42,6 +42,19 @@ template <class F> void mosaic(const Image *src, Image *dst, int64_t n) {
     }
 }
 
+// A negative n: only a picture one pixel wide gets a row of block colours
+// (see PX_IMG_Mosaic), and its pixel lies in block 0 / n = 0. That block is
+// refilled every -n rows from y0 with the colour at (n / 2, y0 + n / 2),
+// clamped.
+void mosaic_column(const Image *src, Image *dst, int32_t n) {
+    const int32_t half = n / 2;
+    uint32_t c = 0;
+    for (int32_t y = 0; y < src->height; ++y) {
+        if (y % n == 0) c = GetPixelColor(src, half, y + half);
+        SetPixelColor(dst, 0, y, c);
+    }
+}
+
 // Each pixel takes the colour at (x + a, y + b), clamped, for two draws a, b
 // of PX_rand(range) in that order; a is reset to 0 when either is negative.
 template <class F> void aquarelle(const Image *src, Image *dst, int32_t range) {
@@ -63,11 +76,16 @@ template <class F> void aquarelle(const Image *src, Image *dst, int32_t range) {
 extern "C" {
 
 uint32_t PX_IMG_Mosaic(Image *src, Image **dst, int32_t n) {
-    if (n < 1) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
+    // The row of block colours has (width + n - 1) / n entries: none for
+    // n = 0 (no block size), and a row of no entries or fewer cannot be had.
+    if (n == 0 || (int64_t{src->width} + n - 1) / n <= 0) return 0;
     if (!has_pixels(out)) return 1;
-    with_format(src->bitCount, [&](auto f) { mosaic<decltype(f)>(src, out, n); });
+    if (n > 0)
+        with_format(src->bitCount, [&](auto f) { mosaic<decltype(f)>(src, out, n); });
+    else
+        mosaic_column(src, out, n);
     return 1;
 }
 

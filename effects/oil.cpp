@@ -143,10 +143,11 @@ constexpr int32_t kHslMode = 1;
 extern "C" {
 
 uint32_t imOil(Image *src, Image **dst, int32_t r) {
-    if (r < 0) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
-    if (2 * static_cast<int64_t>(r) >= src->width || 2 * static_cast<int64_t>(r) >= src->height) return 0;
+    // A negative radius leaves no first interior pixel at which the window
+    // would be set up: refused like a window larger than the picture.
+    if (r < 0 || 2 * static_cast<int64_t>(r) >= src->width || 2 * static_cast<int64_t>(r) >= src->height) return 0;
     if (!has_pixels(out)) return 1;
     return with_format(src->bitCount, [&](auto f) { return oil_with_sums<decltype(f)>(src, out, r); }) ? 1 : 0;
 }

@@ -137,8 +137,18 @@ extern "C" uint32_t PX_IMG_Photocopy(Image *src, Image **dst) {
     if (src == nullptr) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
     const int32_t w = src->width, h = src->height;
+    if (w <= 0 || h <= 0) {
+        // Nothing to draw, but the work buffer of 5 x stride x height + 8000
+        // bytes (the stride being the width rounded up to a multiple of 4) is
+        // still needed; when its size is not positive it cannot be had, and
+        // the result is released.
+        const int64_t plane = ((int64_t{w} + 3) & ~int64_t{3}) * h; // 5 * plane + 8000 > 0: plane > -1600
+        if (plane > -1600 && plane <= (static_cast<int64_t>(kMaxBlockBytes) - 8000) / 5) return 1;
+        free_Image(dst, 0);
+        return 0;
+    }
+    if (!has_pixels(out)) return 1;
     const int32_t s = static_cast<int32_t>((static_cast<int64_t>(w) + 3) & ~int64_t{3});
     const size_t plane = checked_size(static_cast<uint64_t>(s), static_cast<uint64_t>(h));
     Buffer<uint8_t> g = alloc_zeroed<uint8_t>(plane);

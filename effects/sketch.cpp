@@ -117,8 +117,15 @@ uint32_t sketch(Image *src, Image **dst, bool withEdges) {
     if (src == nullptr) return 0;
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
     const int32_t w = src->width, h = src->height;
+    if (w <= 0 || h <= 0) {
+        // Nothing to draw, but the work buffer of planes x width x height
+        // bytes is still needed: a size of 0 or below cannot be had (0, the
+        // prepared result kept), a positive one (both sizes negative) can.
+        const int64_t plane = int64_t{w} * h, planes = withEdges ? 4 : 3;
+        return plane > 0 && plane <= static_cast<int64_t>(kMaxBlockBytes) / planes ? 1 : 0;
+    }
+    if (!has_pixels(out)) return 1;
     const size_t plane = static_cast<size_t>(w) * h;
     // The planes share one allocation so that temp_ex's read past the gray
     // plane lands in the edge plane; it starts zeroed for a defined first read.

@@ -112,15 +112,6 @@ bool for_each_window(const uint8_t *plane, size_t stride, int32_t w, int32_t h, 
     return true;
 }
 
-// Calls fn(FS{}, FD{}) with the formats of a source and its result: one
-// specialisation when the bit counts agree, the accessors otherwise.
-template <class Fn> void with_formats(const Image *src, const Image *dst, Fn &&fn) {
-    if (src->bitCount == dst->bitCount)
-        with_format(src->bitCount, [&](auto f) { fn(f, f); });
-    else
-        fn(AnyFormat{}, AnyFormat{});
-}
-
 // c + weight * d in double precision, above 255.0 set to 255, else truncated.
 inline uint32_t lift_channel(uint32_t c, uint32_t d, double weight) {
     const double v = static_cast<double>(c) + weight * static_cast<double>(d);

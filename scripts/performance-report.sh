@@ -2,7 +2,7 @@
 # Builds pxfx_bench (Release), runs it once with JSON output and writes
 # docs/performance.md from the run. Extra arguments go to the benchmark binary
 # (for example --benchmark_filter=Resize). The run is kept in
-# build-bench/last-run.json for tools/bench_compare.py; PXFX_BENCH_BASELINE=run.json
+# build-bench/last-run.json for scripts/bench_compare.py; PXFX_BENCH_BASELINE=run.json
 # adds each family's change since that earlier run to the report.
 set -euo pipefail
 cd "$(dirname "$0")/.."
@@ -13,6 +13,6 @@ cmake --build "$build" -j2 --target pxfx_bench
 "$build/bench/pxfx_bench" --benchmark_min_time="$min_time" \
   --benchmark_out="$build/last-run.json" --benchmark_out_format=json "$@"
 mkdir -p docs
-python3 tools/perf_report.py "$build/last-run.json" -o docs/performance.md \
+python3 scripts/perf_report.py "$build/last-run.json" -o docs/performance.md \
   ${PXFX_BENCH_BASELINE:+--baseline "$PXFX_BENCH_BASELINE"}
 echo "wrote docs/performance.md from $build/last-run.json"

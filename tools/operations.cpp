@@ -71,7 +71,6 @@ Image *convert_to(const Image *in, uint32_t bitCount) {
 
 Image *convert_for(const Operation &op, const Image *in) {
     if (op.formats & format_of(in->bitCount)) return convert_to(in, in->bitCount);
-    if (in->bitCount == 32 && (op.formats & kBgr24)) return convert_to(in, 24);
     if (op.formats & kBgr24) return convert_to(in, 24);
     if (op.formats & kBgra32) return convert_to(in, 32);
     if (op.formats & kGray8) return convert_to(in, 8);

@@ -1,7 +1,7 @@
 // The operation table: one entry per exported image operation, with its
 // parameters, the formats it accepts and how to call it. The command-line tool,
 // the gallery and the tests all iterate this table; adding an operation means
-// adding one entry in operations.cpp.
+// adding one entry in the ops_*.cpp file of its subsystem.
 #pragma once
 
 #include <pxfx/pxfx.h>

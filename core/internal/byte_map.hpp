@@ -1,8 +1,8 @@
 // Byte tables over rows of interleaved channels: byte k of every pixel goes
 // through tables[k]. The per-channel maps of the tone effects, the curve
-// filters and the retouching curves all end here, so the one routine that
-// does the lookups can use the widest table-lookup instructions the machine
-// has. Every path gives the same bytes as the plain loop.
+// filters and most retouching curves end here, so the one routine that does
+// the lookups can use the widest table-lookup instructions the machine has.
+// Every path gives the same bytes as the plain loop.
 #pragma once
 
 #include <cstddef>
@@ -29,8 +29,5 @@ struct ToneTables {
 };
 void tone_bytes(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const ToneTables &t);
 void tone_bytes_portable(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const ToneTables &t);
-
-// Whether map_bytes uses vector table lookups on this machine and build.
-bool map_bytes_vectorised();
 
 } // namespace pxfx

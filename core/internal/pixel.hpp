@@ -144,13 +144,16 @@ template <class Fn> decltype(auto) with_format(uint32_t bitCount, Fn &&fn) {
     }
 }
 
-// Clamped reads, as GetPixelColor does, for border code of a known format.
-template <class F> struct Sampler {
-    const Image *im;
-    int32_t w, h;
-    explicit Sampler(const Image *image) : im(image), w(image->width), h(image->height) {}
-    uint32_t at(int32_t x, int32_t y) const { return F::load(F::crow(im, clamp_coord(y, h)), clamp_coord(x, w)); }
-};
+// Calls fn(SrcFormat{}, DstFormat{}) for a copy from one record into another.
+// Records of one bit count share their direct format; records that differ (a
+// 1- or 4-bit source whose result was made with 8 bits, say) both go through
+// the accessors, which convert.
+template <class Fn> void with_formats(const Image *src, const Image *dst, Fn &&fn) {
+    if (src->bitCount == dst->bitCount)
+        with_format(src->bitCount, [&](auto f) { fn(f, f); });
+    else
+        fn(AnyFormat{}, AnyFormat{});
+}
 
 // The pixels a kernel reads from a record that may have no pixel block. The
 // pixel readers read such a record as 0; for the byte formats (8, 16, 24 and

@@ -1,5 +1,5 @@
-// The result-image rule shared by effects, deformations and the retouch and
-// line tools that fill a caller's slot.
+// The result-image rule shared by effects, deformations and the retouch tools
+// that fill a caller's slot.
 #pragma once
 
 #include <pxfx/core.h>
