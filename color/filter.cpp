@@ -183,6 +183,7 @@ struct Job {
     const Image *src; // 8-bit for an 8-bit destination, else 24- or 32-bit
     Image *dst;
     const Image *mask; // selects pixels of an 8-bit destination; may be null
+    size_t maskBytes;  // bytes of the block the mask claims (0 without pixels)
     int32_t width, height;
     int32_t lastDx, lastDy; // the bottom-right tap, whose alpha a 32-bit result takes
     bool anyTap;
@@ -190,11 +191,12 @@ struct Job {
     Finish finish;
 };
 
-// Mask byte at (x, y) read from the mask's rows; bytes beyond its block count
-// as set.
-bool selected(const Image *mask, int32_t x, int32_t y) {
-    if (y >= mask->height || static_cast<uint32_t>(x) >= mask->pitch) return true;
-    return row_ptr(mask, y)[x] != 0;
+// Mask byte at (x, y) read from the mask's rows, y * pitch + x bytes into its
+// block (past the end of a row, the next row's bytes); bytes beyond the block
+// it claims, and all bytes of a mask without one, count as set.
+bool selected(const Job &job, int32_t x, int32_t y) {
+    const uint64_t at = static_cast<uint64_t>(y) * job.mask->pitch + static_cast<uint64_t>(x);
+    return at >= job.maskBytes || job.mask->bits[at] != 0;
 }
 
 template <class T> void filter_index(const Job &job, const Taps &taps, T *acc) {
@@ -207,7 +209,7 @@ template <class T> void filter_index(const Job &job, const Taps &taps, T *acc) {
             const int32_t x1 = std::min(job.width, x0 + kChunk);
             accumulate<1>(src, taps, y, x0, x1, acc);
             for (int32_t x = x0; x < x1; ++x) {
-                if (job.mask != nullptr && !selected(job.mask, x, y))
+                if (job.mask != nullptr && !selected(job, x, y))
                     out[x] = own[std::min(x, src->width - 1)];
                 else
                     out[x] = finish(acc[x - x0]);
@@ -295,16 +297,26 @@ bool overlaps(const Image *a, const Image *b) {
 // A source readable by the row loops: the picture itself when its format is
 // `want` (or 24/32 for colour), else a copy made through the pixel readers
 // (GetPixelIndex for index work, GetPixelColor as 32 bits for colour work).
+// A picture of an empty size reads as 0 everywhere: one zero pixel, which the
+// clamped reads repeat. A direct source sharing pixels with dst is read from a
+// snapshot.
 struct Source {
     Image view{};
     ImagePtr converted;
     Buffer<uint8_t> snapshot;
 
-    bool prepare(const Image *src, bool index, bool mustCopy) {
+    bool prepare(const Image *src, bool index, const Image *dst) {
+        if (src->width <= 0 || src->height <= 0) {
+            converted = make_image(1, 1, index ? 8 : 32);
+            if (!converted) return false;
+            std::memset(converted->bits, 0, converted->pitch);
+            view = *converted;
+            return true;
+        }
         view = *src;
         const bool direct = index ? src->bitCount == 8 : (src->bitCount == 24 || src->bitCount == 32);
         if (direct) {
-            if (!mustCopy) return true;
+            if (!overlaps(src, dst)) return true;
             snapshot = alloc_buffer<uint8_t>(block_bytes(src));
             if (!snapshot) return false;
             std::memcpy(snapshot.get(), src->bits, block_bytes(src));
@@ -328,18 +340,25 @@ struct Source {
     }
 };
 
+// Filters src into dst (a record with pixels); src has a pixel block and may
+// be of an empty size. The kernel is checked only where taps are read.
 int32_t run_filter(const Image *src, const int32_t *kernel, int32_t size, int32_t divisor, int32_t offset,
                    const Image *mask, Image *dst, int32_t gray) {
     const uint32_t bits = dst->bitCount;
     if (bits != 8 && bits != 24 && bits != 32) return 1;
-    if (mask != nullptr && !has_pixels(mask)) mask = nullptr;
+    // An 8-bit mask limits the area to its size, with or without pixels; a
+    // mask whose rows overrun its block is ignored.
+    if (mask != nullptr && !rows_inside(mask)) mask = nullptr;
     int32_t width = dst->width, height = dst->height;
     if (mask != nullptr && mask->bitCount == 8) {
         width = std::min(width, mask->width);
         height = std::min(height, mask->height);
     }
+    if (width <= 0 || height <= 0) return 1;
+    if (size > 0 && (kernel == nullptr || checked_size(static_cast<uint64_t>(size), static_cast<uint64_t>(size)) == 0))
+        return 0;
     Source source;
-    if (!source.prepare(src, bits == 8, overlaps(src, dst))) return 0;
+    if (!source.prepare(src, bits == 8, dst)) return 0;
     const Taps taps(kernel, size, std::max(width, src->width), std::max(height, src->height));
     if (!taps.ok) return 0;
     Finish finish{divisor == 0 ? 0.0 : static_cast<double>(divisor), offset};
@@ -366,16 +385,13 @@ int32_t run_filter(const Image *src, const int32_t *kernel, int32_t size, int32_
             if (exact) finish.mul = static_cast<uint16_t>(mul);
         }
     }
-    Job job{&source.view,
-            dst,
-            bits == 8 ? mask : nullptr,
-            width,
-            height,
-            size - size / 2 - 1,
-            size - size / 2 - 1,
-            size > 0,
-            gray >= 1,
-            finish};
+    const Image *selector = bits == 8 ? mask : nullptr;
+    const size_t maskBytes =
+        selector != nullptr && selector->bits != nullptr && selector->height > 0 && block_claim_ok(selector)
+            ? block_bytes(selector)
+            : 0;
+    const int32_t last = size - size / 2 - 1; // offset of the bottom-right tap
+    Job job{&source.view, dst, selector, maskBytes, width, height, last, last, size > 0, gray >= 1, finish};
     // 16-bit sums when the table covers them: twice as many per vector.
     auto run = [&](auto zero) {
         using T = decltype(zero);
@@ -406,7 +422,6 @@ const int32_t kEmboss[9] = {0, 0, -1, 0, 0, 0, 1, 0, 0};
 
 int32_t kernel_effect(const Image *src, Image **out, const int32_t *kernel, int32_t divisor, int32_t offset,
                       int32_t gray) {
-    if (src == nullptr || out == nullptr || !has_pixels(src)) return 0;
     Image *dst = acquire_result(src, out);
     if (dst == nullptr) return 0;
     return Filter(const_cast<Image *>(src), kernel, 3, divisor, offset, nullptr, dst, gray);
@@ -418,14 +433,15 @@ extern "C" {
 
 int32_t Filter(Image *src, const int32_t *kernel, int32_t size, int32_t divisor, int32_t offset, const Image *mask,
                Image *dst, int32_t gray) {
-    if (!has_pixels(src)) return 0;
-    if (size > 0 && (kernel == nullptr || checked_size(static_cast<uint64_t>(size), static_cast<uint64_t>(size)) == 0))
-        return 0;
+    if (src == nullptr || src->bits == nullptr || !rows_inside(src)) return 0;
     if (dst != nullptr) {
-        // A destination without pixels, or of an empty size, takes nothing.
+        // A destination without pixels, or of an empty size, takes nothing;
+        // a source of an empty size reads as 0.
         if (!rows_inside(dst)) return 0;
         return has_pixels(dst) ? run_filter(src, kernel, size, divisor, offset, mask, dst, gray) : 1;
     }
+    // In place: the working image of the source's size cannot be made for an
+    // empty size.
     ImagePtr work = make_image(src->width, src->height, static_cast<int32_t>(src->bitCount));
     if (!work || run_filter(src, kernel, size, divisor, offset, mask, work.get(), gray) == 0) return 0;
     PX_Img_Copy(src, work.get());

@@ -100,11 +100,16 @@ PXFX_API extern const float matrixX[10][21];
  *  - Writes into dst (any size: its width x height is processed), or with dst
  *    null into a working image that is then copied back into src and released
  *    whole (record and pixels). A dst whose pixels overlap src's is filtered
- *    from a snapshot of src, as if it were a separate image.
- *  - An 8-bit mask limits the processed area to its width x height. For an
- *    8-bit result the mask also selects: where its byte is 0 the source index
- *    is copied; a mask of another bit count only selects, bytes outside its
- *    rows counting as set. A mask without pixels is ignored.
+ *    from a snapshot of src, as if it were a separate image. A src of an empty
+ *    size (with a pixel block) reads as 0 everywhere: a given dst then gets
+ *    the clamped offset (alpha 0 at 32 bits).
+ *  - An 8-bit mask limits the processed area to its width x height, also
+ *    without pixels or of an empty size (then nothing is processed: a given
+ *    dst is unchanged, in place src takes the white working image). For an
+ *    8-bit result every mask selects: where its byte y * pitch + x (past a
+ *    row's end, the next row's) is 0 the source index is copied; bytes beyond
+ *    the block it claims, and all of a mask without pixels, count as set. A
+ *    mask whose rows overrun its block is ignored.
  *  - 8-bit results read the source as GetPixelIndex does, 24- and 32-bit ones
  *    as GetPixelColor does; gray >= 1 writes (B + 2G + R) >> 2 to all three
  *    channels. A 32-bit result takes the alpha of the bottom-right tap's pixel
@@ -112,16 +117,21 @@ PXFX_API extern const float matrixX[10][21];
  *    alpha when size <= 0 (no taps: every channel is the clamped offset).
  *  - Other result bit counts are not written (in place, a 16-bit src thus
  *    turns white).
- * Returns 1, or 0 when src has no pixels (or an empty size, or rows its block
- * cannot hold), a given dst's rows overrun its block, the kernel is null with
- * size > 0, size * size exceeds 2^31 - 1, or memory runs out. A given dst
- * without a pixel block or of an empty size takes nothing (1). */
+ * Returns 1, or 0 when src or its pixel block is null, src's or a given dst's
+ * rows overrun their block, src has an empty size with dst null (no working
+ * image of that size), memory runs out, or taps are to be read (a non-empty
+ * area of an 8-, 24- or 32-bit result) while the kernel is null with
+ * size > 0 or size * size exceeds 2^31 - 1. A given dst without a pixel block
+ * or of an empty size takes nothing (1). */
 PXFX_API int32_t Filter(Image *src, const int32_t *kernel, int32_t size, int32_t divisor, int32_t offset,
                         const Image *mask, Image *dst, int32_t gray);
 /* 3 x 3 mean into *out (reused when its width, height and bit count match,
- * else replaced). Result of Filter, or 0 for a null src or out, or a src
- * without pixels; when Filter's working memory cannot be had, 0 with the
- * prepared result left in *out. The three below follow the same rules. */
+ * else replaced). Result of Filter, or 0 for a null src or out, a src without
+ * a pixel block, or when no result of src's size can be made (an empty size
+ * with no matching record in *out); a reused record of an empty size or
+ * without pixels takes nothing (1). When Filter's working memory cannot be
+ * had, 0 with the prepared result left in *out. The three below follow the
+ * same rules. */
 PXFX_API int32_t PX_IMG_Blur(const Image *src, Image **out);
 /* 3 x 3 soften (centre weight 8, divisor 16) into *out. */
 PXFX_API int32_t PX_IMG_Soften(const Image *src, Image **out);
@@ -139,11 +149,12 @@ PXFX_API int32_t PX_IMG_Emboss1(const Image *src, Image **out);
  * too. The result is that of a new white working image copied back with
  * PX_Img_Copy: an image with malloc_Image's pitch takes the whole block, so its
  * row padding becomes 255; one with another pitch takes the pixels only, and a
- * 32-bit one then keeps its own alpha. A 16-bit image (or any other bit count
- * of 8 or more) is not smoothed: it receives the untouched white working image,
- * as the filter always did, and the call returns 1. A negative size makes every
- * box empty: each channel becomes the offset, clamped. Sums are exact at every
- * size (no 32-bit wrap). Images with malloc_Image's pitch are smoothed in place,
+ * 32-bit one then keeps its own alpha. Other bit counts of 8 or more are not
+ * smoothed and the call returns 1: a 16-bit image receives the untouched white
+ * working image (pixels only for another pitch); one of a bit count without a
+ * pixel layout (12, 48, ...) takes the converting copy, which writes nothing.
+ * A negative size makes every box empty: each channel becomes the offset,
+ * clamped. Sums are exact at every size (no 32-bit wrap). Images with malloc_Image's pitch are smoothed in place,
  * keeping only the source rows still needed (size / 2 + 2 rows); when that
  * memory cannot be had a whole working image is used instead.
  * Returns 1 when processed, 0 (image unchanged) when the image is null, has
@@ -155,8 +166,9 @@ PXFX_API int32_t Filter_fast(Image *image, int32_t size, int32_t offset);
  * else src is copied into *out (created when null; an existing image is used
  * whatever its size and bit count, one without pixels taking nothing) and *out
  * smoothed (a picture Filter_fast refuses, such as one of fewer than 8 bits or
- * of an empty size, is left as it is). Returns 1, or 0 when src or its pixel
- * block is null, its rows overrun its block, or *out cannot be made; also 0
+ * of an empty size, is left as it is: a src of an empty size smoothed in place
+ * gives 1). Returns 1, or 0 when src or its pixel block is null, its rows
+ * overrun its block, or *out cannot be made (an empty size among them); also 0
  * when the smoothing's working
  * image cannot be made: src is then unchanged, an *out made by the call
  * released (null), an existing *out left holding the plain copy. */

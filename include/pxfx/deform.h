@@ -60,8 +60,13 @@ PXFX_API uint32_t Bathroom_Transform(Image *src, Image **dst);
 /* ---- Wave ------------------------------------------------------------------------- */
 
 /* Concentric ripples of the given amplitude, fading to the farthest corner. 1 or 0:
- * 0 for a null slot, a source without pixels, or a failed allocation of the
- * map (2 bytes per entry, over 2^31 - 1 bytes counts as failed) or the result.
+ * 0 for a null slot, a source without a pixel block or whose rows overrun its
+ * block, or a failed allocation of the map (2 bytes per entry, over 2^31 - 1
+ * bytes counts as failed) or the result. The map, height x stride entries
+ * with the stride width + 3 rounded down to a multiple of 4, is made before
+ * the result rule: for a source of an empty size it has no size (0, slot
+ * untouched) unless both sizes are negative; then the result rule alone
+ * decides (1 with a matching record in the slot, nothing drawn).
  * Products of amplitude and distance wrap as create_wave describes (keep
  * amplitude x half diagonal below about 21474 for a clean wave). */
 PXFX_API uint32_t Wave_Transform(Image *src, Image **dst, int32_t amplitude);
@@ -88,9 +93,12 @@ PXFX_API int32_t render_wave(Image *src, Image *dst, const int16_t *map, int32_t
 
 /* Rigid moving-least-squares warp of src by `count` control pairs into *dst. 1 or 0.
  * Refused with 0 and the slot untouched: a null source, pairs null while count
- * is non-zero (up to 2^31 - 1), a null slot or a source without pixels. A count
- * above 2^31 - 1 reaches the warp as a negative one: no pair. A result image
- * without pixels (a reused one, or of an empty size) is drawn into by nothing.
+ * is non-zero (up to 2^31 - 1), a null slot, or a source without a pixel
+ * block or whose rows overrun its block. A count above 2^31 - 1 reaches the
+ * warp as a negative one: no pair. A source of an empty size needs a matching
+ * record in the slot (no new result of its size can be made: 0); that record
+ * gets DeformationFunc's black background over the block it claims. A reused
+ * result without a pixel block is drawn into by nothing (1).
  * After the result rule, DeformationFunc's result is returned: on its failure
  * (working memory) the slot holds the result image unwarped. */
 PXFX_API int32_t DeformationImage(Image *src, const DeformationPair *pairs, uint32_t count, Image **dst);

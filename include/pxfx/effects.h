@@ -9,6 +9,13 @@
  * 255). The caller owns the result. A null source gives 0 in every effect of
  * this library. Source and result must be different images.
  *
+ * Degenerate records: a reused image without pixels is drawn into by nothing
+ * (1). A source of an empty size (with a pixel block) gets 0 when no result of
+ * its size can be made; with a matching record in the slot, which is reused,
+ * an effect returns what its steps give: 1 with nothing drawn, unless it says
+ * otherwise below (a work buffer whose size comes out as 0 or less cannot be
+ * had).
+ *
  * Sources of any bit count are accepted unless an effect says otherwise: they
  * are read as GetPixelColor reads them (bit counts other than 1, 4, 8, 16, 24
  * and 32 read as opaque black), and a new result has the bit count that
@@ -35,13 +42,19 @@ PXFX_API uint32_t PX_IMG_Emboss(Image *src, Image **dst);
 /* ---- Photocopy and sketch --------------------------------------------------------- */
 
 /* Local-contrast thresholding to a photocopy look, with the source's alpha. The
- * work buffer is released (this implementation does not keep it). 1 or 0. */
+ * work buffer is released (this implementation does not keep it). 1 or 0; a
+ * source of an empty size whose work buffer, 5 x stride x height + 8000 bytes
+ * (the stride being the width rounded up to a multiple of 4), comes out as 0
+ * or less (an INT_MIN width, say) gives 0 with the result released, as when
+ * the buffer cannot be had. */
 PXFX_API uint32_t PX_IMG_Photocopy(Image *src, Image **dst);
 /* Pencil sketch: colour dodge of gray with its blurred negative, darkened along
- * edges; alpha 0. 1 or 0 (a work-buffer failure leaves the prepared result). */
+ * edges; alpha 0. 1 or 0 (a work-buffer failure leaves the prepared result).
+ * The work buffer is 4 x width x height bytes: a source of an empty size gives
+ * 0 (the reused result kept), unless both sizes are negative (1). */
 PXFX_API uint32_t PX_IMG_Sketch(Image *src, Image **dst);
-/* Pencil sketch without the edge term; alpha 0. 1 or 0 (a work-buffer failure
- * leaves the prepared result). */
+/* Pencil sketch without the edge term; alpha 0. As PX_IMG_Sketch, with a work
+ * buffer of 3 x width x height bytes. */
 PXFX_API uint32_t PX_IMG_Sketch_1(Image *src, Image **dst);
 /* Kernel sum at (col, row) of a byte plane, the kernel read column by column;
  * column `width` is read (the next row's first byte), so the plane must be
@@ -73,13 +86,18 @@ PXFX_API uint32_t my(Image *src, Image **dst);
 /* Scales red (channel 0), green (1), blue (2) or all three (other) by percent:
  * (percent * v) / 100 capped at 255, the product formed exactly (no 32-bit
  * wrap for huge percentages). Percent 100 copies the source with PX_Img_Copy;
- * percent 0 clears every byte of the result (alpha and padding included). 1 or 0. */
+ * percent 0 clears every byte of the result (alpha and padding included).
+ * Both work on whole blocks: a reused result of an empty size is copied into
+ * or cleared over the block it claims (pitch x height bytes, none for a height
+ * below 1). 1 or 0. */
 PXFX_API uint32_t PX_IMG_Light_Alter(Image *src, Image **dst, uint32_t percent, uint32_t channel);
 /* Contrast about mid-gray by a percent through a 256-entry table:
  * trunc((v - 128) * f + 128) clamped, f = (contrast + 100) / 100, all in
  * single precision (contrast + 100 formed without overflow): contrast 5 takes
  * 188 to 191, 228 to 233, 248 to 254. Contrast 0 copies the pixel block byte
- * for byte (only as many bytes as both blocks hold). 1 or 0. */
+ * for byte (only as many bytes as both blocks hold, blocks of records of an
+ * empty size included: pitch x height bytes, none for a height below 1). 1 or
+ * 0. */
 PXFX_API uint32_t PX_IMG_Ballance(Image *src, Image **dst, int32_t contrast);
 /* Soft glow: a 1-2-1 Gaussian blur of the source (Filter) taken to half
  * brightness and +5 % contrast as PX_IMG_Light_Alter and PX_IMG_Ballance
@@ -87,16 +105,21 @@ PXFX_API uint32_t PX_IMG_Ballance(Image *src, Image **dst, int32_t contrast);
  * halving and contrast steps are applied in the same pass as the blend (with
  * the rounding of the intermediate format), so the only working image is the
  * blurred one, released on every path. The blur is made before the result
- * slot is touched: when its memory cannot be had, 0 with nothing changed.
- * 1 or 0. */
+ * slot is touched: when its memory cannot be had, 0 with nothing changed (so
+ * always for a source of an empty size). 1 or 0. */
 PXFX_API uint32_t PX_IMG_Lambency(Image *src, Image **dst);
 
 /* ---- Textures --------------------------------------------------------------------- */
 
 /* Square blocks of n pixels, each the colour of its centre; partial blocks at
  * the right and bottom sample halfway between the nominal centre and the
- * edge. n < 1 gives 0 before anything is touched; any n >= 1 works (a block
- * larger than the picture is one block). No working buffer. 1 or 0. */
+ * edge. Any n >= 1 works (a block larger than the picture is one block). No
+ * working buffer is made, but its size decides: after the result rule, 0 (the
+ * prepared result kept) when n is 0 or the row of block colours,
+ * (width + n - 1) / n entries, has none (a width of 0 or less). A negative n
+ * leaves entries only for a picture one pixel wide: its pixel in row y takes
+ * the colour at (n / 2, y0 + n / 2), clamped, y0 being y rounded down to a
+ * multiple of -n. 1 or 0. */
 PXFX_API uint32_t PX_IMG_Mosaic(Image *src, Image **dst, int32_t n);
 /* Random jitter: pixel (x, y) takes the colour at (x + a, y + b), clamped to
  * the picture, with a = PX_rand(range) then b = PX_rand(range) drawn per pixel
@@ -105,8 +128,9 @@ PXFX_API uint32_t PX_IMG_Mosaic(Image *src, Image **dst, int32_t n);
 PXFX_API uint32_t PX_IMG_Aquarelle(Image *src, Image **dst, int32_t range);
 /* Oil painting: mean colour of the dominant intensity class in a (2r+1)^2
  * window; pixels closer than r to an edge are copied. Interior pixels keep the
- * source pixel's alpha. r < 0 gives 0 before anything is touched; 2r >= width
- * or height gives 0 with the prepared (unwritten) result left in the slot.
+ * source pixel's alpha. r < 0 (no window to start from), 2r >= width or
+ * 2r >= height (so any empty size) give 0 with the prepared (unwritten) result
+ * left in the slot.
  * Needs 32 sums per column of working memory (r > 0); if that cannot be had,
  * 0 with the prepared result in the slot. 1 or 0. */
 PXFX_API uint32_t imOil(Image *src, Image **dst, int32_t r);

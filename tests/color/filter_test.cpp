@@ -7,6 +7,7 @@
 #include <climits>
 #include <cmath>
 #include <cstring>
+#include <functional>
 #include <random>
 #include <vector>
 
@@ -25,6 +26,13 @@ struct Params {
 
 const int32_t kSizes[][2] = {{1, 1}, {1, 7}, {7, 1}, {2, 3}, {5, 4}, {13, 9}};
 
+// Mask byte y * pitch + x of the mask's block (past a row's end, the next
+// row's) is 0; bytes beyond the block, or of a mask without one, are set.
+bool masked_out(const Image *m, int32_t x, int32_t y) {
+    const size_t at = size_t(y) * m->pitch + size_t(x);
+    return m->bits && m->height > 0 && at < size_t(m->pitch) * size_t(m->height) && m->bits[at] == 0;
+}
+
 // Filter into d, pixel by pixel with the accessors (32-bit wrapping sums);
 // 8-bit pictures as one channel with a mask, colour ones with the grey mix;
 // box smoothing filters the alpha byte too.
@@ -34,7 +42,7 @@ void reference_filter(const Image *src, const Params &p, const Image *mask, Imag
     const int32_t half = p.size / 2, last = p.size - half - 1, gray = d->bitCount == 8;
     for (int32_t y = 0; y < h && d->bitCount != 16; ++y)
         for (int32_t x = 0; x < w; ++x) {
-            if (gray && mask && y < mask->height && x < int32_t(mask->pitch) && mask->bits[y * mask->pitch + x] == 0) {
+            if (gray && mask && masked_out(mask, x, y)) {
                 SetPixelIndex(d, x, y, GetPixelIndex(src, x, y));
                 continue;
             }
@@ -127,6 +135,52 @@ TEST(Filter, MatchesAccessorVersionAliasingAndRefusals) {
               0);
 }
 
+// Sources of an empty size read as 0. An 8-bit mask limits the area to its
+// size, also without pixels or of an empty size; for an 8-bit result every
+// mask selects by its bytes (see masked_out). The kernel is read only where a
+// pixel is filtered.
+TEST(Filter, DegenerateSourcesMasksAndKernels) {
+    std::vector<uint8_t> bytes(28 * 7), other(28 * 7, 0x5A);
+    for (size_t i = 0; i < bytes.size(); ++i)
+        bytes[i] = uint8_t(i % 3);
+    Image emptyW{0, 7, 24, bytes.data(), 28, 0}, emptyH{9, -7, 24, bytes.data(), 28, 0};
+    const Image hollowMask{4, 3, 8, nullptr, 4, 0}, flatMask{0, 5, 8, bytes.data(), 4, 0},
+        narrowMask{2, 2, 16, bytes.data(), 4, 0}; // claims 8 bytes: rows 0 and 1 of a 6-wide result
+    Owned src = random_image(9, 7, 24, 3);
+    const Params p{{1, 2, 1, 2, 4, 2, 1, 2, 1}, 3, 16, 40, 0}, none{{}, 0, 1, 7, 0};
+    const struct {
+        Image *src;
+        const Params &p;
+        const Image *mask;
+    } cases[] = {{&emptyW, p, nullptr},       {&emptyH, p, nullptr},     {&emptyW, none, nullptr},
+                 {src.get(), p, &hollowMask}, {src.get(), p, &flatMask}, {src.get(), p, &narrowMask},
+                 {&emptyH, p, &narrowMask}};
+    uint32_t seed = 30;
+    for (const auto &c : cases)
+        for (int32_t dbc : {8, 24, 32}) {
+            Owned dst = random_image(6, 5, dbc, seed++), want = clone(dst.get());
+            reference_filter(c.src, c.p, c.mask, want.get());
+            ASSERT_EQ(run(c.src, c.p, c.mask, dst.get()), 1) << seed;
+            EXPECT_EQ(diff(dst.get(), want.get()), "") << seed;
+        }
+    // Nothing filtered in place: the white working image comes back whole.
+    ASSERT_EQ(run(src.get(), p, &flatMask, nullptr), 1);
+    EXPECT_TRUE(std::all_of(src->bits, src->bits + 28 * 7, [](uint8_t v) { return v == 255; }));
+    const Image noPixels{9, 7, 24, nullptr, 28, 0};
+    Owned dst = make(6, 5, 24);
+    EXPECT_EQ(run(&emptyW, p, nullptr, nullptr) + run(const_cast<Image *>(&noPixels), p, nullptr, dst.get()), 0);
+    EXPECT_EQ(Filter(src.get(), nullptr, 3, 1, 0, &flatMask, dst.get(), 0) +
+                  Filter(src.get(), nullptr, 3, 1, 0, nullptr, make(6, 5, 16).get(), 0),
+              2);
+    EXPECT_EQ(Filter(src.get(), nullptr, 3, 1, 0, nullptr, dst.get(), 0), 0);
+    // The kernel effects reuse a matching record of the empty size: nothing drawn.
+    Image same{0, 7, 24, other.data(), 28, 0}, *slot = &same, *none0 = nullptr;
+    EXPECT_EQ(PX_IMG_Blur(&emptyW, &slot) + PX_IMG_Emboss1(&emptyW, &slot), 2);
+    EXPECT_TRUE(slot == &same && std::all_of(other.begin(), other.end(), [](uint8_t v) { return v == 0x5A; }));
+    EXPECT_EQ(PX_IMG_Sharpen(&emptyW, &none0), 0); // no image of that size can be made
+    EXPECT_EQ(none0, nullptr);
+}
+
 TEST(KernelEffects, MatchFilterWithTheirKernels) {
     const Params params[] = {{{1, 1, 1, 1, 1, 1, 1, 1, 1}, 3, 9, 0, 0},
                              {{1, 1, 1, 1, 8, 1, 1, 1, 1}, 3, 16, 0, 0},
@@ -188,10 +242,24 @@ TEST(FilterFast, MatchesFullBoxSumsAndRefusesBadSizesAsDoesSmooth) {
     // The result is copied back as PX_Img_Copy copies the white working
     // image: with malloc_Image's pitch the whole block, padding made 255;
     // with another pitch the pixels only, a 32-bit image keeping its alpha.
-    Owned padded = random_image(5, 3, 24, 4); // pitch 16: one padding byte a row
-    ASSERT_EQ(Filter_fast(padded.get(), 3, 0), 1);
-    for (int32_t y = 0; y < 3; ++y)
-        EXPECT_EQ(padded->bits[16 * y + 15], 255) << y;
+    // Every path: in place with the kept rows, full sums, PX_IMG_Smooth in place
+    // and into a new result, negative sizes, and the white 16-bit result.
+    const std::function<int32_t(Image *, Slot &)> paths[] = {
+        [](Image *im, Slot &) { return Filter_fast(im, 3, 0); },
+        [](Image *im, Slot &) { return pxfx::box_filter(im, 3, 0, false); },
+        [](Image *im, Slot &) { return PX_IMG_Smooth(im, nullptr, 30); },
+        [](Image *im, Slot &out) { return PX_IMG_Smooth(im, &out, 30); },
+        [](Image *im, Slot &) { return Filter_fast(im, -2, 9); }};
+    for (int32_t bc : kBitCounts)
+        for (const auto &path : paths) {
+            Owned padded = random_image(5, 3, bc, seed++); // 8, 16, 24 bits: 3, 2, 1 padding bytes a row
+            Slot out;
+            ASSERT_EQ(path(padded.get(), out), 1);
+            const Image *im = out.get() ? out.get() : padded.get();
+            for (uint32_t y = 0, used = 5 * im->bitCount / 8; y < 3; ++y)
+                for (uint32_t i = used; i < im->pitch; ++i)
+                    EXPECT_EQ(im->bits[im->pitch * y + i], 255) << bc << " bits, row " << y;
+        }
     Owned wide = random_image(4, 3, 32, 5), wideBefore = clone(wide.get());
     Image loose = *wide; // rows of 16 bytes read as three pixels: a pitch malloc_Image would not give
     loose.width = 3, loose.pitch = 16;
@@ -218,4 +286,11 @@ TEST(FilterFast, MatchesFullBoxSumsAndRefusesBadSizesAsDoesSmooth) {
     hollow.bits = nullptr;
     EXPECT_EQ(PX_IMG_Smooth(src.get(), &hp, 50), 1);
     EXPECT_EQ(hp, &hollow);
+    // A source of an empty size: smoothed in place it is left as it is (1); a
+    // new result of its size cannot be made (0).
+    Image empty = *src, *none = nullptr;
+    empty.width = 0;
+    EXPECT_EQ(PX_IMG_Smooth(&empty, nullptr, 50) + PX_IMG_Smooth(&empty, &none, 50) + Filter_fast(&empty, 3, 0), 1);
+    EXPECT_EQ(none, nullptr);
+    EXPECT_EQ(diff(src.get(), want.get()), "");
 }

@@ -42,6 +42,24 @@ TEST(Texture, MosaicBlocksSampleTheirCentreOrHalfwayToTheEdge) {
         };
         expect_like_reference([n](Image *s, Image **d) { return PX_IMG_Mosaic(s, d, n); }, ref, 7u * n);
     }
+    // n <= 0, after the result rule: no block size (0), or a row of
+    // (width + n - 1) / n block colours, which only a picture one pixel wide
+    // has; its pixels take the colour at (n / 2, y0 + n / 2), clamped, refilled
+    // every -n rows from y0.
+    Owned column = random_image(1, 7, 32, 3), wide = random_image(2, 7, 32, 4);
+    for (int n : {-1, -3, INT32_MIN}) {
+        Slot dst;
+        ASSERT_EQ(PX_IMG_Mosaic(column.get(), &dst, n), 1u);
+        for (int y = 0; y < 7; ++y) {
+            const int y0 = y - y % n;
+            EXPECT_EQ(GetPixelColor(dst.get(), 0, y), GetPixelColor(column.get(), 0, y0 + n / 2)) << n << " " << y;
+        }
+    }
+    for (int n : {0, -1, -3}) {
+        Slot dst;
+        ASSERT_EQ(PX_IMG_Mosaic(wide.get(), &dst, n), 0u);
+        EXPECT_EQ(diff(dst.get(), make(2, 7, 32).get()), "") << n; // prepared, unwritten
+    }
 }
 
 // Two draws per pixel in this order; a negative draw resets the horizontal jitter only.
@@ -69,6 +87,10 @@ TEST(Texture, OilMatchesWindowRescanAndCopiesTheBorder) {
                 Slot dst;
                 const bool fits = 2 * r < w && 2 * r < h;
                 ASSERT_EQ(imOil(src.get(), &dst, r), fits ? 1u : 0u);
+                // A negative radius has no window: refused after the result rule.
+                Slot prepared;
+                ASSERT_EQ(imOil(src.get(), &prepared, -1 - r), 0u);
+                EXPECT_EQ(diff(prepared.get(), make(w, h, bc).get()), "");
                 if (fits) {
                     EXPECT_EQ(diff(dst.get(), ref_oil(src.get(), r).get()), "") << w << "x" << h << "@" << bc;
                 }
