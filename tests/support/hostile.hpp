@@ -164,20 +164,29 @@ template <class R> void release(R *&im) {
     }
 }
 
-// Size, bit count and pixel block of a picture (empty for none).
+// Size, bit count and pixel block of a picture (empty for none), field by
+// field: the padding between a record's fields holds nothing to compare.
 template <class R> std::vector<uint8_t> picture_bytes(const R *im) {
     if (im == nullptr) return {};
-    std::vector<uint8_t> v(sizeof(R));
-    std::memcpy(v.data(), im, sizeof(R));
+    std::vector<uint8_t> v;
+    auto put = [&v](uint32_t x) {
+        for (int s = 0; s < 32; s += 8)
+            v.push_back(static_cast<uint8_t>(x >> s));
+    };
     size_t bytes;
     const uint8_t *pixels;
     if constexpr (std::is_same_v<R, Image>) {
-        bytes = im->bits ? size_t(im->pitch) * im->height : 0, pixels = im->bits;
-        std::fill(v.begin() + offsetof(Image, bits), v.begin() + offsetof(Image, bits) + sizeof(void *), 0);
+        for (uint32_t x : {uint32_t(im->width), uint32_t(im->height), im->bitCount, im->pitch, im->tag})
+            put(x);
+        bytes = im->bits && im->height > 0 ? size_t(im->pitch) * size_t(im->height) : 0, pixels = im->bits;
     } else {
-        bytes = im->data ? size_t(im->width) * im->height * (im->bitcount / 8) : 0, pixels = im->data;
-        std::fill(v.begin() + offsetof(PXImage, data), v.begin() + offsetof(PXImage, data) + sizeof(void *), 0);
+        for (int32_t x : {im->width, im->height, im->bitcount})
+            put(uint32_t(x));
+        const int64_t count = int64_t(im->width) * im->height; // two negative sizes make a block too
+        bytes = im->data && count > 0 ? size_t(count) * size_t(std::max(im->bitcount / 8, 0)) : 0;
+        pixels = im->data;
     }
+    v.push_back(pixels != nullptr);
     v.insert(v.end(), pixels, pixels + bytes);
     return v;
 }
