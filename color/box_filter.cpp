@@ -16,6 +16,7 @@
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/result.hpp"
 
 using namespace pxfx;
 
@@ -237,23 +238,16 @@ int32_t Filter_fast(Image *image, int32_t size, int32_t offset) { return box_fil
 
 int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength) {
     if (src == nullptr || src->bits == nullptr || !rows_inside(src)) return 0;
-    Image *target = const_cast<Image *>(src);
-    bool made = false;
-    if (out != nullptr) {
-        if (*out == nullptr) {
-            *out = malloc_Image(src->width, src->height, static_cast<int32_t>(src->bitCount));
-            if (*out == nullptr) return 0;
-            made = true;
-        }
-        target = *out;
-        PX_Img_Copy(target, src);
-    }
+    // With no slot the source itself is smoothed.
+    InPlaceOrSlot rule(const_cast<Image *>(src), out);
+    Image *target = rule.work_target();
+    if (target == nullptr) return 0;
     const int32_t size = strength <= 3 ? 0 : std::min(strength, 100) / 10;
     // What the box filter refuses (a size of 0, a target without pixels or
     // below 8 bits) is left as it is; a picture it takes fails only when its
     // working image cannot be made.
     if (size == 0 || !has_pixels(target) || target->bitCount < 8 || Filter_fast(target, size, 0) == 1) return 1;
-    if (made) free_Image(out, 0);
+    rule.discard_new();
     return 0;
 }
 

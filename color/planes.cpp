@@ -81,7 +81,6 @@ void combine_rows(Image *out, const PlaneRows &r1, const PlaneRows &r2, const Pl
 
 // Split and Combine rows through a copy compiled for AVX-512 where the
 // processor has it: more of the conversions then run in vectors.
-#if PXFX_X86_DISPATCH
 template <class F, Mode M, bool Alpha>
 PXFX_WIDE void split_rows_wide(const Image *src, Image *p1, Image *p2, Image *p3, Image *pa) {
     split_rows<F, M, Alpha>(src, p1, p2, p3, pa);
@@ -91,21 +90,14 @@ PXFX_WIDE void combine_rows_wide(Image *out, const PlaneRows &r1, const PlaneRow
                                  const PlaneRows *ra) {
     combine_rows<M, Bpp>(out, r1, r2, r3, ra);
 }
-#endif
 
 template <class F, Mode M, bool Alpha> void split_any(const Image *src, Image *p1, Image *p2, Image *p3, Image *pa) {
-#if PXFX_X86_DISPATCH
-    if (cpu::has_avx512()) return split_rows_wide<F, M, Alpha>(src, p1, p2, p3, pa);
-#endif
-    split_rows<F, M, Alpha>(src, p1, p2, p3, pa);
+    cpu::pick(&split_rows<F, M, Alpha>, &split_rows_wide<F, M, Alpha>)(src, p1, p2, p3, pa);
 }
 
 template <Mode M, int Bpp>
 void combine_any(Image *out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3, const PlaneRows *ra) {
-#if PXFX_X86_DISPATCH
-    if (cpu::has_avx512()) return combine_rows_wide<M, Bpp>(out, r1, r2, r3, ra);
-#endif
-    combine_rows<M, Bpp>(out, r1, r2, r3, ra);
+    cpu::pick(&combine_rows<M, Bpp>, &combine_rows_wide<M, Bpp>)(out, r1, r2, r3, ra);
 }
 
 } // namespace

@@ -1,16 +1,15 @@
 // Byte-table maps over interleaved rows, with vector lookups where the
 // machine has them: 128-byte two-register permutes on x86-64 with AVX-512
-// VBMI (chosen at run time), four-register table lookups on arm64. Other
-// machines, and builds configured with PXFX_SIMD=OFF, run the plain loop.
+// VBMI, four-register table lookups on arm64 (cpu::Wide::kBytePermute, chosen
+// through cpu::pick). Other machines, builds configured with PXFX_SIMD=OFF
+// and runs with the plain code forced use the plain loop.
 #include "core/internal/byte_map.hpp"
 
 #include "core/internal/cpu.hpp"
 
 #if PXFX_X86_DISPATCH
-#define PXFX_MAP_VBMI 1
 #include <immintrin.h>
-#elif !defined(PXFX_PORTABLE_ONLY) && defined(__aarch64__)
-#define PXFX_MAP_NEON 1
+#elif PXFX_ARM_NEON
 #include <arm_neon.h>
 #endif
 
@@ -18,13 +17,19 @@ namespace pxfx {
 
 namespace {
 
-template <int C> void plain(const uint8_t *in, uint8_t *out, size_t pixels, const uint8_t *const *t) {
+// The table pointers are copied first: byte stores may alias them, and the
+// copies stay in registers.
+template <int C> void plain(const uint8_t *in, uint8_t *out, size_t pixels, const uint8_t *const *tables) {
+    const uint8_t *t[C];
+    for (int k = 0; k < C; ++k)
+        t[k] = tables[k];
     for (size_t i = 0; i < pixels; ++i)
         for (int k = 0; k < C; ++k)
             out[C * i + k] = t[k][in[C * i + k]];
 }
 
-template <int C> void plain_tone(const uint8_t *in, uint8_t *out, size_t pixels, const ToneTables &t) {
+template <int C> void plain_tone(const uint8_t *in, uint8_t *out, size_t pixels, const ToneTables &tables) {
+    const ToneTables t = tables;
     for (size_t i = 0; i < pixels; ++i) {
         const uint8_t *p = in + C * i;
         uint8_t *q = out + C * i;
@@ -39,7 +44,7 @@ template <int C> void plain_tone(const uint8_t *in, uint8_t *out, size_t pixels,
 using MapFn = void (*)(const uint8_t *, uint8_t *, size_t, const uint8_t *const *);
 using ToneFn = void (*)(const uint8_t *, uint8_t *, size_t, const ToneTables &);
 
-#if PXFX_MAP_VBMI
+#if PXFX_X86_DISPATCH
 
 #define PXFX_VBMI __attribute__((target("avx512f,avx512bw,avx512vbmi")))
 
@@ -157,17 +162,10 @@ template <int C> PXFX_VBMI void vbmi_tone(const uint8_t *in, uint8_t *out, size_
         vbmi_tone_rows<C, false>(in, out, pixels, t);
 }
 
-template <int C> MapFn pick() {
-    static const MapFn fn = cpu::has_avx512vbmi() ? &vbmi<C> : &plain<C>;
-    return fn;
-}
+template <int C> constexpr MapFn kVectorMap = &vbmi<C>;
+template <int C> constexpr ToneFn kVectorTone = &vbmi_tone<C>;
 
-template <int C> ToneFn pick_tone() {
-    static const ToneFn fn = cpu::has_avx512vbmi() ? &vbmi_tone<C> : &plain_tone<C>;
-    return fn;
-}
-
-#elif PXFX_MAP_NEON
+#elif PXFX_ARM_NEON
 
 // A 256-entry table in four groups of four registers; each group answers the
 // indices of its 64 entries and leaves the others as they are.
@@ -243,15 +241,19 @@ template <int C> void neon_tone(const uint8_t *in, uint8_t *out, size_t pixels, 
     plain_tone<C>(in + bytes, out + bytes, pixels - blocks * 16, t);
 }
 
-template <int C> MapFn pick() { return &neon<C>; }
-template <int C> ToneFn pick_tone() { return &neon_tone<C>; }
+template <int C> constexpr MapFn kVectorMap = &neon<C>;
+template <int C> constexpr ToneFn kVectorTone = &neon_tone<C>;
 
 #else
 
-template <int C> MapFn pick() { return &plain<C>; }
-template <int C> ToneFn pick_tone() { return &plain_tone<C>; }
+// No vector copy in this build: both choices are the plain loop.
+template <int C> constexpr MapFn kVectorMap = &plain<C>;
+template <int C> constexpr ToneFn kVectorTone = &plain_tone<C>;
 
 #endif
+
+template <int C> MapFn map_fn() { return cpu::pick<cpu::Wide::kBytePermute>(MapFn{&plain<C>}, kVectorMap<C>); }
+template <int C> ToneFn tone_fn() { return cpu::pick<cpu::Wide::kBytePermute>(ToneFn{&plain_tone<C>}, kVectorTone<C>); }
 
 } // namespace
 
@@ -266,32 +268,17 @@ const uint8_t kIdentityMap[256] = {
 
 void map_bytes(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const uint8_t *const *tables) {
     switch (channels) {
-    case 1: pick<1>()(in, out, pixels, tables); break;
-    case 3: pick<3>()(in, out, pixels, tables); break;
-    default: pick<4>()(in, out, pixels, tables); break;
-    }
-}
-
-void map_bytes_portable(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const uint8_t *const *tables) {
-    switch (channels) {
-    case 1: plain<1>(in, out, pixels, tables); break;
-    case 3: plain<3>(in, out, pixels, tables); break;
-    default: plain<4>(in, out, pixels, tables); break;
+    case 1: map_fn<1>()(in, out, pixels, tables); break;
+    case 3: map_fn<3>()(in, out, pixels, tables); break;
+    default: map_fn<4>()(in, out, pixels, tables); break;
     }
 }
 
 void tone_bytes(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const ToneTables &t) {
     if (channels == 3)
-        pick_tone<3>()(in, out, pixels, t);
+        tone_fn<3>()(in, out, pixels, t);
     else
-        pick_tone<4>()(in, out, pixels, t);
-}
-
-void tone_bytes_portable(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const ToneTables &t) {
-    if (channels == 3)
-        plain_tone<3>(in, out, pixels, t);
-    else
-        plain_tone<4>(in, out, pixels, t);
+        tone_fn<4>()(in, out, pixels, t);
 }
 
 } // namespace pxfx

@@ -162,8 +162,7 @@ uint32_t Wave_Transform(Image *src, Image **dst, int32_t amplitude) {
         // first (the stride being width + 3 rounded down to a multiple of 4):
         // it has a size only when both sizes are negative, and then the
         // result rule runs as usual.
-        const int64_t entries = ((int64_t{w} + 3) & ~int64_t{3}) * h;
-        if (entries <= 0 || entries > static_cast<int64_t>(kMaxBlockBytes) / 2) return 0;
+        if (!buffer_size_ok(block_size((int64_t{w} + 3) & ~int64_t{3}, h, 2))) return 0;
         return acquire_result(src, dst) != nullptr ? 1 : 0;
     }
     Buffer<int16_t> map = alloc_zeroed<int16_t>(checked_size(static_cast<uint64_t>(h), map_stride(w)));

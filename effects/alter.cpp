@@ -3,10 +3,11 @@
 #include <pxfx/effects.h>
 #include <pxfx/toolkit.h>
 
+#include "core/internal/channel_map.hpp"
+#include "core/internal/curve_blend.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/result.hpp"
-#include "effects/pixel_maps.hpp"
 
 using namespace pxfx;
 
@@ -15,16 +16,12 @@ namespace {
 // v + d clamped to 0..255; the sum wraps modulo 2^32, as 32-bit arithmetic does.
 uint8_t shifted(uint32_t v, int32_t d) { return clamp_u8(static_cast<int32_t>(v + static_cast<uint32_t>(d))); }
 
-// curve[i] = ((127 - w) i + w T[i] + 63) / 127 with w = |d|, low 8 bits kept.
-// The sums wrap modulo 2^32 and the division truncates, as in 32-bit signed
-// arithmetic, so shifts beyond +-127 give wrapped curves rather than errors.
+// curve[i] = ((127 - w) i + w T[i] + 63) / 127 with w = |d|, low 8 bits kept;
+// shifts beyond +-127 give wrapped curves rather than errors.
 void blend_curve(const uint8_t *table, int32_t d, uint8_t *curve) {
     const uint32_t w = d < 0 ? 0u - static_cast<uint32_t>(d) : static_cast<uint32_t>(d);
-    uint32_t ramp = 0;
-    for (uint32_t i = 0; i < 256; ++i) {
-        curve[i] = static_cast<uint8_t>(static_cast<int32_t>(ramp + w * table[i] + 63) / 127);
-        ramp += 127 - w;
-    }
+    for (uint32_t i = 0; i < 256; ++i)
+        curve[i] = curve_blend<127>(i, table[i], w);
 }
 
 // Table of one channel: the curve indexed by the shifted value.
@@ -62,6 +59,6 @@ extern "C" uint32_t PX_IMG_Alter(Image *src, Image **dst, int32_t dR, int32_t dG
     channel_table(mode, dR, t.r);
     channel_table(mode, dG, t.g);
     channel_table(mode, dB, t.b);
-    map_channels(src, out, t);
+    map_channels(src, out, t.map());
     return 1;
 }

@@ -6,12 +6,12 @@
 #include <algorithm>
 #include <cstring>
 
+#include "core/internal/channel_map.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
-#include "effects/pixel_maps.hpp"
 
 using namespace pxfx;
 
@@ -127,14 +127,15 @@ uint32_t PX_IMG_Light_Alter(Image *src, Image **dst, uint32_t percent, uint32_t 
     } else if (percent == 0) {
         if (const size_t n = claimed_bytes(out); n > 0) std::memset(out->bits, 0, n);
     } else if (has_pixels(out)) {
-        map_channels(src, out, light_tables(percent, channel));
+        const ChannelTables t = light_tables(percent, channel);
+        map_channels(src, out, t.map());
     }
     return 1;
 }
 
 uint32_t PX_IMG_Ballance(Image *src, Image **dst, int32_t contrast) {
-    ChannelTables t;
-    contrast_table(contrast, t.b);
+    uint8_t table[256];
+    contrast_table(contrast, table);
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
     if (contrast == 0) {
@@ -146,9 +147,7 @@ uint32_t PX_IMG_Ballance(Image *src, Image **dst, int32_t contrast) {
         return 1;
     }
     if (!has_pixels(out)) return 1;
-    std::memcpy(t.g, t.b, 256);
-    std::memcpy(t.r, t.b, 256);
-    map_channels(src, out, t);
+    map_channels(src, out, {table, table, table});
     return 1;
 }
 

@@ -7,6 +7,7 @@
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/rank.hpp"
 #include "core/internal/result.hpp"
 
 using namespace pxfx;
@@ -20,49 +21,37 @@ constexpr uint32_t intensity_class(uint32_t c) {
     return (306 * red_of(c) + 601 * green_of(c) + 117 * blue_of(c)) >> 15;
 }
 
-// Pixel count and red, green, blue sums per class, as one array of four
-// groups. `S` holds the sums of one window exactly: 32 bits while
-// (2r + 1)^2 * 255 fits, 64 bits beyond.
-template <class S> struct Hist {
-    static constexpr int kN = 0, kR = kClasses, kG = 2 * kClasses, kB = 3 * kClasses, kSize = 4 * kClasses;
-    S v[kSize];
+// Pixel count and red, green, blue sums per class in one histogram of four
+// groups of bins (class k counts at k, its red sum at kRed + k, and so on),
+// so that merging and sliding run over all of them in one pass. `S` holds the
+// sums of one window exactly: 32 bits while (2r + 1)^2 * 255 fits, 64 bits
+// beyond.
+constexpr int32_t kRed = kClasses, kGreen = 2 * kClasses, kBlue = 3 * kClasses;
+template <class S> using Hist = rank::Histogram<4 * kClasses, S>;
 
-    void add(uint32_t c) {
-        const uint32_t k = intensity_class(c);
-        v[kN + k] += 1;
-        v[kR + k] += red_of(c);
-        v[kG + k] += green_of(c);
-        v[kB + k] += blue_of(c);
-    }
-    void remove(uint32_t c) {
-        const uint32_t k = intensity_class(c);
-        v[kN + k] -= 1;
-        v[kR + k] -= red_of(c);
-        v[kG + k] -= green_of(c);
-        v[kB + k] -= blue_of(c);
-    }
-    void plus(const Hist &add) {
-        for (int i = 0; i < kSize; ++i)
-            v[i] += add.v[i];
-    }
-    // this += add - sub, entry by entry (the differences wrap back exactly).
-    void slide(const Hist &add, const Hist &sub) {
-        S d[kSize];
-        for (int i = 0; i < kSize; ++i)
-            d[i] = add.v[i] - sub.v[i];
-        for (int i = 0; i < kSize; ++i)
-            v[i] += d[i];
-    }
-    // Mean colour of the most populated class, the lowest class on a tie.
-    uint32_t dominant(uint32_t alpha) const {
-        int best = 0;
-        for (int k = 1; k < kClasses; ++k)
-            if (v[kN + k] > v[kN + best]) best = k;
-        const S n = v[kN + best];
-        return pack(static_cast<uint32_t>(v[kB + best] / n), static_cast<uint32_t>(v[kG + best] / n),
-                    static_cast<uint32_t>(v[kR + best] / n), alpha);
-    }
-};
+template <class S> void add_pixel(Hist<S> &h, uint32_t c) {
+    const auto k = static_cast<int32_t>(intensity_class(c));
+    h.add(k);
+    h.add(kRed + k, red_of(c));
+    h.add(kGreen + k, green_of(c));
+    h.add(kBlue + k, blue_of(c));
+}
+
+template <class S> void remove_pixel(Hist<S> &h, uint32_t c) {
+    const auto k = static_cast<int32_t>(intensity_class(c));
+    h.remove(k);
+    h.remove(kRed + k, red_of(c));
+    h.remove(kGreen + k, green_of(c));
+    h.remove(kBlue + k, blue_of(c));
+}
+
+// Mean colour of the most populated class, the lowest class on a tie.
+template <class S> uint32_t dominant(const Hist<S> &h, uint32_t alpha) {
+    const int32_t k = rank::most_frequent(h, 0, kClasses);
+    const S n = h.count(k);
+    return pack(static_cast<uint32_t>(h.count(kBlue + k) / n), static_cast<uint32_t>(h.count(kGreen + k) / n),
+                static_cast<uint32_t>(h.count(kRed + k) / n), alpha);
+}
 
 // Border pixels (closer than r to an edge) are copied; interior pixels take
 // the dominant class of their (2r + 1)^2 window. The window is the sum of
@@ -76,7 +65,7 @@ template <class F, class S> void oil(const Image *src, Image *dst, int32_t r, Hi
     for (int32_t y = 0; y < 2 * r; ++y) {
         const typename F::CRow in = F::crow(src, y);
         for (int32_t x = 0; x < w; ++x)
-            cols[x].add(F::load(in, x));
+            add_pixel(cols[x], F::load(in, x));
     }
     for (int32_t y = 0; y < h; ++y) {
         const typename F::CRow in = F::crow(src, y);
@@ -89,22 +78,22 @@ template <class F, class S> void oil(const Image *src, Image *dst, int32_t r, Hi
         // Columns now cover rows y - r .. y + r.
         const typename F::CRow enter = F::crow(src, y + r);
         for (int32_t x = 0; x < w; ++x)
-            cols[x].add(F::load(enter, x));
+            add_pixel(cols[x], F::load(enter, x));
         for (int32_t x = 0; x < r; ++x)
             F::store(out, x, F::load(in, x));
         Hist<S> win{};
         for (int32_t x = 0; x <= 2 * r; ++x)
-            win.plus(cols[x]);
-        F::store(out, r, win.dominant(alpha_of(F::load(in, r))));
+            win.merge(cols[x]);
+        F::store(out, r, dominant(win, alpha_of(F::load(in, r))));
         for (int32_t x = r + 1; x < w - r; ++x) {
             win.slide(cols[x + r], cols[x - r - 1]);
-            F::store(out, x, win.dominant(alpha_of(F::load(in, x))));
+            F::store(out, x, dominant(win, alpha_of(F::load(in, x))));
         }
         for (int32_t x = w - r; x < w; ++x)
             F::store(out, x, F::load(in, x));
         const typename F::CRow leave = F::crow(src, y - r);
         for (int32_t x = 0; x < w; ++x)
-            cols[x].remove(F::load(leave, x));
+            remove_pixel(cols[x], F::load(leave, x));
     }
 }
 
@@ -167,20 +156,19 @@ int32_t ColorCompress(Image *plane, int32_t levels) {
     if (plane == nullptr || plane->bits == nullptr || plane->bitCount != 8 || !rows_inside(plane) || levels < 1)
         return 0;
     const int32_t group = 256 / levels + (256 % levels != 0 ? 1 : 0);
-    uint32_t count[256] = {};
+    rank::Histogram<256, uint32_t> count;
+    count.reset();
     for (int32_t y = 0; y < plane->height; ++y) {
         const uint8_t *row = row_ptr(plane, y);
         for (int32_t x = 0; x < plane->width; ++x)
-            ++count[row[x]];
+            count.add(row[x]);
     }
     // Each group of `group` consecutive values maps to its most frequent
     // member, the first one on a tie.
     uint8_t map[256];
     for (int32_t first = 0; first < 256; first += group) {
         const int32_t end = first + group < 256 ? first + group : 256;
-        int32_t rep = first;
-        for (int32_t v = first + 1; v < end; ++v)
-            if (count[v] > count[rep]) rep = v;
+        const int32_t rep = rank::most_frequent(count, first, end);
         for (int32_t v = first; v < end; ++v)
             map[v] = static_cast<uint8_t>(rep);
     }

@@ -143,8 +143,8 @@ extern "C" uint32_t PX_IMG_Photocopy(Image *src, Image **dst) {
         // bytes (the stride being the width rounded up to a multiple of 4) is
         // still needed; when its size is not positive it cannot be had, and
         // the result is released.
-        const int64_t plane = ((int64_t{w} + 3) & ~int64_t{3}) * h; // 5 * plane + 8000 > 0: plane > -1600
-        if (plane > -1600 && plane <= (static_cast<int64_t>(kMaxBlockBytes) - 8000) / 5) return 1;
+        const int64_t plane = ((int64_t{w} + 3) & ~int64_t{3}) * h;
+        if (buffer_size_ok(block_size(plane, 5, 1) + 8000)) return 1;
         free_Image(dst, 0);
         return 0;
     }

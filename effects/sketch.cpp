@@ -122,8 +122,7 @@ uint32_t sketch(Image *src, Image **dst, bool withEdges) {
         // Nothing to draw, but the work buffer of planes x width x height
         // bytes is still needed: a size of 0 or below cannot be had (0, the
         // prepared result kept), a positive one (both sizes negative) can.
-        const int64_t plane = int64_t{w} * h, planes = withEdges ? 4 : 3;
-        return plane > 0 && plane <= static_cast<int64_t>(kMaxBlockBytes) / planes ? 1 : 0;
+        return buffer_size_ok(block_size(w, h, withEdges ? 4 : 3)) ? 1 : 0;
     }
     if (!has_pixels(out)) return 1;
     const size_t plane = static_cast<size_t>(w) * h;

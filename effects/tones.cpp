@@ -6,11 +6,11 @@
 #include <cstring>
 
 #include "core/internal/byte_map.hpp"
+#include "core/internal/channel_map.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
-#include "effects/pixel_maps.hpp"
 #include "effects/tone_tables.hpp"
 
 using namespace pxfx;
@@ -144,7 +144,8 @@ uint32_t PX_IMG_Classical_Photograph(Image *src, Image **dst) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
     if (!has_pixels(out)) return 1;
-    map_channels(src, out, old_photo_tables());
+    const ChannelTables t = old_photo_tables();
+    map_channels(src, out, t.map());
     return 1;
 }
 
@@ -152,15 +153,12 @@ uint32_t PX_IMG_Line(Image *src, Image **dst) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
     if (!has_pixels(out)) return 1;
-    ChannelTables dark, same;
-    for (int i = 0; i < 256; ++i) {
-        dark.b[i] = dark.g[i] = dark.r[i] = static_cast<uint8_t>(i > 128 ? i - 128 : 0);
-        same.b[i] = same.g[i] = same.r[i] = static_cast<uint8_t>(i);
-    }
+    uint8_t darker[256];
+    for (int i = 0; i < 256; ++i)
+        darker[i] = static_cast<uint8_t>(i > 128 ? i - 128 : 0);
+    const ChannelMap dark{darker, darker, darker}, same{kIdentityMap, kIdentityMap, kIdentityMap};
     // Rows 2, 5, 8, ... are copied; all others are darkened.
-    with_format(src->bitCount, [&](auto f) {
-        map_rows<decltype(f)>(src, out, [&](int32_t y) { return y % 3 == 2 ? &same : &dark; });
-    });
+    map_channel_rows(src, out, [&](int32_t y) { return y % 3 == 2 ? &same : &dark; });
     return 1;
 }
 

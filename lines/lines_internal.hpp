@@ -1,6 +1,6 @@
 // Building blocks shared by the line-detection sources and reachable from the
-// tests: result delivery, the boundary search and straightening of
-// RecognizeYUV, and the two first steps of BinImg.
+// tests: the boundary search and straightening of RecognizeYUV, and the two
+// first steps of BinImg.
 #pragma once
 
 #include <pxfx/lines.h>
@@ -20,11 +20,6 @@ namespace pxfx::lines {
 // height .. height + 5, below the picture.
 inline constexpr int32_t kMinRecognizeWidth = 121;
 inline constexpr int32_t kMinRecognizeHeight = 13;
-
-// Hands a finished result to the caller: with out null it replaces the pixels
-// of img, with *out null the image itself is handed over, otherwise it is
-// copied into *out. Always 1.
-int32_t deliver(Image *img, Image **out, ImagePtr result);
 
 // Boundary row of every column of a plane of at least kMinRecognizeWidth x
 // kMinRecognizeHeight: the line through the two strip boundaries, shifted by

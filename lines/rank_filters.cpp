@@ -2,46 +2,24 @@
 // vertical edge marker.
 //
 // Both medians keep one 256-level histogram per column and slide it down one
-// row per output row. The rank is tracked rather than searched: the level
-// found for the previous window is kept with the number of samples below it,
-// and after each update it walks only as far as the window's values moved,
-// which on camera pictures is a few levels.
+// row per output row. The rank is tracked rather than searched (rank::Cursor):
+// after each update it walks only as far as the window's values moved, which
+// on camera pictures is a few levels.
 #include <pxfx/lines.h>
-
-#include <cstring>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/rank.hpp"
+#include "core/internal/result.hpp"
 #include "lines/lines_internal.hpp"
 
 using namespace pxfx;
 
 namespace {
 
-constexpr size_t kLevels = 256;
-
-// The smallest level whose running count exceeds `rank`, kept with the number
-// of samples below it. count(l) gives the samples at level l; the window
-// always holds more than `rank` samples.
-struct RankTracker {
-    int32_t level;
-    int32_t below;
-    void removed(uint8_t v) { below -= v < level; }
-    void added(uint8_t v) { below += v < level; }
-    template <class Count> int32_t settle(int32_t rank, Count count) {
-        while (below > rank)
-            below -= count(--level);
-        while (below + count(level) <= rank)
-            below += count(level++);
-        return level;
-    }
-};
-
-// Counts per column of a range, in one block. Counts stay below 256.
-Buffer<uint8_t> column_histograms(int32_t cols) {
-    return alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(cols), kLevels));
-}
+// Counts of a column's window (25 values at most) or of a row's 15 values.
+using Hist = rank::Histogram<256, uint8_t>;
 
 // Narrowest planes with a column to filter: the cross filters columns
 // 7 .. width - 9, the box columns 2 .. width - 5.
@@ -54,29 +32,28 @@ constexpr int32_t kCrossMinWidth = 16, kBoxMinWidth = 7;
 bool cross_median(const Image *img, Image *res) {
     const int32_t w = img->width, h = img->height;
     const int32_t x0 = 7, x1 = w - 9;
-    Buffer<uint8_t> block = column_histograms(x1 - x0 + 1);
+    Buffer<Hist> block = alloc_zeroed<Hist>(static_cast<size_t>(x1 - x0 + 1));
     if (!block) return false;
-    uint8_t *const hists = block.get();
+    Hist *const hists = block.get();
     for (int32_t y = 0; y < 5; ++y) {
         const uint8_t *r = row_ptr(img, y);
         for (int32_t x = x0; x <= x1; ++x)
-            ++hists[static_cast<size_t>(x - x0) * kLevels + r[x]];
+            hists[x - x0].add(r[x]);
     }
-    uint8_t rowHist[kLevels];
+    Hist rowHist;
     for (int32_t y = 3; y <= h - 4; ++y) {
         const uint8_t *rows[5];
         for (int32_t d = 0; d < 5; ++d)
             rows[d] = row_ptr(img, y - 2 + d);
         const uint8_t *gone = row_ptr(img, y - 3), *r = rows[2];
         for (int32_t x = x0; x <= x1; ++x) {
-            uint8_t *col = hists + static_cast<size_t>(x - x0) * kLevels;
-            --col[gone[x]];
-            ++col[rows[4][x]];
+            hists[x - x0].remove(gone[x]);
+            hists[x - x0].add(rows[4][x]);
         }
-        std::memset(rowHist, 0, sizeof rowHist);
+        rowHist.reset();
         for (int32_t x = x0 - 7; x <= x0 + 7; ++x)
-            ++rowHist[r[x]];
-        RankTracker t{0, 0};
+            rowHist.add(r[x]);
+        rank::Cursor t{};
         uint8_t *out = row_ptr(res, y);
         for (int32_t x = x0; x <= x1; ++x) {
             if (x > x0) {
@@ -84,8 +61,8 @@ bool cross_median(const Image *img, Image *res) {
                 // comes back and the new one leaves; the column changes.
                 t.removed(r[x - 8]);
                 t.added(r[x + 7]);
-                --rowHist[r[x - 8]];
-                ++rowHist[r[x + 7]];
+                rowHist.remove(r[x - 8]);
+                rowHist.add(r[x + 7]);
                 t.added(r[x - 1]);
                 t.removed(r[x]);
                 for (int32_t d = 0; d < 5; ++d) {
@@ -99,10 +76,7 @@ bool cross_median(const Image *img, Image *res) {
                 for (int32_t d = -7; d <= 7; ++d)
                     t.added(r[x + d]);
             }
-            const uint8_t *col = hists + static_cast<size_t>(x - x0) * kLevels;
-            const int32_t centre = r[x];
-            out[x] = static_cast<uint8_t>(
-                t.settle(9, [&](int32_t l) { return col[l] + rowHist[l] - static_cast<int32_t>(l == centre); }));
+            out[x] = static_cast<uint8_t>(t.settle(rank::Cross{hists[x - x0], rowHist, r[x]}, 9));
         }
     }
     return true;
@@ -115,32 +89,30 @@ bool box_median(const Image *img, Image *res) {
     const int32_t w = img->width, h = img->height;
     const int32_t x0 = 2, x1 = w - 5;
     const int32_t cols = x1 - x0 + 1;
-    Buffer<uint8_t> block = column_histograms(cols);
-    Buffer<RankTracker> trackers = alloc_buffer<RankTracker>(static_cast<size_t>(cols));
+    Buffer<Hist> block = alloc_zeroed<Hist>(static_cast<size_t>(cols));
+    Buffer<rank::Cursor> trackers = alloc_zeroed<rank::Cursor>(static_cast<size_t>(cols));
     if (!block || !trackers) return false;
-    uint8_t *const hists = block.get();
-    RankTracker *const track = trackers.get();
-    for (int32_t i = 0; i < cols; ++i)
-        track[i] = RankTracker{0, 0};
+    Hist *const hists = block.get();
+    rank::Cursor *const track = trackers.get();
     for (int32_t y = 0; y < 5; ++y) {
         const uint8_t *r = row_ptr(img, y);
         for (int32_t x = x0; x <= x1; ++x)
             for (int32_t d = -2; d <= 2; ++d)
-                ++hists[static_cast<size_t>(x - x0) * kLevels + r[x + d]];
+                hists[x - x0].add(r[x + d]);
     }
     for (int32_t y = 3; y <= h - 4; ++y) {
         const uint8_t *gone = row_ptr(img, y - 3), *come = row_ptr(img, y + 2);
         uint8_t *out = row_ptr(res, y);
         for (int32_t x = x0; x <= x1; ++x) {
-            uint8_t *col = hists + static_cast<size_t>(x - x0) * kLevels;
-            RankTracker &t = track[x - x0];
+            Hist &col = hists[x - x0];
+            rank::Cursor &t = track[x - x0];
             for (int32_t d = -2; d <= 2; ++d) {
-                --col[gone[x + d]];
+                col.remove(gone[x + d]);
                 t.removed(gone[x + d]);
-                ++col[come[x + d]];
+                col.add(come[x + d]);
                 t.added(come[x + d]);
             }
-            out[x] = static_cast<uint8_t>(t.settle(12, [col](int32_t l) { return static_cast<int32_t>(col[l]); }));
+            out[x] = static_cast<uint8_t>(t.settle(col, 12));
         }
     }
     return true;
@@ -156,7 +128,7 @@ template <class Filter> int32_t run_median(Image *img, Image **out, int32_t minW
     if (filters && (img->bits == nullptr || img->height < 5)) return 0;
     ImagePtr res = make_image(img->width, img->height, 8);
     if (!res || (filters && !filter(img, res.get()))) return 0;
-    return lines::deliver(img, out, std::move(res));
+    return InPlaceOrSlot(img, out).deliver(std::move(res));
 }
 
 } // namespace
@@ -180,7 +152,7 @@ int32_t MyEdge(Image *img, Image **out) {
             o[x] = a > b + 9 ? 0 : (b > a + 9 ? 255 : static_cast<uint8_t>(a));
         }
     }
-    return lines::deliver(img, out, std::move(res));
+    return InPlaceOrSlot(img, out).deliver(std::move(res));
 }
 
 int32_t MyFliter(Image *img, Image **out) { return run_median(img, out, kCrossMinWidth, cross_median); }

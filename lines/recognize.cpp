@@ -10,6 +10,7 @@
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/result.hpp"
 #include "lines/lines_internal.hpp"
 
 using namespace pxfx;
@@ -152,7 +153,7 @@ int32_t RecognizeYUV(Image *img, Image **out) {
     lines::straighten(img, line.get(), res.get());
     line.reset();
     if (BinImg(res.get(), nullptr) == 0) return 0;
-    return lines::deliver(img, out, std::move(res));
+    return InPlaceOrSlot(img, out).deliver(std::move(res));
 }
 
 void ImgDecode(Image *img, Image **out) {

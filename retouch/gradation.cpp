@@ -5,12 +5,12 @@
 
 #include <cmath>
 
+#include "core/internal/channel_map.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
-#include "retouch/retouch_common.hpp"
 
 using namespace pxfx;
 
@@ -147,17 +147,6 @@ template <class F> void green_and_dark_histograms(const Image *src, int64_t gree
     }
 }
 
-template <class FS, class FD> void map_pixels(const Image *src, Image *out, const uint8_t table[3][256]) {
-    for (int32_t y = 0; y < src->height; ++y) {
-        const typename FS::CRow in = FS::crow(src, y);
-        const typename FD::Row o = FD::row(out, y);
-        for (int32_t x = 0; x < src->width; ++x) {
-            const uint32_t c = FS::load(in, x);
-            FD::store(o, x, pack(table[0][blue_of(c)], table[1][green_of(c)], table[2][red_of(c)], alpha_of(c)));
-        }
-    }
-}
-
 } // namespace
 
 extern "C" {
@@ -224,10 +213,10 @@ void ImageAutoGradationProcess1(const Image *src, Image **dst, int32_t, int32_t 
     with_format(in->bitCount, [&](auto f) { green_and_dark_histograms<decltype(f)>(in, green, dark); });
     int32_t map[256];
     make_mapping(dark, 0.0f, 0.0f, map);
-    uint8_t table[3][256];
+    uint8_t table[256];
     for (int32_t i = 0; i < 256; ++i)
-        table[0][i] = table[1][i] = table[2][i] = gamma[map[i]];
-    with_formats(in, out, [&](auto fs, auto fd) { map_pixels<decltype(fs), decltype(fd)>(in, out, table); });
+        table[i] = gamma[map[i]];
+    map_channels(in, out, {table, table, table});
 }
 
 } // extern "C"

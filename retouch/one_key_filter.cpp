@@ -8,6 +8,7 @@
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/rank.hpp"
 
 using namespace pxfx;
 
@@ -16,36 +17,8 @@ namespace {
 constexpr int32_t kArm = 7;
 constexpr uint32_t kMedianRank = 14; // the 15th of 29 values
 
-// Bins of a window: 256 fine counts and 16 coarse ones; counts stay below 16.
-struct Hist {
-    uint8_t fine[256];
-    uint8_t coarse[16];
-    void add(uint8_t v) {
-        ++fine[v];
-        ++coarse[v >> 4];
-    }
-    void remove(uint8_t v) {
-        --fine[v];
-        --coarse[v >> 4];
-    }
-};
-
-// Smallest value whose running count exceeds kMedianRank in the column plus
-// the row, with the centre (in both) counted once.
-uint8_t cross_rank(const Hist &col, const Hist &row, uint8_t centre) {
-    uint32_t seen = 0;
-    int32_t g = 0;
-    const int32_t cg = centre >> 4;
-    for (;; ++g) {
-        const uint32_t n = col.coarse[g] + row.coarse[g] - (g == cg);
-        if (seen + n > kMedianRank) break;
-        seen += n;
-    }
-    for (int32_t v = g * 16;; ++v) {
-        seen += col.fine[v] + row.fine[v] - (v == centre);
-        if (seen > kMedianRank) return static_cast<uint8_t>(v);
-    }
-}
+// A column's or a row's 15 values: byte counts suffice.
+using Hist = rank::GroupedHistogram<256, uint8_t>;
 
 // Column histograms slide down one row per output row; the histogram of the
 // 15 pixels of the centre row slides along it.
@@ -60,7 +33,7 @@ void cross_median(const Image *src, Image *res, Hist *cols) {
         const uint8_t *leaving = row_ptr(src, y - kArm - 1), *entering = row_ptr(src, y + kArm);
         const uint8_t *r = row_ptr(src, y);
         uint8_t *out = row_ptr(res, y);
-        std::memset(&row, 0, sizeof row);
+        row.reset();
         for (int32_t i = 0; i < 2 * kArm; ++i)
             row.add(r[i]);
         for (int32_t x = kArm; x < w - kArm - 1; ++x) {
@@ -68,7 +41,8 @@ void cross_median(const Image *src, Image *res, Hist *cols) {
             c.remove(leaving[x]);
             c.add(entering[x]);
             row.add(r[x + kArm]);
-            out[x] = cross_rank(c, row, r[x]);
+            // The column and the row as one window, their shared centre once.
+            out[x] = static_cast<uint8_t>(rank::kth_smallest(rank::Cross{c, row, r[x]}, kMedianRank));
             row.remove(r[x - kArm]);
         }
     }

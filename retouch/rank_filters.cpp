@@ -134,10 +134,11 @@ void MoreLight(const Image *src, int32_t size, Image **dst) {
     } else if (plane != nullptr) {
         const uint32_t half = static_cast<uint32_t>(size * size) / 2;
         const bool ok = for_each_window(plane, stride, w, h, window_lo(size), window_hi(size),
-                                        [&](int32_t x, int32_t y, uint8_t c, const RankHist &hist) {
+                                        [&](int32_t x, int32_t y, uint8_t c, const auto &hist) {
                                             if (c == 0) return;
-                                            const uint32_t d = (hist.kth_largest(0) - c) & 255u;
-                                            if (d > 10 && hist.count_above(c) >= half)
+                                            const uint32_t d =
+                                                static_cast<uint32_t>(rank::kth_largest(hist, 0) - c) & 255u;
+                                            if (d > 10 && rank::count_above(hist, c) >= half)
                                                 lift[static_cast<size_t>(y) * w + x] = static_cast<uint8_t>(d);
                                         });
         if (!ok) return;

@@ -6,61 +6,16 @@
 // A window list sorted largest first (a stable selection sort) is fully
 // determined by its value counts, so the ranks the retouch filters use - the
 // k-th element of the sorted list and the position of the first element not
-// above a value - come from a sliding 256-bin histogram with 16 coarse bins.
+// above a value - come from a sliding grouped histogram of the window.
 #pragma once
 
 #include <cstdint>
-#include <cstring>
 
-#include "core/internal/byte_map.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/rank.hpp"
 
 namespace pxfx {
-
-struct RankHist {
-    uint32_t fine[256];
-    uint32_t coarse[16];
-
-    void clear() {
-        std::memset(fine, 0, sizeof fine);
-        std::memset(coarse, 0, sizeof coarse);
-    }
-    void add(uint8_t v) {
-        ++fine[v];
-        ++coarse[v >> 4];
-    }
-    void remove(uint8_t v) {
-        --fine[v];
-        --coarse[v >> 4];
-    }
-    // Number of values strictly greater than c: the position getpos returns
-    // for c on the sorted list.
-    uint32_t count_above(uint32_t c) const {
-        uint32_t n = 0;
-        for (uint32_t g = (c >> 4) + 1; g < 16; ++g)
-            n += coarse[g];
-        for (uint32_t v = c + 1; v < ((c >> 4) + 1) << 4; ++v)
-            n += fine[v];
-        return n;
-    }
-    // Element k (from 0) of the list sorted largest first; 0 when the window
-    // has k or fewer values (the rest of a cleared list).
-    uint32_t kth_largest(uint32_t k) const {
-        uint32_t seen = 0;
-        for (int32_t g = 15; g >= 0; --g) {
-            if (seen + coarse[g] <= k) {
-                seen += coarse[g];
-                continue;
-            }
-            for (int32_t v = g * 16 + 15;; --v) {
-                seen += fine[v];
-                if (seen > k) return static_cast<uint32_t>(v);
-            }
-        }
-        return 0;
-    }
-};
 
 // Copy of a w x h plane with `side - 1` extra rows and columns whose reads
 // are clamped to the plane: padded (X, Y) holds plane (X + lo, Y + lo), so
@@ -91,11 +46,11 @@ bool for_each_window(const uint8_t *plane, size_t stride, int32_t w, int32_t h, 
     const size_t ps = static_cast<size_t>(w) + side - 1;
     Buffer<uint8_t> pad = padded_plane(plane, stride, w, h, lo, side);
     if (!pad) return false;
-    RankHist hist;
+    rank::GroupedHistogram<256, uint32_t> hist;
     for (int32_t y = 0; y < h; ++y) {
         const uint8_t *top = pad.get() + static_cast<size_t>(y) * ps;
         const uint8_t *centreRow = plane + static_cast<size_t>(y) * stride;
-        hist.clear();
+        hist.reset();
         for (int32_t dy = 0; dy < side; ++dy)
             for (int32_t dx = 0; dx < side; ++dx)
                 hist.add(top[static_cast<size_t>(dy) * ps + dx]);
@@ -134,31 +89,6 @@ void lift_pixels(const Image *src, Image *dst, const uint8_t *amount, size_t str
             FD::store(out, x, c);
         }
     }
-}
-
-// Maps blue, green and red of every pixel through per-channel tables in
-// place; alpha kept.
-template <class F> void map_channels(Image *img, const uint8_t tb[256], const uint8_t tg[256], const uint8_t tr[256]) {
-    if constexpr (F::kBitCount == 8 || F::kBitCount == 24 || F::kBitCount == 32) {
-        // Byte channels: a gray pixel stores the green of its three equal channels.
-        constexpr int channels = static_cast<int>(F::kBitCount / 8);
-        const uint8_t *tables[4] = {channels == 1 ? tg : tb, tg, tr, kIdentityMap};
-        for (int32_t y = 0; y < img->height; ++y)
-            map_bytes(row_ptr(img, y), row_ptr(img, y), static_cast<size_t>(img->width), channels, tables);
-    } else {
-        for (int32_t y = 0; y < img->height; ++y) {
-            const typename F::CRow in = F::crow(img, y);
-            const typename F::Row out = F::row(img, y);
-            for (int32_t x = 0; x < img->width; ++x) {
-                const uint32_t c = F::load(in, x);
-                F::store(out, x, pack(tb[blue_of(c)], tg[green_of(c)], tr[red_of(c)], alpha_of(c)));
-            }
-        }
-    }
-}
-
-inline void map_channels(Image *img, const uint8_t table[256]) {
-    with_format(img->bitCount, [&](auto f) { map_channels<decltype(f)>(img, table, table, table); });
 }
 
 } // namespace pxfx

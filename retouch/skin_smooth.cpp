@@ -7,6 +7,8 @@
 #include <algorithm>
 #include <cstring>
 
+#include "core/internal/channel_map.hpp"
+#include "core/internal/curve_blend.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
@@ -97,7 +99,7 @@ int32_t alg_Img_Skin(const Image *src, Image **dst, int32_t lighten) {
     if (src == nullptr || dst == nullptr || !rows_inside(src)) return 1;
     uint8_t tone[256];
     for (int32_t i = 0; i < 256; ++i)
-        tone[i] = static_cast<uint8_t>((52 * i + 75 * ZANTOFILTER[i] + 63) / 127);
+        tone[i] = curve_blend<127>(i, ZANTOFILTER[i], 75);
     // The brightening passes and the tone curve run on whatever the smoothing
     // left in the slot, also a prepared image it could not write.
     alg_Img_smooth_1(src, dst);
@@ -114,18 +116,18 @@ int32_t alg_Img_Skin(const Image *src, Image **dst, int32_t lighten) {
                 v = ZANTOMOPI[v];
             table[i] = tone[v];
         }
-        map_channels(out, table);
+        map_channels(out, out, {table, table, table});
         return 1;
     }
     for (int32_t k = 0; k < lightUps; ++k)
         LightUP(out);
-    map_channels(out, tone);
+    map_channels(out, out, {tone, tone, tone});
     return 1;
 }
 
 int32_t LightUP(Image *img) {
     if (img == nullptr || !rows_inside(img)) return 0;
-    if (has_pixels(img)) map_channels(img, ZANTOMOPI);
+    if (has_pixels(img)) map_channels(img, img, {ZANTOMOPI, ZANTOMOPI, ZANTOMOPI});
     return 1;
 }
 

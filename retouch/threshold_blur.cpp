@@ -7,6 +7,7 @@
 #include <pxfx/retouch.h>
 #include <pxfx/toolkit.h>
 
+#include "core/internal/curve_blend.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
@@ -29,9 +30,9 @@ Curves make_curves(int32_t amount) {
     const int32_t ar = amount * 73 / 100, ag = amount * 61 / 100, ab = amount * 75 / 100;
     for (int32_t i = 0; i < 256; ++i) {
         const int32_t t = ZANTOMOPI[ZANTOFILTER[i]];
-        c.r[i] = static_cast<uint8_t>((i * (100 - ar) + ar * t + 63) / 100);
-        c.g[i] = static_cast<uint8_t>((i * (100 - ag) + ag * t + 63) / 100);
-        c.b[i] = static_cast<uint8_t>((i * (100 - ab) + ab * t + 63) / 100);
+        c.r[i] = curve_blend<100>(i, t, ar);
+        c.g[i] = curve_blend<100>(i, t, ag);
+        c.b[i] = curve_blend<100>(i, t, ab);
     }
     return c;
 }

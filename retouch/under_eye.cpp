@@ -5,6 +5,7 @@
 
 #include <algorithm>
 
+#include "core/internal/channel_map.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
@@ -68,7 +69,7 @@ void brighten(Image *img, int32_t level) {
         const int64_t v = static_cast<int64_t>(i) + level;
         table[i] = v > 255 ? 255 : static_cast<uint8_t>(v);
     }
-    map_channels(img, table);
+    map_channels(img, img, {table, table, table});
 }
 
 // A picture with a pixel block of the brush's bit counts; an empty size

@@ -29,8 +29,7 @@ int32_t PXImage_GreenChannel(PXImage *img) {
     // pixel is visited, and copying the unwritten scratch back is left out
     // (1, image unchanged).
     if (!px_usable(img)) {
-        const int64_t bytes = block_size(img->width, img->height, size);
-        return bytes != kNoSize && bytes > 0 ? 1 : 0;
+        return buffer_size_ok(block_size(img->width, img->height, size)) ? 1 : 0;
     }
     const auto bpp = static_cast<size_t>(size);
     const size_t pixels = px_block(img) / bpp;

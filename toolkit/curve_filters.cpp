@@ -8,6 +8,7 @@
 #include <cstdlib>
 
 #include "core/internal/byte_map.hpp"
+#include "core/internal/curve_blend.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/pixel.hpp"
@@ -141,11 +142,11 @@ int32_t ColorFilter1(Image *img, int32_t level) {
 
 int32_t ColorFilter_zanto(Image *img, int32_t level) {
     if (!level_usable(img, level)) return 0;
-    const int32_t d = std::abs(level - 128), e = 127 - d;
+    const int32_t d = std::abs(level - 128);
     const uint8_t *curve = (level & 128) != 0 ? ZANTOFILTER : ZANTOFILTERBK;
     Map table;
     for (int32_t i = 0; i < 256; ++i)
-        table[i] = static_cast<uint8_t>((e * i + d * curve[i] + 63) / 127);
+        table[i] = curve_blend<127>(i, curve[i], d);
     apply_plane(img, table);
     return 1;
 }

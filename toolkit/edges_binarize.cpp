@@ -38,7 +38,7 @@ int32_t PXImage_EdgeDetection(PXImage *img) {
     if (!filter_input_ok(img)) return 0;
     if (!px_usable(img)) return filter_without_rows(img);
     bool ok = true;
-    if (!with_sample_format(img->bitcount, [&](auto f) { ok = edge_filter<decltype(f)>(img); })) return 1;
+    if (!with_packed_format(img->bitcount, [&](auto f) { ok = edge_filter<decltype(f)>(img); })) return 1;
     return ok ? 1 : 0;
 }
 
@@ -50,8 +50,7 @@ int32_t PXImage_GrayToBinarization(PXImage *img) {
     // block for a count of 0 or below (0). With both sizes negative it does,
     // and no sample is read or mapped (1).
     if (!px_usable(img)) {
-        const int64_t plane = block_size(img->width, img->height, 1);
-        return plane != kNoSize && plane > 0 ? 1 : 0;
+        return buffer_size_ok(block_size(img->width, img->height, 1)) ? 1 : 0;
     }
     const size_t pixels = static_cast<size_t>(img->width) * static_cast<size_t>(img->height);
     uint8_t *d = img->data;

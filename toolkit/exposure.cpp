@@ -4,6 +4,7 @@
 
 #include <cmath>
 
+#include "core/internal/byte_map.hpp"
 #include "core/internal/memory.hpp"
 #include "toolkit/pximage_check.hpp"
 
@@ -67,11 +68,6 @@ struct FixedCurve {
     }
 };
 
-void map_bytes(uint8_t *data, size_t n, const uint8_t *table) {
-    for (size_t i = 0; i < n; ++i)
-        data[i] = table[data[i]];
-}
-
 int32_t expose_gray(PXImage *img, bool fixedCurve) {
     const size_t n = px_block(img);
     uint32_t hist[256] = {};
@@ -79,14 +75,15 @@ int32_t expose_gray(PXImage *img, bool fixedCurve) {
         ++hist[img->data[i]];
     const Percentiles p = percentiles(hist, 256, n, 255);
     if (p.low >= kBrightLow) return 0;
+    uint8_t stretched[256];
+    const uint8_t *table = stretched;
     if (fixedCurve) {
         static const FixedCurve curve;
-        map_bytes(img->data, n, curve.table);
+        table = curve.table;
     } else {
-        uint8_t table[256];
-        stretch_table(table, p);
-        map_bytes(img->data, n, table);
+        stretch_table(stretched, p);
     }
+    map_bytes(img->data, img->data, n, 1, &table);
     return 1;
 }
 
@@ -100,6 +97,7 @@ int32_t expose_colour(PXImage *img) {
         ++hist[2][d[3 * i + 2]];
     }
     uint8_t table[3][256];
+    const uint8_t *tables[3] = {table[0], table[1], table[2]};
     for (int32_t c = 0; c < 3; ++c) {
         const Percentiles p = percentiles(hist[c], 256, pixels, 255);
         if (p.low >= kBrightLow)
@@ -108,11 +106,7 @@ int32_t expose_colour(PXImage *img) {
         else
             stretch_table(table[c], p);
     }
-    for (size_t i = 0; i < pixels; ++i) {
-        d[3 * i] = table[0][d[3 * i]];
-        d[3 * i + 1] = table[1][d[3 * i + 1]];
-        d[3 * i + 2] = table[2][d[3 * i + 2]];
-    }
+    map_bytes(d, d, pixels, 3, tables);
     return 1;
 }
 

@@ -9,37 +9,10 @@
 #include <cstdint>
 
 #include "core/internal/memory.hpp"
+#include "core/internal/pixel.hpp"
 #include "toolkit/pximage_check.hpp"
 
 namespace pxfx::packed {
-
-// Samples of a format: bytes for 8 bits (one per pixel) and 24 bits (three),
-// little-endian words for 16 bits.
-struct Bytes1 {
-    using T = uint8_t;
-    static constexpr int32_t kChannels = 1;
-    static constexpr int32_t kMax = 255;
-};
-struct Bytes3 {
-    using T = uint8_t;
-    static constexpr int32_t kChannels = 3;
-    static constexpr int32_t kMax = 255;
-};
-struct Words1 {
-    using T = uint16_t;
-    static constexpr int32_t kChannels = 1;
-    static constexpr int32_t kMax = 65535;
-};
-
-// Calls fn(Format{}) for 8, 16 or 24 bits and returns true, or returns false.
-template <class Fn> bool with_sample_format(int32_t bitcount, Fn &&fn) {
-    switch (bitcount) {
-    case 8: fn(Bytes1{}); return true;
-    case 16: fn(Words1{}); return true;
-    case 24: fn(Bytes3{}); return true;
-    default: return false;
-    }
-}
 
 // True for records the in-place filters take: data, and rows that stay
 // inside the block (or none).
@@ -56,8 +29,7 @@ inline bool filter_input_ok(const PXImage *img) {
 inline int32_t filter_without_rows(const PXImage *img) {
     const int32_t bits = img->bitcount;
     if (bits != 8 && bits != 16 && bits != 24) return 1;
-    const int64_t bytes = block_size(img->width, img->height, px_bytes(bits));
-    return bytes != kNoSize && bytes > 0 ? 1 : 0;
+    return buffer_size_ok(block_size(img->width, img->height, px_bytes(bits))) ? 1 : 0;
 }
 
 // Neighbourhood rows of `size` x `size` windows. Padded row r holds the

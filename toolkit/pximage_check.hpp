@@ -8,7 +8,6 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
-#include <limits>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
@@ -53,22 +52,6 @@ inline size_t px_block(const PXImage *im) {
 // or height of 0 or below (such a record has no pixel rows).
 inline size_t px_held(const PXImage *im) { return px_usable(im) ? px_block(im) : 0; }
 
-// Marks a size that does not fit the 32-bit arithmetic of the toolkit.
-inline constexpr int64_t kNoSize = std::numeric_limits<int64_t>::min();
-
-// width x height x bpp as the toolkit's signed size arithmetic gives it: 0 for
-// an empty size, negative when exactly one size is negative, positive when
-// both are. kNoSize when a size or the product lies outside the signed 32-bit
-// range (the toolkit refuses such sizes instead of letting them wrap).
-inline int64_t block_size(int64_t width, int64_t height, int32_t bpp) {
-    constexpr int64_t lo = std::numeric_limits<int32_t>::min(), hi = std::numeric_limits<int32_t>::max();
-    if (width < lo || width > hi || height < lo || height > hi) return kNoSize;
-    const int64_t pixels = width * height;
-    if (pixels < -hi || pixels > hi) return kNoSize;
-    const int64_t bytes = pixels * bpp;
-    return bytes < -hi || bytes > hi ? kNoSize : bytes;
-}
-
 // A new record of width x height pixels (sizes from block_size) with a block
 // of `bytes` bytes. A count of 0 or below gives data null, as PX_malloc gives
 // no block for it. A positive block is left uninitialised. Null when the
@@ -97,7 +80,7 @@ inline PXImage *px_record(int64_t width, int64_t height, int32_t bitcount, int64
 // a failed allocation) or does not fit, or when an allocation fails.
 inline PXImage *px_new(int64_t width, int64_t height, int32_t bitcount) {
     const int64_t bytes = block_size(width, height, px_bytes(bitcount));
-    if (bytes == kNoSize || bytes <= 0) return nullptr;
+    if (!buffer_size_ok(bytes)) return nullptr;
     PXImage *im = px_record(width, height, bitcount, bytes);
     if (im != nullptr && width < 0) std::memset(im->data, 0, static_cast<size_t>(bytes));
     return im;

@@ -131,7 +131,6 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
     return true;
 }
 
-#if PXFX_X86_DISPATCH
 // The same code compiled for AVX-512, whose gathers let the column blends run
 // in vectors; the float operations and their order are the same.
 template <int C>
@@ -139,16 +138,12 @@ PXFX_WIDE bool interpolate_wide(const uint8_t *src, int32_t srcWidth, int32_t sr
                                 int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
     return interpolate<C>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
 }
-#endif
 
 template <int C>
 bool interpolate_any(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
                      int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
-#if PXFX_X86_DISPATCH
-    if (cpu::has_avx512())
-        return interpolate_wide<C>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
-#endif
-    return interpolate<C>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
+    return cpu::pick(&interpolate<C>, &interpolate_wide<C>)(src, srcWidth, srcHeight, srcStride, dst, dstWidth,
+                                                            dstHeight, dstStride, ry, rx);
 }
 
 bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,

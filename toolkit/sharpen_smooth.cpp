@@ -9,6 +9,7 @@
 
 #include "core/internal/cpu.hpp"
 #include "core/internal/memory.hpp"
+#include "core/internal/rank.hpp"
 #include "toolkit/neighbourhood.hpp"
 #include "toolkit/pximage_check.hpp"
 
@@ -67,33 +68,29 @@ template <class F> bool mean_smooth(PXImage *img, int32_t size) {
     return true;
 }
 
-// Median of byte samples with a sliding histogram per row and channel: the
-// level m with count(< m) <= k < count(<= m), k = size^2 / 2, is element k of
-// the sorted window.
+// Median of byte samples with a sliding histogram per row and channel and
+// the tracked element k = size^2 / 2 of the sorted window.
 template <class F> void median_row_bytes(const uint8_t *const *rows, int32_t size, size_t width, int32_t *acc) {
     constexpr int32_t C = F::kChannels;
     const int32_t half = size / 2, k = size * size / 2;
     for (int32_t c = 0; c < C; ++c) {
-        int32_t hist[256] = {};
+        rank::Histogram<256, int32_t> hist;
+        hist.reset();
         for (int32_t ky = 0; ky < size; ++ky)
             for (int32_t kx = -half; kx <= half; ++kx)
-                ++hist[rows[ky][static_cast<ptrdiff_t>(kx) * C + c]];
-        int32_t med = 0, below = 0;
+                hist.add(rows[ky][static_cast<ptrdiff_t>(kx) * C + c]);
+        rank::Cursor med{};
         for (size_t x = 0;; ++x) {
-            while (below > k)
-                below -= hist[--med];
-            while (below + hist[med] <= k)
-                below += hist[med++];
-            acc[x * C + c] = med;
+            acc[x * C + c] = med.settle(hist, k);
             if (x + 1 == width) break;
             const ptrdiff_t out = (static_cast<ptrdiff_t>(x) - half) * C + c;
             const ptrdiff_t in = (static_cast<ptrdiff_t>(x) + half + 1) * C + c;
             for (int32_t ky = 0; ky < size; ++ky) {
                 const uint8_t a = rows[ky][out], b = rows[ky][in];
-                --hist[a];
-                below -= a < med;
-                ++hist[b];
-                below += b < med;
+                hist.remove(a);
+                med.removed(a);
+                hist.add(b);
+                med.added(b);
             }
         }
     }
@@ -195,21 +192,12 @@ void median5_row(const uint8_t *const *rows, int32_t channels, size_t n, int32_t
     median_row_network<5, 16>(rows, channels, n, acc);
 }
 
-#if PXFX_X86_DISPATCH
 // The same network compiled for 64-byte vectors, for processors that have them.
 PXFX_WIDE void median5_row_wide(const uint8_t *const *rows, int32_t channels, size_t n, int32_t *acc) {
     median_row_network<5, 64>(rows, channels, n, acc);
 }
-#endif
 
-MedianRow pick_median5() {
-#if PXFX_X86_DISPATCH
-    static const MedianRow fn = cpu::has_avx512() ? &median5_row_wide : &median5_row;
-    return fn;
-#else
-    return &median5_row;
-#endif
-}
+MedianRow pick_median5() { return cpu::pick(&median5_row, &median5_row_wide); }
 
 // Median of 16-bit samples by selection of element size^2 / 2.
 void median_row_words(const uint16_t *const *rows, int32_t size, size_t width, int32_t *acc) {
@@ -256,7 +244,7 @@ int32_t PXImage_Sharpen(PXImage *img, int32_t strength) {
     if (!px_usable(img)) return filter_without_rows(img);
     const int32_t size = strength < 40 ? 3 : (strength < 80 ? 5 : 7);
     bool ok = true;
-    if (!with_sample_format(img->bitcount, [&](auto f) { ok = sharpen<decltype(f)>(img, size); })) return 1;
+    if (!with_packed_format(img->bitcount, [&](auto f) { ok = sharpen<decltype(f)>(img, size); })) return 1;
     return ok ? 1 : 0;
 }
 
@@ -266,7 +254,7 @@ int32_t PXImage_Smooth(PXImage *img, int32_t strength) {
     const bool median = strength >= 60;
     const int32_t size = strength < 20 ? 3 : (strength < 40 ? 5 : (strength < 60 ? 7 : (strength < 80 ? 5 : 7)));
     bool ok = true;
-    if (!with_sample_format(img->bitcount, [&](auto f) {
+    if (!with_packed_format(img->bitcount, [&](auto f) {
             using F = decltype(f);
             ok = median ? median_smooth<F>(img, size) : mean_smooth<F>(img, size);
         }))

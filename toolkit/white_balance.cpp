@@ -134,8 +134,7 @@ int32_t PXImage_AutoWhiteBalance(PXImage *img, const PXPoint *pt) {
     // block for a count of 0 or below (0). With both sizes negative it would,
     // and then no sample is mapped (1).
     if (!px_usable(img)) {
-        const int64_t plane = block_size(img->width, img->height, 1);
-        return plane != kNoSize && plane > 0 ? 1 : 0;
+        return buffer_size_ok(block_size(img->width, img->height, 1)) ? 1 : 0;
     }
     return img->bitcount == 24 ? balance_colour(img, pt) : balance_gray(img, pt);
 }

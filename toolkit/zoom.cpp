@@ -167,9 +167,8 @@ int32_t PXImage_ROI_Zoom(const PXImage *src, PXImage *dst, const PXRect *rect, d
     // fails; counts beyond 32 bits are refused.
     const auto gatherWidth = trunc_sat<int32_t>(static_cast<double>(rectWidth) / scale + 0.5);
     const auto gatherHeight = trunc_sat<int32_t>(static_cast<double>(rectHeight) / scale + 0.5);
-    const int64_t gatherBytes = block_size(gatherWidth, gatherHeight, 1);
     const int64_t outBytes = block_size(rectWidth, rectHeight, 1);
-    if (gatherBytes == kNoSize || gatherBytes <= 0 || outBytes == kNoSize || outBytes <= 0) return 0;
+    if (!buffer_size_ok(block_size(gatherWidth, gatherHeight, 1)) || !buffer_size_ok(outBytes)) return 0;
     // Both rectangle sizes negative: the interpolation and the writes have
     // empty loops. A target without data or pixel rows takes no writes.
     // Either way nothing gathered would be seen.

@@ -1,8 +1,9 @@
 // Byte tables over rows of interleaved channels: byte k of every pixel goes
-// through tables[k]. The per-channel maps of the tone effects, the curve
-// filters and most retouching curves end here, so the one routine that does
-// the lookups can use the widest table-lookup instructions the machine has.
-// Every path gives the same bytes as the plain loop.
+// through tables[k]. The per-channel table maps of pictures (map_channels in
+// core/internal/channel_map.hpp) and of packed sample blocks end here, so the
+// one routine that does the lookups can use the widest table-lookup
+// instructions the machine has (chosen through cpu::pick). Every path gives
+// the same bytes as the plain loop.
 #pragma once
 
 #include <cstddef>
@@ -17,9 +18,6 @@ extern const uint8_t kIdentityMap[256];
 // equal out. tables holds `channels` pointers to 256-entry tables.
 void map_bytes(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const uint8_t *const *tables);
 
-// The same through the plain loop only (the reference of the fast paths).
-void map_bytes_portable(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const uint8_t *const *tables);
-
 // A tone map of 3- and 4-byte pixels (blue, green, red, alpha): blue and red
 // through their tables, green raised (or, with lower, lowered) by q[red],
 // saturating at 255 (or 0); alpha kept.
@@ -28,6 +26,5 @@ struct ToneTables {
     bool lower;
 };
 void tone_bytes(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const ToneTables &t);
-void tone_bytes_portable(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const ToneTables &t);
 
 } // namespace pxfx

@@ -81,4 +81,27 @@ constexpr size_t checked_size(uint64_t a, uint64_t b, uint64_t c = 1) {
     return static_cast<size_t>(ab * c);
 }
 
+// Marks a size that does not fit signed 32-bit arithmetic.
+inline constexpr int64_t kNoSize = INT64_MIN;
+
+// width x height x unit as signed 32-bit size arithmetic gives it for sizes
+// that may be 0 or negative: 0 for an empty size, negative when exactly one
+// size is negative, positive when both are. kNoSize when a size, the pixel
+// count or the product lies outside the signed 32-bit range (such sizes are
+// refused instead of left to wrap).
+constexpr int64_t block_size(int64_t width, int64_t height, int32_t unit) {
+    constexpr int64_t lo = INT32_MIN, hi = INT32_MAX;
+    if (width < lo || width > hi || height < lo || height > hi) return kNoSize;
+    const int64_t pixels = width * height;
+    if (pixels < -hi || pixels > hi) return kNoSize;
+    const int64_t bytes = pixels * unit;
+    return bytes < -hi || bytes > hi ? kNoSize : bytes;
+}
+
+// True when a work buffer of `bytes` bytes, a count computed in signed
+// arithmetic from sizes that may be 0 or negative (or kNoSize), can be had:
+// the count is positive (no block is allocated for 0 or below) and at most
+// kMaxBlockBytes.
+constexpr bool buffer_size_ok(int64_t bytes) { return bytes > 0 && bytes <= static_cast<int64_t>(kMaxBlockBytes); }
+
 } // namespace pxfx

@@ -19,6 +19,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <type_traits>
 
 #include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
@@ -155,6 +156,18 @@ template <class Fn> void with_formats(const Image *src, const Image *dst, Fn &&f
         fn(AnyFormat{}, AnyFormat{});
 }
 
+// Writes fn(colour) of every pixel of src to the same place of dst (src
+// itself, or a record of the same size); both records have format F.
+template <class F, class Fn> void map_pixels(const Image *src, Image *dst, Fn fn) {
+    const int32_t w = src->width;
+    for (int32_t y = 0; y < src->height; ++y) {
+        const typename F::CRow in = F::crow(src, y);
+        const typename F::Row out = F::row(dst, y);
+        for (int32_t x = 0; x < w; ++x)
+            F::store(out, x, fn(F::load(in, x)));
+    }
+}
+
 // The pixels a kernel reads from a record that may have no pixel block. The
 // pixel readers read such a record as 0; for the byte formats (8, 16, 24 and
 // 32 bits) the view stands in a record of the same size and bit count whose
@@ -183,5 +196,28 @@ class ReadView {
     Image stand_in_{};
     Buffer<uint8_t> zeros_;
 };
+
+// ---- Packed rows ----------------------------------------------------------
+// The same formats in the toolkit's PXImage records, whose rows of width
+// pixels follow each other without padding, seen as samples: a pixel holds
+// kChannels samples of type T (bytes; one little-endian word for 16 bits,
+// filtered as one sample of 0 .. 65535), each at most kMax.
+template <class F> struct Packed {
+    static constexpr uint32_t kBitCount = F::kBitCount;
+    using T = std::conditional_t<kBitCount == 16, uint16_t, uint8_t>;
+    static constexpr int32_t kChannels = static_cast<int32_t>(kBitCount / (8 * sizeof(T)));
+    static constexpr int32_t kMax = static_cast<T>(~0u);
+};
+
+// Calls fn(Packed<Format>{}) for 8, 16 or 24 bits and returns true; returns
+// false for any other bit count.
+template <class Fn> bool with_packed_format(int32_t bitCount, Fn &&fn) {
+    switch (bitCount) {
+    case 8: fn(Packed<Gray8>{}); return true;
+    case 16: fn(Packed<Word16>{}); return true;
+    case 24: fn(Packed<Bgr24>{}); return true;
+    default: return false;
+    }
+}
 
 } // namespace pxfx

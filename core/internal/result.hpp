@@ -1,10 +1,21 @@
-// The result-image rule shared by effects, deformations and the retouch tools
-// that fill a caller's slot.
+// How functions that fill a caller's slot (`Image **`) deliver their result.
+// Each rule is named here once and used by name:
+//  - reuse the slot (prepare_slot, acquire_result): effects, deformations
+//    and the retouch tools;
+//  - in place or slot (InPlaceOrSlot): the line tools and PX_IMG_Smooth;
+//  - hand over a new record (hand_over): the empty slot of in place or slot.
+// The packed toolkit has no slots: its functions return a new PXImage
+// (px_new, px_record in toolkit/pximage_check.hpp) or work in place on the
+// caller's record.
 #pragma once
 
 #include <pxfx/core.h>
 
+#include "core/internal/memory.hpp"
+
 namespace pxfx {
+
+// ---- Reuse the slot ------------------------------------------------------
 
 // The output-slot rule for `*dst` and a record `src` (neither null):
 //  - an image in the slot with the source's bit count, height and width is
@@ -24,5 +35,45 @@ Image *prepare_slot(const Image *src, Image **dst);
 // (has_pixels): a reused image without pixels or an empty size gives success
 // with nothing drawn.
 Image *acquire_result(const Image *src, Image **dst);
+
+// ---- Hand over a new record ----------------------------------------------
+
+// The record made for the result becomes the slot's image; the caller owns it
+// from then on. Whatever the slot held is not released.
+inline void hand_over(Image **out, ImagePtr result) { *out = result.release(); }
+
+// ---- In place or slot ----------------------------------------------------
+
+// The result goes into the source itself when the slot pointer `out` is null,
+// into a new record that becomes the slot's image when the slot is empty, and
+// otherwise into the image the slot holds, by PX_Img_Copy (a converting copy
+// when that image's size or bit count differ). An image in the slot is never
+// released. The two members are the two moments a function can apply the
+// rule: after making its result apart, or before working in place.
+class InPlaceOrSlot {
+  public:
+    InPlaceOrSlot(Image *src, Image **out) : src_(src), out_(out) {}
+
+    // A result made apart in a record of its own: copied into the source or
+    // the slot's image (the record is then released), or, for an empty slot,
+    // handed over. Always 1.
+    int32_t deliver(ImagePtr result) const;
+
+    // The record to work on in place, holding the source's pixels: the source
+    // itself, the slot's image with the source copied in, or for an empty
+    // slot a new record of the source's sizes and bit count, the source copied
+    // in, put in the slot. Null when that new record cannot be made.
+    Image *work_target();
+
+    // After failed work on work_target(): a record it put in the empty slot is
+    // released and the slot is empty again. The source or the slot's own image
+    // keeps what the work left in it.
+    void discard_new();
+
+  private:
+    Image *src_;
+    Image **out_;
+    bool made_ = false;
+};
 
 } // namespace pxfx

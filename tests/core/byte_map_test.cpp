@@ -1,40 +1,45 @@
-// The vector table lookups against the plain loop: every pixel count around
-// the vector block sizes, in place and into another buffer, 1-, 3- and 4-byte
-// pixels, tables that use all 256 entries; plain maps and tone maps.
+// The channel mapper against its per-pixel definition: load the colour
+// through the accessors, map blue, green and red, keep alpha, store it. Every
+// bit count the accessors know, into a record of the same or another bit
+// count and in place, with padded rows and a different map on each of three
+// rows (which changes the 16-bit field tables from row to row).
 #include <gtest/gtest.h>
 
 #include <random>
 #include <vector>
 
-#include "core/internal/byte_map.hpp"
+#include "core/internal/channel_map.hpp"
+#include "support/test_images.hpp"
 
-TEST(ByteMap, VectorPathsMatchThePlainLoop) {
-    std::mt19937 rng(5);
-    std::vector<uint8_t> tables(4 * 256);
+using pxtest::Owned;
+
+TEST(ChannelMap, MatchesThePerPixelDefinition) {
+    std::mt19937 rng(11);
+    std::vector<uint8_t> tables(9 * 256);
     for (auto &v : tables)
         v = static_cast<uint8_t>(rng());
-    const uint8_t *t[4] = {&tables[0], &tables[256], &tables[512], &tables[768]};
-    enum Kind { kMap, kRaise, kLower };
-    for (int channels : {1, 3, 4})
-        for (Kind kind : {kMap, kRaise, kLower})
-            for (size_t pixels : {0, 1, 15, 16, 17, 63, 64, 65, 127, 128, 129, 200, 1000}) {
-                if (channels == 1 && kind != kMap) continue;
-                const pxfx::ToneTables tone{t[0], t[1], t[2], kind == kLower};
-                auto run = [&](bool portable, const uint8_t *from, uint8_t *to) {
-                    if (kind == kMap)
-                        (portable ? pxfx::map_bytes_portable : pxfx::map_bytes)(from, to, pixels, channels, t);
-                    else
-                        (portable ? pxfx::tone_bytes_portable : pxfx::tone_bytes)(from, to, pixels, channels, tone);
-                };
-                // One byte past the pixels stays as it was.
-                std::vector<uint8_t> in(pixels * channels + 1);
-                for (auto &v : in)
-                    v = static_cast<uint8_t>(rng());
-                std::vector<uint8_t> want(in.size(), in.back()), got = want, inPlace = in;
-                run(true, in.data(), want.data());
-                run(false, in.data(), got.data());
-                run(false, inPlace.data(), inPlace.data());
-                EXPECT_EQ(got, want) << channels << " channels, kind " << kind << ", " << pixels << " pixels";
-                EXPECT_EQ(inPlace, want) << channels << " channels, kind " << kind << ", " << pixels << " pixels";
-            }
+    pxfx::ChannelMap maps[3];
+    for (int k = 0; k < 3; ++k)
+        maps[k] = {&tables[768 * k], &tables[768 * k + 256], &tables[768 * k + 512]};
+    auto pick = [&](int32_t y) { return &maps[y % 3]; };
+    const int32_t w = 67, h = 7;
+    for (int32_t bits : {1, 4, 8, 16, 24, 32})
+        for (int32_t outBits : {bits, 8, 32}) {
+            const Owned src = pxtest::random_image(w, h, bits, static_cast<uint32_t>(bits));
+            const Owned want = pxtest::make(w, h, outBits), got = pxtest::make(w, h, outBits);
+            for (int32_t y = 0; y < h; ++y)
+                for (int32_t x = 0; x < w; ++x) {
+                    const uint32_t c = GetPixelColor(src.get(), x, y);
+                    const pxfx::ChannelMap &m = *pick(y);
+                    SetPixelColor(want.get(), x, y,
+                                  pxfx::pack(m.b[pxfx::blue_of(c)], m.g[pxfx::green_of(c)], m.r[pxfx::red_of(c)],
+                                             pxfx::alpha_of(c)));
+                }
+            pxfx::map_channel_rows(src.get(), got.get(), pick);
+            EXPECT_EQ(pxtest::diff(got.get(), want.get()), "") << bits << " to " << outBits << " bits";
+            if (outBits != bits) continue;
+            const Owned inPlace = pxtest::clone(src.get());
+            pxfx::map_channel_rows(inPlace.get(), inPlace.get(), pick);
+            EXPECT_EQ(pxtest::diff(inPlace.get(), want.get()), "") << bits << " bits in place";
+        }
 }
