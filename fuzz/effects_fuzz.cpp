@@ -3,9 +3,9 @@
 // The effects on pictures are fuzzed through the registry (operations).
 #include "fuzz_input.hpp"
 
-extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size) {
+extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t bytes) {
     using namespace fuzz;
-    Input in(data, size);
+    Input in(data, bytes);
     const int32_t w = in.range(1, 32), h = in.range(1, 32);
     // The sum reads column `width`, one byte past the last row's end.
     std::vector<uint8_t> plane(static_cast<size_t>(w) * static_cast<size_t>(h) + 1);

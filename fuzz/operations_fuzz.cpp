@@ -64,11 +64,15 @@ void call(const pxop::Contract<Image> &c, Input &in) {
     ImageGuard b{c.pictures > 1 ? make_partner(in, a.img) : nullptr};
     Slot out(in, a.img);
     pxop::Call<Image> call{in.one_in(32) ? nullptr : a.img, b.img};
-    call.slot = out.get();
+    // A function that wants an empty slot gets one (or none).
+    if (!c.empty_slot)
+        call.slot = out.get();
+    else if (in.one_in(16))
+        call.slot = nullptr;
     call.p = contract_param(in);
     const auto &fn = c.also && in.one_in(2) ? c.also : c.call;
     fn(call);
-    // A picture the function returned (the slot's is released with the slot).
+    // The picture in the call's own slot, or one the function returned.
     free_Image(&call.out, 0);
 }
 

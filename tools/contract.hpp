@@ -36,6 +36,7 @@ template <class R> struct Contract {
     int pictures = 1;                       // pictures it reads: a, then b
     std::vector<int32_t> formats_b;         // bit counts of b (empty: as a)
     bool slot = true;                       // a null result slot is refused
+    bool empty_slot = false;                // the slot must be empty: what it holds is not released
     bool mismatch_fails = false;            // pictures of different sizes are refused
     bool keeps_result_on_failure = false;   // a failed working allocation leaves the prepared result
     int32_t typical = 3;                    // an ordinary parameter value

@@ -17,6 +17,13 @@ using C = Call<Image>;
 const DeformationPair kHostilePairs[] = {
     {1, 1, 2, 2}, {1e300, 3, 4, -1e300}, {5, INT_MIN, INT_MAX, 6}, {NAN, 1, 1, INFINITY}};
 
+// A still height map covering a picture of up to 4096 x 4096 (rows of the
+// width rounded up to 4 entries); 16 x 16 for any other record.
+std::vector<int16_t> flat_wave_map(const Image *im) {
+    const bool fits = im != nullptr && im->width > 0 && im->height > 0 && im->width <= 4096 && im->height <= 4096;
+    return std::vector<int16_t>(fits ? (static_cast<size_t>(im->width) + 3) / 4 * 4 * im->height : 16 * 16);
+}
+
 // Warps into a slot from one picture of any bit count.
 Contract<Image> slot_warp(std::function<int64_t(C &)> call) { return {.formats = kAnyBits, .call = std::move(call)}; }
 // Functions writing one picture into another of the same size; a source
@@ -124,8 +131,8 @@ void add_deform(std::vector<Operation> &t) {
     t.push_back(contract_row(PXOP_FN(render_wave), "Deformations",
                              two(
                                  [](C &c) -> int64_t {
-                                     static int16_t map[16 * 16];
-                                     return render_wave(c.a, c.b, map, c.p, c.p), 0;
+                                     const std::vector<int16_t> map = flat_wave_map(c.a);
+                                     return render_wave(c.a, c.b, map.data(), c.p, c.p), 0;
                                  },
                                  kNoResult)));
 }

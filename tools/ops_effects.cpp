@@ -183,6 +183,7 @@ void add_effects(std::vector<Operation> &t) {
                  [](const Image *in, const Args &) { return effect(imOil_1, in); },
                  Contract<Image>{.formats = {24, 32},
                                  .call = [](C &c) { return imOil_1(c.a, c.slot); },
+                                 .empty_slot = true,
                                  .falls_back_on_failure = true}});
     t.push_back({"compress-levels",
                  PXOP_FN(ColorCompress),
