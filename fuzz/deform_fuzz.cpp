@@ -1,17 +1,12 @@
-// Fuzzes the deformations: polar transforms with any mode, radius and factor,
-// the wave with hand-made height maps and mismatched records, and the
-// free-form warp with control pairs inside, outside and far off the picture
-// (NaN and infinities included).
+// Fuzzes the deformations' lists and maps: the wave with hand-made height
+// maps and mismatched records, and the free-form warp with control pairs
+// inside, outside and far off the picture (NaN and infinities included). The
+// polar transforms are fuzzed through the registry (operations).
 #include "fuzz_input.hpp"
 
 namespace {
 
 using namespace fuzz;
-
-using Transform = uint32_t (*)(Image *, Image **);
-
-const Transform kTransforms[] = {Punch_Transform, Pinch_Transform, Swirl_Transform, Cylinder_Transform,
-                                 Bathroom_Transform};
 
 std::vector<DeformationPair> pairs(Input &in, const Image *im, size_t n) {
     const double w = im != nullptr ? im->width : 64, h = im != nullptr ? im->height : 64;
@@ -35,46 +30,31 @@ std::vector<int16_t> wave_map(Input &in, const Image *im) {
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size) {
     Input in(data, size);
-    const uint32_t pick = in.byte() % 10;
+    const uint32_t pick = in.byte() % 7;
     ImageGuard src{make_image(in)};
     Image *source = in.one_in(32) ? nullptr : src.img;
     switch (pick) {
     case 0: {
-        Slot out(in, src.img);
-        CircleTransform(source, out.get(), in.param(0, 5), in.param(0, 80), static_cast<float>(in.real(-200, 200)));
-        break;
-    }
-    case 1: {
-        Slot out(in, src.img);
-        kTransforms[in.byte() % 5](source, out.get());
-        break;
-    }
-    case 2: {
-        Slot out(in, src.img);
-        Wave_Transform(source, out.get(), in.param(0, 40));
-        break;
-    }
-    case 3: {
         const int32_t w = in.range(-1, 64), h = in.range(-1, 64);
         std::vector<int16_t> map(w > 0 && h > 0 ? static_cast<size_t>((w + 3) / 4 * 4 * h) : 1);
         create_wave(maybe_null(in, map), w, h, in.param(-8, 72), in.param(-8, 72), in.param(0, 40));
         break;
     }
-    case 4: {
+    case 1: {
         ImageGuard dst{make_partner(in, src.img)};
         std::vector<int16_t> map = wave_map(in, src.img);
         render_wave(source, dst.img, maybe_null(in, map), in.i32(), in.i32());
         break;
     }
-    case 5:
-    case 6: {
+    case 2:
+    case 3: {
         std::vector<DeformationPair> list = pairs(in, src.img, static_cast<size_t>(in.range(0, 6)));
         Slot out(in, src.img);
         DeformationImage(source, maybe_null(in, list, 32), static_cast<uint32_t>(list.size()), out.get());
         break;
     }
-    case 7:
-    case 8: {
+    case 4:
+    case 5: {
         ImageGuard dst{make_partner(in, src.img)};
         std::vector<DeformationPair> list = pairs(in, src.img, static_cast<size_t>(in.range(0, 6)));
         const int32_t count = !in.one_in(16) ? static_cast<int32_t>(list.size()) : in.nonpositive();

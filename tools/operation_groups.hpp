@@ -1,4 +1,4 @@
-// The entries of the operation table, one function per subsystem (tools/ops_*.cpp).
+// The rows of the registry, one function per subsystem (tools/ops_*.cpp).
 #pragma once
 
 #include <vector>
@@ -7,6 +7,7 @@
 
 namespace pxop {
 
+void add_core(std::vector<Operation> &table);
 void add_color(std::vector<Operation> &table);
 void add_effects(std::vector<Operation> &table);
 void add_deform(std::vector<Operation> &table);

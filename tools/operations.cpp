@@ -17,6 +17,7 @@ std::vector<Operation> build_table() {
     add_toolkit(t);
     add_retouch(t);
     add_lines(t);
+    add_core(t);
     // Keep each group together, groups in the order they first appear.
     std::vector<std::string_view> groups;
     for (const Operation &op : t)
@@ -38,9 +39,19 @@ uint32_t format_of(uint32_t bitCount) {
     }
 }
 
-const std::vector<Operation> &operations() {
+const std::vector<Operation> &registry() {
     static const std::vector<Operation> table = build_table();
     return table;
+}
+
+const std::vector<Operation> &operations() {
+    static const std::vector<Operation> runnable = [] {
+        std::vector<Operation> t;
+        for (const Operation &op : registry())
+            if (!op.name.empty()) t.push_back(op);
+        return t;
+    }();
+    return runnable;
 }
 
 const Operation *find_operation(std::string_view name) {

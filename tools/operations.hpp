@@ -1,7 +1,9 @@
-// The operation table: one entry per exported image operation, with its
-// parameters, the formats it accepts and how to call it. The command-line tool,
-// the gallery and the tests all iterate this table; adding an operation means
-// adding one entry in the ops_*.cpp file of its subsystem.
+// The registry: one row per exported picture function, with its parameters,
+// the formats it accepts, its hostile-input contract and how to call it. The
+// command-line tool, the gallery, the golden hashes, the contract tests, the
+// fuzzers, the export check and the benchmarks all iterate it; adding a
+// function means adding one row in the ops_*.cpp file of its subsystem (the
+// functions that take no picture are listed in services.cpp).
 #pragma once
 
 #include <pxfx/pxfx.h>
@@ -9,7 +11,14 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <variant>
 #include <vector>
+
+#include "contract.hpp"
+
+// The name of an exported function, taken from the function itself: a name
+// the library does not declare does not compile.
+#define PXOP_FN(fn) (static_cast<void>(&(fn)), std::string_view{#fn})
 
 namespace pxop {
 
@@ -44,9 +53,11 @@ struct Args {
     float f(size_t k) const { return static_cast<float>(values[k]); }
 };
 
+using AnyContract = std::variant<std::monostate, Contract<Image>, Contract<PXImage>>;
+
 struct Operation {
-    std::string_view name;     // command-line name
-    std::string_view function; // the C function behind it
+    std::string_view name;     // command-line name; empty for rows without one
+    std::string_view function; // the C function behind it (PXOP_FN)
     std::string_view group;
     std::string_view summary;
     std::vector<Param> params;
@@ -54,11 +65,24 @@ struct Operation {
     // Runs on `in` (of an accepted format); returns a new image the caller
     // releases with free_Image, or null when the operation failed.
     Image *(*run)(const Image *in, const Args &args);
+    // What the function promises on hostile input.
+    AnyContract contract = {};
     // False for operations whose result has another size than their input.
     bool sameSize = true;
 };
 
+// Every row; operations() keeps those the tool runs (with a name).
+const std::vector<Operation> &registry();
 const std::vector<Operation> &operations();
+
+// A row for a function the tool does not run: its contract only.
+template <class R> Operation contract_row(std::string_view function, std::string_view group, Contract<R> c) {
+    return {{}, function, group, {}, {}, 0, nullptr, std::move(c)};
+}
+
+// Names of the exported functions that take no picture (memory, files,
+// math, tables), kept beside the registry.
+const std::vector<std::string_view> &service_functions();
 const Operation *find_operation(std::string_view name);
 
 // The default arguments of an operation.

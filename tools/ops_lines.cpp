@@ -7,16 +7,28 @@ namespace pxop {
 using kit::effect;
 using kit::in_place;
 
+namespace {
+
+using C = Call<Image>;
+
+// 8-bit planes only; a null result slot means "in place" where there is one.
+Contract<Image> plane(std::function<int64_t(C &)> call, std::vector<std::string> accepts = {}, int64_t failure = 0) {
+    return {.formats = {8}, .call = std::move(call), .failure = failure, .slot = false, .accepts = std::move(accepts)};
+}
+
+} // namespace
+
 void add_lines(std::vector<Operation> &t) {
     t.push_back({"straighten",
-                 "RecognizeYUV",
+                 PXOP_FN(RecognizeYUV),
                  "Lines",
                  "Straightens along the boundary and marks line bands",
                  {},
                  kGray8,
-                 [](const Image *in, const Args &) { return effect(RecognizeYUV, in); }});
+                 [](const Image *in, const Args &) { return effect(RecognizeYUV, in); },
+                 plane([](C &c) { return RecognizeYUV(c.a, c.slot); })});
     t.push_back({"decode",
-                 "ImgDecode",
+                 PXOP_FN(ImgDecode),
                  "Lines",
                  "RecognizeYUV through its decoding entry point",
                  {},
@@ -25,49 +37,74 @@ void add_lines(std::vector<Operation> &t) {
                      Image *out = nullptr;
                      ImgDecode(const_cast<Image *>(in), &out);
                      return out;
-                 }});
+                 },
+                 plane([](C &c) { return ImgDecode(c.a, c.slot), kNoResult; }, {}, kNoResult)});
     t.push_back({"resample",
-                 "MyResample2",
+                 PXOP_FN(MyResample2),
                  "Lines",
                  "Vertical resampling then straightening",
                  {{"factor", true, 2, 49, 2, "rows per source row"}},
                  kGray8,
                  [](const Image *in, const Args &a) { return MyResample2(const_cast<Image *>(in), a.i(0)); },
+                 plane([](C &c) { return (c.out = MyResample2(c.a, c.p)) != nullptr; }),
                  false});
     t.push_back({"bands",
-                 "BinImg",
+                 PXOP_FN(BinImg),
                  "Lines",
                  "Band thresholding and line marking",
                  {},
                  kGray8,
-                 [](const Image *in, const Args &) { return effect(BinImg, in); }});
+                 [](const Image *in, const Args &) { return effect(BinImg, in); },
+                 [] {
+                     Contract<Image> c = plane([](C &c) { return BinImg(c.a, c.slot); }, {"zero width"});
+                     c.falls_back_on_failure = true;
+                     return c;
+                 }()});
     t.push_back(
         {"detect-lines",
-         "DetectLines",
+         PXOP_FN(DetectLines),
          "Lines",
          "Marks line bands of a binarised plane",
          {},
          kGray8,
-         [](const Image *in, const Args &) { return in_place(in, [](Image *p) { return DetectLines(p) == 1; }); }});
-    t.push_back(
-        {"vertical-edges", "MyEdge", "Lines", "Vertical edge marker", {}, kGray8, [](const Image *in, const Args &) {
-             return effect(MyEdge, in);
-         }});
-    t.push_back(
-        {"cross-median", "MyFliter", "Lines", "Cross-shaped median", {}, kGray8, [](const Image *in, const Args &) {
-             return effect(MyFliter, in);
-         }});
-    t.push_back({"median5", "MyFliter1", "Lines", "5 x 5 median", {}, kGray8, [](const Image *in, const Args &) {
-                     return effect(MyFliter1, in);
-                 }});
+         [](const Image *in, const Args &) { return in_place(in, [](Image *p) { return DetectLines(p) == 1; }); },
+         plane([](C &c) { return DetectLines(c.a); }, {"null pixels", "zero width"})});
+    t.push_back({"vertical-edges",
+                 PXOP_FN(MyEdge),
+                 "Lines",
+                 "Vertical edge marker",
+                 {},
+                 kGray8,
+                 [](const Image *in, const Args &) { return effect(MyEdge, in); },
+                 plane([](C &c) { return MyEdge(c.a, c.slot); })});
+    t.push_back({"cross-median",
+                 PXOP_FN(MyFliter),
+                 "Lines",
+                 "Cross-shaped median",
+                 {},
+                 kGray8,
+                 [](const Image *in, const Args &) { return effect(MyFliter, in); },
+                 plane([](C &c) { return MyFliter(c.a, c.slot); }, {"null pixels"})});
+    t.push_back({"median5",
+                 PXOP_FN(MyFliter1),
+                 "Lines",
+                 "5 x 5 median",
+                 {},
+                 kGray8,
+                 [](const Image *in, const Args &) { return effect(MyFliter1, in); },
+                 plane([](C &c) { return MyFliter1(c.a, c.slot); })});
     t.push_back(
         {"swap-red-blue",
-         "RGB_Reverse",
+         PXOP_FN(RGB_Reverse),
          "Lines",
          "Swaps the first and third byte of each pixel",
          {},
          kColour,
-         [](const Image *in, const Args &) { return in_place(in, [](Image *p) { return RGB_Reverse(p) == 1; }); }});
+         [](const Image *in, const Args &) { return in_place(in, [](Image *p) { return RGB_Reverse(p) == 1; }); },
+         Contract<Image>{.formats = kAnyBits,
+                         .call = [](C &c) { return RGB_Reverse(c.a); },
+                         .slot = false,
+                         .accepts = kEmptySizes}});
 }
 
 } // namespace pxop

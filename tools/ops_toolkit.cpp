@@ -53,11 +53,53 @@ const std::vector<Param> kRectParams = {{"left", false, 0, 100, 15, "percent of 
                                         {"right", false, 0, 100, 70, "percent of the width"},
                                         {"bottom", false, 0, 100, 20, "percent of the height (the smaller row)"}};
 
+using P = Call<PXImage>;
+
+const std::vector<int32_t> kGeometry = {8, 16, 24};
+// Every bit count, the broken records made at 0 bits: the filters leave those alone.
+const std::vector<int32_t> kEveryBits = {0, 1, 4, 8, 12, 16, 24, 32, 48};
+// Records without pixel rows (and, where named, without data).
+const std::vector<std::string> kRowless = kEmptySizes;
+const std::vector<std::string> kPixelless = {"null pixels", "zero width", "negative height", "INT_MIN width"};
+
+// A rectangle and a point following the parameter, and the address of such a
+// value for the duration of a call.
+PXRect rect(int32_t p) { return {1, p, p, 0}; }
+PXPoint point(int32_t p) { return {p, p}; }
+template <class T> const T *ptr(const T &v) { return &v; }
+
+// Contracts of functions taking the parameter and one picture, returning a
+// new record or changing the picture in place, or two pictures (no result slot).
+Contract<PXImage> made(std::vector<int32_t> formats, std::function<PXImage *(PXImage *, int32_t)> f,
+                       std::vector<std::string> accepts = {}) {
+    return {.formats = std::move(formats),
+            .call = [f](P &c) { return (c.out = f(c.a, c.p)) != nullptr; },
+            .slot = false,
+            .accepts = std::move(accepts)};
+}
+template <class R>
+Contract<R> changed(std::vector<int32_t> formats, std::function<int64_t(R *, int32_t)> f,
+                    std::vector<std::string> accepts = {}, int64_t failure = 0) {
+    return {.formats = std::move(formats),
+            .call = [f](Call<R> &c) { return f(c.a, c.p); },
+            .failure = failure,
+            .slot = false,
+            .accepts = std::move(accepts)};
+}
+Contract<PXImage> two(std::vector<int32_t> formats, std::function<int64_t(PXImage *, PXImage *, int32_t)> f,
+                      std::vector<std::string> accepts = {}) {
+    return {.formats = std::move(formats),
+            .call = [f](P &c) { return f(c.a, c.b, c.p); },
+            .pictures = 2,
+            .slot = false,
+            .accepts = std::move(accepts)};
+}
+
 } // namespace
 
 void add_toolkit(std::vector<Operation> &t) {
     t.push_back({"resize",
-                 "PXImage_Resize",
+                 PXOP_FN(PXImage_Resize),
                  "Toolkit geometry",
                  "Bilinear resize (16-bit input gives 24-bit)",
                  {{"width", false, 5, 400, 150, "percent of the width"},
@@ -69,9 +111,11 @@ void add_toolkit(std::vector<Operation> &t) {
                      if (static_cast<int64_t>(w) * h > kMaxResult) return static_cast<Image *>(nullptr);
                      return packed_new(in, [&](const PXImage *p) { return PXImage_Resize(p, w, h); });
                  },
+                 made(
+                     kGeometry, [](PXImage *a, int32_t p) { return PXImage_Resize(a, p, 3); }, kPixelless),
                  false});
     t.push_back({"interpolate",
-                 "DualLinearIntepol_KWB",
+                 PXOP_FN(DualLinearIntepol_KWB),
                  "Toolkit geometry",
                  "Plane interpolation by one scale",
                  {{"scale", false, 0.25, 4, 1.5, "source coordinate = destination coordinate / scale"}},
@@ -90,57 +134,65 @@ void add_toolkit(std::vector<Operation> &t) {
                      PXImage_Free(src);
                      return out;
                  },
+                 {},
                  false});
-    t.push_back({"crop", "PXImage_Crop", "Toolkit geometry", "Copy of a rectangle, width rounded up to 8", kRectParams,
-                 kPacked,
+    t.push_back({"crop", PXOP_FN(PXImage_Crop), "Toolkit geometry", "Copy of a rectangle, width rounded up to 8",
+                 kRectParams, kPacked,
                  [](const Image *in, const Args &a) {
                      return packed_new(in, [&](const PXImage *p) {
                          const PXRect r = rect_of(p, a, 0);
                          return PXImage_Crop(p, &r);
                      });
                  },
+                 made(
+                     kGeometry, [](PXImage *a, int32_t p) { return PXImage_Crop(a, ptr(rect(p))); }, kPixelless),
                  false});
     t.push_back({"rotate90",
-                 "PXImage_Rotate90",
+                 PXOP_FN(PXImage_Rotate90),
                  "Toolkit geometry",
                  "Quarter turn",
                  {},
                  kPacked,
                  [](const Image *in, const Args &) { return packed_new(in, PXImage_Rotate90); },
+                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_Rotate90(a); }),
                  false});
     t.push_back({"rotate180",
-                 "PXImage_Rotate180",
+                 PXOP_FN(PXImage_Rotate180),
                  "Toolkit geometry",
                  "Half turn",
                  {},
                  kPacked,
-                 [](const Image *in, const Args &) { return packed_new(in, PXImage_Rotate180); }});
+                 [](const Image *in, const Args &) { return packed_new(in, PXImage_Rotate180); },
+                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_Rotate180(a); })});
     t.push_back({"rotate270",
-                 "PXImage_Rotate270",
+                 PXOP_FN(PXImage_Rotate270),
                  "Toolkit geometry",
                  "Three-quarter turn",
                  {},
                  kPacked,
                  [](const Image *in, const Args &) { return packed_new(in, PXImage_Rotate270); },
+                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_Rotate270(a); }),
                  false});
     t.push_back({"zoom-in",
-                 "PXImage_ZoomIn",
+                 PXOP_FN(PXImage_ZoomIn),
                  "Toolkit geometry",
                  "2x enlargement",
                  {},
                  kPacked,
                  [](const Image *in, const Args &) { return packed_new(in, PXImage_ZoomIn); },
+                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_ZoomIn(a); }),
                  false});
     t.push_back({"zoom-out",
-                 "PXImage_ZoomOut",
+                 PXOP_FN(PXImage_ZoomOut),
                  "Toolkit geometry",
                  "2x reduction",
                  {},
                  kPacked,
                  [](const Image *in, const Args &) { return packed_new(in, PXImage_ZoomOut); },
+                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_ZoomOut(a); }, {"null pixels"}),
                  false});
     t.push_back({"roi-zoom",
-                 "PXImage_ROI_Zoom",
+                 PXOP_FN(PXImage_ROI_Zoom),
                  "Toolkit geometry",
                  "Scales a rectangle into the picture",
                  {{"left", false, 0, 100, 10, "percent of the width"},
@@ -157,91 +209,111 @@ void add_toolkit(std::vector<Operation> &t) {
                      });
                      PXImage_Free(src);
                      return out;
-                 }});
+                 },
+                 two({32},
+                     [](PXImage *a, PXImage *b, int32_t p) -> int64_t {
+                         return PXImage_ROI_Zoom(a, b, ptr(rect(p)), p / 3.0, p, 1);
+                     },
+                     {"null pixels", "zero width", "negative height", "INT_MIN width", "second: null pixels",
+                      "second: zero width", "second: negative height", "second: INT_MIN width"})});
     t.push_back({"auto-exposure",
-                 "PXImage_AutoExposure",
+                 PXOP_FN(PXImage_AutoExposure),
                  "Toolkit tone",
                  "Percentile stretch with a 0.4 power curve",
                  {},
                  kPacked,
                  [](const Image *in, const Args &) {
                      return packed_in_place(in, [](PXImage *p) { return PXImage_AutoExposure(p), true; });
-                 }});
+                 },
+                 changed<PXImage>(
+                     kGeometry, [](PXImage *a, int32_t) { return PXImage_AutoExposure(a); }, kRowless)});
     t.push_back({"auto-exposure-fixed",
-                 "PXImage_AutoExposure_1",
+                 PXOP_FN(PXImage_AutoExposure_1),
                  "Toolkit tone",
                  "Fixed 0.4 power curve",
                  {},
                  kPacked,
                  [](const Image *in, const Args &) {
                      return packed_in_place(in, [](PXImage *p) { return PXImage_AutoExposure_1(p), true; });
-                 }});
-    t.push_back({"white-balance",
-                 "PXImage_AutoWhiteBalance",
-                 "Toolkit tone",
-                 "White balance against a picked point",
-                 {{"x", false, 0, 100, 50, "percent of the width"}, {"y", false, 0, 100, 50, "percent of the height"}},
-                 kGray8 | kBgr24,
-                 [](const Image *in, const Args &a) {
-                     const PXPoint pt = {kit::at(in, a.values[0], true), kit::at(in, a.values[1], false)};
-                     return packed_in_place(in, [&](PXImage *p) { return PXImage_AutoWhiteBalance(p, &pt) == 1; });
-                 }});
+                 },
+                 changed<PXImage>(
+                     kGeometry, [](PXImage *a, int32_t) { return PXImage_AutoExposure_1(a); }, kRowless)});
+    t.push_back(
+        {"white-balance",
+         PXOP_FN(PXImage_AutoWhiteBalance),
+         "Toolkit tone",
+         "White balance against a picked point",
+         {{"x", false, 0, 100, 50, "percent of the width"}, {"y", false, 0, 100, 50, "percent of the height"}},
+         kGray8 | kBgr24,
+         [](const Image *in, const Args &a) {
+             const PXPoint pt = {kit::at(in, a.values[0], true), kit::at(in, a.values[1], false)};
+             return packed_in_place(in, [&](PXImage *p) { return PXImage_AutoWhiteBalance(p, &pt) == 1; });
+         },
+         changed<PXImage>({8, 24}, [](PXImage *a, int32_t p) { return PXImage_AutoWhiteBalance(a, ptr(point(p))); })});
     t.push_back({"invert",
-                 "PXImage_BlueEnhancement",
+                 PXOP_FN(PXImage_BlueEnhancement),
                  "Toolkit tone",
                  "Inverts 24-bit pictures",
                  {},
                  kPacked,
                  [](const Image *in, const Args &) {
                      return packed_in_place(in, [](PXImage *p) { return PXImage_BlueEnhancement(p) == 1; });
-                 }});
+                 },
+                 changed<PXImage>(
+                     kGeometry, [](PXImage *a, int32_t) { return PXImage_BlueEnhancement(a); }, kRowless)});
     t.push_back({"green-gray",
-                 "PXImage_GreenChannel",
+                 PXOP_FN(PXImage_GreenChannel),
                  "Toolkit tone",
                  "Green copied into every channel",
                  {},
                  kColour,
                  [](const Image *in, const Args &) {
                      return packed_in_place(in, [](PXImage *p) { return PXImage_GreenChannel(p) == 1; });
-                 }});
+                 },
+                 changed<PXImage>({24, 32}, [](PXImage *a, int32_t) { return PXImage_GreenChannel(a); })});
     t.push_back({"px-sharpen",
-                 "PXImage_Sharpen",
+                 PXOP_FN(PXImage_Sharpen),
                  "Toolkit filters",
                  "Sharpening, kernel chosen by strength",
                  {{"strength", true, 1, 100, 30, "below 40 3x3, below 80 5x5, else 7x7"}},
                  kPacked,
                  [](const Image *in, const Args &a) {
                      return packed_in_place(in, [&](PXImage *p) { return PXImage_Sharpen(p, a.i(0)) == 1; });
-                 }});
+                 },
+                 changed<PXImage>(kEveryBits, PXImage_Sharpen, kRowless)});
     t.push_back({"px-smooth",
-                 "PXImage_Smooth",
+                 PXOP_FN(PXImage_Smooth),
                  "Toolkit filters",
                  "Mean or median smoothing by strength",
                  {{"strength", true, 1, 100, 70, "below 60 mean, else median"}},
                  kPacked,
                  [](const Image *in, const Args &a) {
                      return packed_in_place(in, [&](PXImage *p) { return PXImage_Smooth(p, a.i(0)) == 1; });
-                 }});
+                 },
+                 changed<PXImage>(kEveryBits, PXImage_Smooth, kRowless)});
     t.push_back({"edges",
-                 "PXImage_EdgeDetection",
+                 PXOP_FN(PXImage_EdgeDetection),
                  "Toolkit filters",
                  "3 x 3 edge kernel",
                  {},
                  kPacked,
                  [](const Image *in, const Args &) {
                      return packed_in_place(in, [](PXImage *p) { return PXImage_EdgeDetection(p) == 1; });
-                 }});
+                 },
+                 changed<PXImage>(
+                     kEveryBits, [](PXImage *a, int32_t) { return PXImage_EdgeDetection(a); }, kRowless)});
     t.push_back({"binarize",
-                 "PXImage_GrayToBinarization",
+                 PXOP_FN(PXImage_GrayToBinarization),
                  "Toolkit filters",
                  "Otsu binarisation",
                  {},
                  kPacked,
                  [](const Image *in, const Args &) {
                      return packed_in_place(in, [](PXImage *p) { return PXImage_GrayToBinarization(p) == 1; });
-                 }});
+                 },
+                 changed<PXImage>(kGeometry, [](PXImage *a, int32_t) { return PXImage_GrayToBinarization(a); })});
     t.push_back({"frame",
-                 "PXImage_Effect_Clip",
+                 PXOP_FN(PXImage_Effect_Clip),
                  "Toolkit filters",
                  "The photo shown through a frame's window",
                  {},
@@ -252,18 +324,28 @@ void add_toolkit(std::vector<Operation> &t) {
                      PXImage_Free(frame);
                      return out;
                  },
+                 made(
+                     {8, 24},
+                     [](PXImage *a, int32_t) {
+                         static std::vector<uint8_t> block(size_t(720) * 566 * 3, 90);
+                         static PXImage frame{720, 566, 24, block.data()};
+                         return PXImage_Effect_Clip(a, &frame);
+                     },
+                     kPixelless),
                  false});
     t.push_back({"paint",
-                 "PXImage_Effect_Paint",
+                 PXOP_FN(PXImage_Effect_Paint),
                  "Toolkit filters",
                  "Two-tone paint effect",
                  {},
                  kGray8 | kBgr24,
                  [](const Image *in, const Args &) {
                      return packed_in_place(in, [](PXImage *p) { return PXImage_Effect_Paint(p), true; });
-                 }});
+                 },
+                 changed<PXImage>(
+                     {8, 24}, [](PXImage *a, int32_t) { return PXImage_Effect_Paint(a); }, {}, kNoResult)});
     t.push_back({"paint-gray-plane",
-                 "EffectPaint_GrayRowData",
+                 PXOP_FN(EffectPaint_GrayRowData),
                  "Toolkit filters",
                  "Gray-plane contrast stretch",
                  {},
@@ -273,7 +355,7 @@ void add_toolkit(std::vector<Operation> &t) {
                          in, [](PXImage *p) { return EffectPaint_GrayRowData(p->data, p->width, p->height), true; });
                  }});
     t.push_back({"paint-blue-plane",
-                 "EffectPaint_BlueRowData",
+                 PXOP_FN(EffectPaint_BlueRowData),
                  "Toolkit filters",
                  "Blue-plane contrast stretch",
                  {},
@@ -283,7 +365,7 @@ void add_toolkit(std::vector<Operation> &t) {
                          in, [](PXImage *p) { return EffectPaint_BlueRowData(p->data, p->width, p->height), true; });
                  }});
     t.push_back({"color-filter",
-                 "ColorFilter",
+                 PXOP_FN(ColorFilter),
                  "Curve filters",
                  "Brightness shift by a colour's luminance",
                  {{"red", true, 0, 255, 230, ""}, {"green", true, 0, 255, 200, ""}, {"blue", true, 0, 255, 150, ""}},
@@ -291,9 +373,11 @@ void add_toolkit(std::vector<Operation> &t) {
                  [](const Image *in, const Args &a) {
                      const uint32_t c = uint32_t(a.i(0)) | uint32_t(a.i(1)) << 8 | uint32_t(a.i(2)) << 16;
                      return in_place(in, [&](Image *p) { return ColorFilter(p, c, nullptr) == 1; });
-                 }});
+                 },
+                 changed<Image>(
+                     {8}, [](Image *a, int32_t p) { return ColorFilter(a, p, nullptr); }, kRowless)});
     t.push_back({"tint",
-                 "ColorFilter24",
+                 PXOP_FN(ColorFilter24),
                  "Curve filters",
                  "Tint 45/255 of the way toward a colour",
                  {{"red", true, 0, 255, 255, ""}, {"green", true, 0, 255, 140, ""}, {"blue", true, 0, 255, 40, ""}},
@@ -301,25 +385,32 @@ void add_toolkit(std::vector<Operation> &t) {
                  [](const Image *in, const Args &a) {
                      const uint32_t c = uint32_t(a.i(0)) | uint32_t(a.i(1)) << 8 | uint32_t(a.i(2)) << 16;
                      return in_place(in, [&](Image *p) { return ColorFilter24(p, c, nullptr) == 1; });
-                 }});
+                 },
+                 changed<Image>(
+                     {24}, [](Image *a, int32_t p) { return ColorFilter24(a, p, nullptr); }, kRowless)});
     t.push_back({"arc-curve",
-                 "ColorFilter1",
+                 PXOP_FN(ColorFilter1),
                  "Curve filters",
                  "Circular-arc tone curve (128 neutral, refused)",
                  {{"level", true, 0, 255, 190, "above 128 brightens, below darkens"}},
                  kGray8,
                  [](const Image *in, const Args &a) {
                      return in_place(in, [&](Image *p) { return ColorFilter1(p, a.i(0)) == 1; });
-                 }});
+                 },
+                 changed<Image>({8}, ColorFilter1, kRowless)});
     t.push_back({"zanto",
-                 "ColorFilter_zanto",
+                 PXOP_FN(ColorFilter_zanto),
                  "Curve filters",
                  "Signature brightening or darkening curve",
                  {{"level", true, 0, 255, 200, "above 128 brightens, below darkens"}},
                  kGray8,
                  [](const Image *in, const Args &a) {
                      return in_place(in, [&](Image *p) { return ColorFilter_zanto(p, a.i(0)) == 1; });
-                 }});
+                 },
+                 changed<Image>({8}, ColorFilter_zanto, kRowless)});
+    t.push_back(contract_row(
+        PXOP_FN(PXImage_IsSameImage), "Toolkit geometry",
+        two({8, 24, 32}, [](PXImage *a, PXImage *b, int32_t) -> int64_t { return PXImage_IsSameImage(a, b); })));
 }
 
 } // namespace pxop

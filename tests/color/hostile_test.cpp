@@ -1,59 +1,10 @@
-// Hostile input for every colour function: the picture functions through the
-// contract table, hue channels, masks and destinations at their extremes.
+// Hostile input beyond the registry's contracts: hue channels, masks and
+// destinations at their extremes.
 #include "support/hostile.hpp"
 
 using namespace pxtest;
 using namespace pxtest::hostile;
-using C = Call<Image>;
-
-namespace {
-
-// Pixel readers take any bit count (unknown ones read as opaque black).
-const std::vector<int32_t> kAny = {8, 0, 1, 4, 12, 16, 24, 32, 48};
-// Records of no pixels that a function with nothing to visit takes as done.
-const std::vector<std::string> kEmptySizes = {"zero width", "negative height", "INT_MIN width"};
-
-// Functions without a result slot, or for which a null slot means "in place".
-Contract<Image> no_slot(const char *name, std::vector<int32_t> formats, std::function<int64_t(C &)> call) {
-    return {.name = name, .formats = std::move(formats), .call = std::move(call), .slot = false};
-}
-// A failed working allocation of Filter leaves the prepared result in the slot.
-Contract<Image> kernel_effect(const char *name, int32_t (*fn)(const Image *, Image **)) {
-    return {
-        .name = name, .formats = kAny, .call = [fn](C &c) { return fn(c.a, c.slot); }, .keeps_result_on_failure = true};
-}
-
-} // namespace
-
-TEST(Hostile, ColourPictures) {
-    static const std::vector<int32_t> big(256 * 256, 1); // kernels up to 256 x 256
-    auto combine = no_slot("Combine", kAny, [](C &c) { return (c.out = Combine(c.a, c.b, c.b, c.b, c.p)) != nullptr; });
-    combine.pictures = 2, combine.mismatch_fails = true;
-    combine.accepts = {"null pixels", "second: null pixels"}; // planes without pixels read as 0
-    auto hue = no_slot("BaseTran_Hue", {8}, [](C &c) { return BaseTran_Hue(c.a, c.p); }),
-         ls = no_slot("BaseTran_LS", {8}, [](C &c) { return BaseTran_LS(c.a, c.p); });
-    hue.accepts = ls.accepts = kEmptySizes;
-    auto smooth = no_slot("PX_IMG_Smooth", kAny, [](C &c) { return PX_IMG_Smooth(c.a, c.slot, c.p); });
-    smooth.typical = 50;
-    check_contracts<Image>({
-        {"Split", kAny,
-         [](C &c) {
-             Slot p2, p3, alpha;
-             return Split(c.a, c.slot, &p2, &p3, &alpha, c.p);
-         }},
-        combine,
-        hue,
-        ls,
-        {"PX_IMG_Transform", kAny, [](C &c) { return PX_IMG_Transform(c.a, c.slot, c.p, c.p & 3); }},
-        no_slot("Filter", kAny, [](C &c) { return Filter(c.a, big.data(), c.p, c.p, c.p, nullptr, nullptr, c.p); }),
-        kernel_effect("PX_IMG_Blur", PX_IMG_Blur),
-        kernel_effect("PX_IMG_Soften", PX_IMG_Soften),
-        kernel_effect("PX_IMG_Sharpen", PX_IMG_Sharpen),
-        kernel_effect("PX_IMG_Emboss1", PX_IMG_Emboss1),
-        no_slot("Filter_fast", {8, 12, 16, 24, 32, 48}, [](C &c) { return Filter_fast(c.a, c.p, c.p); }),
-        smooth,
-    });
-}
+using pxop::kEmptySizes;
 
 TEST(Hostile, HueMasksAndDestinations) {
     // RGBtoHSL, HSLtoRGB, RGBtoYUV, YUVtoRGB, RGBtoYIQ, YIQtoRGB, RGBtoXYZ and

@@ -1,55 +1,8 @@
-// Hostile input for every core function: the picture functions through the
-// contract table, record creation, memory wrappers and integer math at their
-// extremes.
+// Hostile input beyond the registry's contracts: record creation, memory
+// wrappers and integer math at their extremes.
 #include "support/hostile.hpp"
 
 using namespace pxtest::hostile;
-using C = Call<Image>;
-
-TEST(Hostile, PixelAccessAndCopies) {
-    // Readers and copies take any bit count (unknown ones read as opaque black).
-    const std::vector<int32_t> any = {8, 0, 1, 4, 12, 16, 24, 32, 48}, indexed = {8, 1, 4},
-                               colour = {8, 1, 4, 16, 24, 32};
-    check_contracts<Image>({
-        {.name = "GetPixelIndex",
-         .formats = indexed,
-         .call = [](C &c) { return int64_t(GetPixelIndex(c.a, c.p, c.p)); },
-         .slot = false},
-        {.name = "GetPixelColor",
-         .formats = any,
-         .call = [](C &c) { return int64_t(GetPixelColor(c.a, c.p, ~c.p)); },
-         .slot = false},
-        {.name = "GetPixelGray",
-         .formats = any,
-         .call = [](C &c) { return int64_t(GetPixelGray(c.a, ~c.p, c.p)); },
-         .slot = false},
-        {.name = "SetPixelIndex",
-         .formats = indexed,
-         .call = [](C &c) { return SetPixelIndex(c.a, c.p, c.p, c.p), kNoResult; },
-         .failure = kNoResult,
-         .slot = false},
-        {.name = "SetPixelColor",
-         .formats = colour,
-         .call = [](C &c) { return SetPixelColor(c.a, c.p, c.p, 0x12345678u), kNoResult; },
-         .failure = kNoResult,
-         .slot = false},
-        {.name = "PX_Img_Copy",
-         .formats = any,
-         .call = [](C &c) { return int64_t(PX_Img_Copy(c.a, c.b)); },
-         .pictures = 2,
-         .slot = false,
-         .accepts = {"null pixels", "zero width", "negative height", "INT_MIN width", "pitch below a row", "zero pitch",
-                     "second: null pixels", "second: zero width", "second: negative height", "second: INT_MIN width",
-                     "second: pitch below a row", "second: zero pitch"}},
-        {.name = "PX_Img_CopyAlpha",
-         .formats = {32},
-         .call = [](C &c) { return int64_t(PX_Img_CopyAlpha(c.a, c.b)); },
-         .pictures = 2,
-         .slot = false,
-         .mismatch_fails = true,
-         .accepts = {"null pixels", "second: null pixels"}},
-    });
-}
 
 TEST(Hostile, RecordsMemoryAndMath) {
     const int32_t ws[] = {0, 5, -5, 5, 100000, INT_MAX, INT_MAX, INT_MIN},

@@ -1,48 +1,11 @@
-// Hostile input for every line-detection function: the plane functions
-// through the contract table, histograms and interval lists at their extremes.
+// Hostile input beyond the registry's contracts: straightening short of
+// memory, histograms and interval lists at their extremes.
 #include "support/hostile.hpp"
 
 using namespace pxtest;
 using namespace pxtest::hostile;
-using C = Call<Image>;
 
-namespace {
-
-// 8-bit planes only; a null result slot means "in place" where there is one.
-Contract<Image> plane(const char *name, std::function<int64_t(C &)> call, int64_t failure = 0) {
-    return {.name = name, .formats = {8}, .call = std::move(call), .failure = failure, .slot = false};
-}
-
-} // namespace
-
-TEST(Hostile, Planes) {
-    auto reverse = plane("RGB_Reverse", [](C &c) { return RGB_Reverse(c.a); });
-    reverse.formats = {8, 0, 1, 4, 12, 16, 24, 32, 48};
-    reverse.accepts = {"zero width", "negative height", "INT_MIN width"};
-    auto bin = plane("BinImg", [](C &c) { return BinImg(c.a, c.slot); });
-    bin.falls_back_on_failure = true; // works on its input when the new plane cannot be made
-    bin.accepts = {"zero width"};
-    // The broken records are 9 columns wide: too narrow to be marked or to
-    // have a column for the cross median.
-    auto detect = plane("DetectLines", [](C &c) { return DetectLines(c.a); });
-    detect.accepts = {"null pixels", "zero width"};
-    auto cross = plane("MyFliter", [](C &c) { return MyFliter(c.a, c.slot); });
-    cross.accepts = {"null pixels"};
-    check_contracts<Image>({
-        plane("RecognizeYUV", [](C &c) { return RecognizeYUV(c.a, c.slot); }),
-        plane(
-            "ImgDecode", [](C &c) { return ImgDecode(c.a, c.slot), kNoResult; }, kNoResult),
-        plane("MyResample2", [](C &c) { return (c.out = MyResample2(c.a, c.p)) != nullptr; }),
-        bin,
-        detect,
-        plane("MyEdge", [](C &c) { return MyEdge(c.a, c.slot); }),
-        cross,
-        plane("MyFliter1", [](C &c) { return MyFliter1(c.a, c.slot); }),
-        reverse,
-    });
-}
-
-// The table's pictures are below the size the straightening works on. A call
+// The contracts' pictures are below the size the straightening works on. A call
 // that runs out of memory fails whole: it returns what a full run returns, or
 // nothing and leaves its input as it was.
 TEST(Hostile, StraighteningWithoutMemory) {

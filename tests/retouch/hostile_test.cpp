@@ -1,119 +1,16 @@
-// Hostile input for every retouching function.
+// Hostile input beyond the registry's contracts: point lists, curves and
+// caches at their extremes, sources without pixels and of empty sizes.
 #include <climits>
 
 #include "support/hostile.hpp"
 
 using namespace pxtest::hostile;
-using C = Call<Image>;
 
 namespace {
 
-const std::vector<int32_t> any = {8, 16, 24, 32, 0, 1, 4, 12, 48}, rgb = {24, 32};
 const int32_t xs[] = {0, 4, -9, INT_MAX}, ys[] = {3, INT_MIN, 2, 6};
 
-// Functions changing their picture, with an optional slot or none, and
-// functions returning nothing (failure kNoResult).
-Contract<Image> no_slot(const char *name, std::vector<int32_t> formats, int64_t (*f)(C &), int64_t failure = 0) {
-    return {name, formats, f, failure, 1, {}, false};
-}
-// An entry that works on the named degenerate records instead of refusing them.
-Contract<Image> accepting(Contract<Image> c, std::vector<std::string> names) {
-    c.accepts = std::move(names);
-    return c;
-}
-const std::vector<std::string> kNoPixels = {"null pixels"};
-// Pastes of a second picture of any size and bit count.
-Contract<Image> paste(const char *name, int32_t (*f)(Image *, Image *, int32_t)) {
-    return {name, any, [f](C &c) -> int64_t { return f(c.a, c.b, c.p); }, 0, 2, {}, false};
-}
-
 } // namespace
-
-TEST(Hostile, Retouching) {
-    // The smoothing leaves its prepared result in the slot when it fails for
-    // want of memory; a source without pixels reads as 0 and gets a result.
-    Contract<Image> spots{"alg_Img_smooth_1", any, [](C &c) { return alg_Img_smooth_1(c.a, c.slot); }},
-        lightened{"alg_Img_smooth", any, [](C &c) { return alg_Img_smooth(c.a, c.slot), 0; }, kNoResult},
-        skin{"alg_Img_Skin", any, [](C &c) { return alg_Img_Skin(c.a, c.slot, c.p); }, 1},
-        smile{"SmileDetect", any, [](C &c) { return SmileDetect(c.a, c.slot, c.p); }, 1},
-        tinted = no_slot("alg_Img_Blending", rgb, [](C &c) -> int64_t { return alg_Img_Blending(c.a, c.slot); });
-    for (auto *c : {&spots, &lightened, &skin, &tinted})
-        c->keeps_result_on_failure = true;
-    smile.falls_back_on_failure = true; // the slot is prepared before the mask
-    // Every picture it cannot tint still gets a prepared result slot.
-    tinted.accepts = {"null pixels", "bit count 0",  "bit count 1",  "bit count 4",
-                      "bit count 8", "bit count 12", "bit count 16", "bit count 48"};
-    const std::vector<std::string> empty = {"zero width", "negative height", "INT_MIN width"},
-                                   pasteAccepts = {"null pixels",
-                                                   "zero width",
-                                                   "negative height",
-                                                   "INT_MIN width",
-                                                   "second: null pixels",
-                                                   "second: zero width",
-                                                   "second: negative height",
-                                                   "second: INT_MIN width",
-                                                   "second: pitch below a row",
-                                                   "second: zero pitch"};
-    std::vector<std::string> noPixelsOrRows = empty;
-    noPixelsOrRows.push_back("null pixels");
-    check_contracts<Image>({
-        accepting(spots, kNoPixels),
-        accepting(lightened, kNoPixels),
-        accepting(skin, kNoPixels),
-        {"CreateFaceMaskImg", any, [](C &c) { return CreateFaceMaskImg(c.a, c.slot); }},
-        accepting(smile, kNoPixels),
-        accepting({"MoreLight", any, [](C &c) { return MoreLight(c.a, c.p, c.slot), 0; }, kNoResult}, kNoPixels),
-        accepting(
-            {"ImageAutoGradationProcess", any, [](C &c) { return ImageAutoGradationProcess(c.a, c.slot, c.p); }, 1},
-            kNoPixels),
-        accepting({"ImageAutoGradationProcess1", any,
-                   [](C &c) { return ImageAutoGradationProcess1(c.a, c.slot, c.p, c.p), 0; }, kNoResult},
-                  kNoPixels),
-        {"ImageExposure", any, [](C &c) { return ImageExposure(c.a, c.slot, c.p); }},
-        accepting(
-            {"thresholdBlur", any, [](C &c) { return thresholdBlur(c.p, c.p, c.p, c.p, c.a, c.slot), 0; }, kNoResult},
-            kNoPixels),
-        {"PX_Mimic", any, [](C &c) { return PX_Mimic(c.a, c.p, c.p, nullptr, 0, 0, c.p, c.p, c.p, 1, c.slot); }},
-        accepting(no_slot("LightUP", any, [](C &c) -> int64_t { return LightUP(c.a); }), noPixelsOrRows),
-        accepting(no_slot("Best_Color", {8}, [](C &c) -> int64_t { return Best_Color(c.a, c.p); }), empty),
-        no_slot("MyOneKeyFliter", {8}, [](C &c) -> int64_t { return MyOneKeyFliter(c.a, c.slot); }),
-        no_slot("MyOneKeyFliter in place", {8}, [](C &c) -> int64_t { return MyOneKeyFliter(c.a, nullptr); }),
-        accepting(paste("PointArea_Copy", [](auto a, auto b, int32_t p) { return PointArea_Copy(a, b, p, p, p); }),
-                  pasteAccepts),
-        accepting(paste("PointArea_Copy_Alph",
-                        [](auto a, auto b, int32_t p) { return PointArea_Copy_Alph(a, b, p, p, p, p); }),
-                  pasteAccepts),
-        no_slot("alg_Blending", rgb,
-                [](C &c) -> int64_t {
-                    return alg_Blending(c.a, nullptr, c.p, c.p, {201, 90, 30}, c.p, c.slot);
-                }),
-        tinted,
-        no_slot("alg_Img_Blending in place", rgb, [](C &c) -> int64_t { return alg_Img_Blending(c.a, nullptr); }),
-        no_slot("alg_smooth", rgb, [](C &c) -> int64_t { return alg_smooth(c.a, 0, c.p, c.p, c.p, c.p, c.slot); }),
-        no_slot("alg_QuHeiYanQuan", rgb,
-                [](C &c) -> int64_t { return alg_QuHeiYanQuan(c.a, c.p, c.p, c.p, c.p, c.slot, 1); }),
-        no_slot("alg_QuHeiYanQuan_1", rgb,
-                [](C &c) -> int64_t { return alg_QuHeiYanQuan_1(c.a, xs, ys, 4, c.p, c.p); }),
-        no_slot("EyesEnlarge", any, [](C &c) -> int64_t { return EyesEnlarge(c.a); }),
-        no_slot(
-            "alg_Img_Eradicate", any, [](C &c) -> int64_t { return alg_Img_Eradicate(c.a, c.p, c.p, c.p), 0; },
-            kNoResult),
-        no_slot(
-            "alg_Img_EyesEnlarge", any,
-            [](C &c) -> int64_t {
-                alg_Img_EyesEnlarge_ellipse(c.a, c.p, 3, c.p);
-                alg_Img_EyesEnlarge_circle(c.a, 3, c.p, c.p);
-                return alg_Img_EyesEnlarge(c.a, c.p, c.p, c.p, c.p), 0;
-            },
-            kNoResult),
-        no_slot(
-            "alg_Img_EyesMoreContrast_ellipse", any,
-            [](C &c) -> int64_t { return alg_Img_EyesMoreContrast_ellipse(c.a, c.p, 3, c.p, c.p), 0; }, kNoResult),
-        no_slot(
-            "alg_Img_quheiyanquan_ellipse", any,
-            [](C &c) -> int64_t { return alg_Img_quheiyanquan_ellipse(c.a, c.p, c.p, c.p), 0; }, kNoResult),
-    });
-}
 
 TEST(Hostile, RetouchScalars) {
     auto pic = good<Image>(9, 7, 24, 1), none = good<Image>(9, 7, 24, 2);

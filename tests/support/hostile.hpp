@@ -1,4 +1,4 @@
-// Hostile-input contracts. One table entry per exported picture function says
+// Hostile-input checks. The registry's contract of each picture function says
 // which bit counts it accepts, how many pictures it reads and what it returns
 // on failure; the checks below feed it every kind of broken record, pictures
 // of mismatched sizes, extreme parameters and failing allocations.
@@ -25,6 +25,7 @@
 
 #include "support/alloc_failures.hpp"
 #include "support/test_images.hpp"
+#include "tools/contract.hpp"
 
 namespace pxtest::hostile {
 
@@ -120,38 +121,9 @@ template <class R> std::vector<HeldPtr<R>> broken(const std::vector<int32_t> &fo
     return v;
 }
 
-// What a table entry's call sees.
-template <class R> struct Call {
-    R *a = nullptr;   // first picture
-    R *b = nullptr;   // second picture (two-picture functions)
-    R *out = nullptr; // the picture the function returned or put in the slot
-    R **slot = &out;  // the result slot handed to the function
-    int32_t p = 0;    // the parameter under test
-};
-
-// The failure result of functions that return nothing.
-inline constexpr int64_t kNoResult = INT64_MIN;
-
-template <class R> struct Contract {
-    const char *name;
-    std::vector<int32_t> formats;           // bit counts of the first picture it works on
-    std::function<int64_t(Call<R> &)> call; // runs the function, returns its result
-    int64_t failure = 0;                    // its failure result (kNoResult for void functions)
-    int pictures = 1;                       // pictures it reads: a, then b
-    std::vector<int32_t> formats_b;         // bit counts of b (empty: as a)
-    bool slot = true;                       // a null result slot is refused
-    bool mismatch_fails = false;            // pictures of different sizes are refused
-    bool keeps_result_on_failure = false;   // a failed working allocation leaves the prepared result
-    int32_t typical = 3;                    // an ordinary parameter value
-    bool falls_back_on_failure = false;     // short of memory it finishes another, documented way
-    // Degenerate records (names from `broken`: "null pixels", "zero width",
-    // ...) it works on without refusing, reading no pixels: what it makes of
-    // them is pinned by the family's own tests.
-    std::vector<std::string> accepts;
-    bool accepts_record(const std::string &what) const {
-        return std::find(accepts.begin(), accepts.end(), what) != accepts.end();
-    }
-};
+using pxop::Call;
+using pxop::Contract;
+using pxop::kNoResult;
 
 inline constexpr int32_t kExtremes[] = {INT_MIN, -70000, -256, -1, 0, 1, 2, 255, 256, 70000, INT_MAX};
 
@@ -193,6 +165,7 @@ template <class R> std::vector<uint8_t> picture_bytes(const R *im) {
 
 template <class R> struct Runner {
     const Contract<R> &c;
+    std::string name;
     // What one call gave: its result and the bytes of the picture it made.
     struct Outcome {
         int64_t result;
@@ -215,19 +188,19 @@ template <class R> struct Runner {
             before.push_back(h->snapshot());
         const auto [r, made, picture] = run(a, b, c.typical, nullSlot);
         if (c.failure != kNoResult) {
-            EXPECT_EQ(r, c.failure) << c.name << ": " << why;
+            EXPECT_EQ(r, c.failure) << name << ": " << why;
         }
-        EXPECT_FALSE(made) << c.name << ": " << why;
+        EXPECT_FALSE(made) << name << ": " << why;
         for (size_t i = 0; i < inputs.size(); ++i)
-            EXPECT_TRUE(inputs[i]->snapshot() == before[i]) << c.name << ": " << why << " changed an input";
+            EXPECT_TRUE(inputs[i]->snapshot() == before[i]) << name << ": " << why << " changed an input";
     }
     int32_t format_b(int32_t fa) const { return c.formats_b.empty() ? fa : c.formats_b.front(); }
 };
 
 // Null records, broken records in every picture position and (where refused)
 // a null slot or pictures of different sizes: each refused.
-template <class R> void expect_refusals(const Contract<R> &c) {
-    Runner<R> run{c};
+template <class R> void expect_refusals(const std::string &name, const Contract<R> &c) {
+    Runner<R> run{c, name};
     const int32_t fa = c.formats.front(), fb = run.format_b(fa);
     auto a = good<R>(9, 7, fa, 11), b = good<R>(9, 7, fb, 12);
     R *second = c.pictures > 1 ? &b->record : nullptr;
@@ -251,8 +224,8 @@ template <class R> void expect_refusals(const Contract<R> &c) {
 // Every accepted bit count at awkward sizes, with the parameter at extremes
 // and pictures of different sizes: nothing to check but that memory stays
 // whole (the sanitizer build) and the call returns.
-template <class R> void expect_extremes_survive(const Contract<R> &c) {
-    Runner<R> run{c};
+template <class R> void expect_extremes_survive(const std::string &name, const Contract<R> &c) {
+    Runner<R> run{c, name};
     const std::pair<int32_t, int32_t> sizes[] = {{1, 1}, {2, 5}, {9, 7}};
     for (int32_t fa : c.formats) {
         const int32_t fb = c.formats_b.empty() ? fa : c.formats_b.front();
@@ -273,9 +246,9 @@ template <class R> void expect_extremes_survive(const Contract<R> &c) {
 // exactly what a full run makes, or fails: its failure result, no picture and
 // its inputs as they were (void functions may only do either). Random draws
 // are seeded alike for every run. Leaks are the leak sanitizer's to find.
-template <class R> void expect_allocation_failures_handled(const Contract<R> &c) {
+template <class R> void expect_allocation_failures_handled(const std::string &name, const Contract<R> &c) {
     if (!pxfx::alloc::injection_available()) return;
-    Runner<R> run{c};
+    Runner<R> run{c, name};
     for (const int32_t fa : c.formats) {
         SCOPED_TRACE(fa);
         auto a = good<R>(9, 7, fa, 31), b = good<R>(9, 7, run.format_b(fa), 32);
@@ -295,21 +268,22 @@ template <class R> void expect_allocation_failures_handled(const Contract<R> &c)
                               b->snapshot() == fullB;
             const bool failed = (c.failure == kNoResult || o.result == c.failure) &&
                                 (c.keeps_result_on_failure || !o.made) && a->snapshot() == sa && b->snapshot() == sb;
-            EXPECT_TRUE(same || failed) << c.name
-                                        << ": short of memory, neither a full run nor a clean failure (result "
+            EXPECT_TRUE(same || failed) << name << ": short of memory, neither a full run nor a clean failure (result "
                                         << o.result << ", full run " << full.result << (o.made ? ", a picture" : "")
                                         << (a->snapshot() == sa ? "" : ", first picture changed") << ")";
         });
     }
 }
 
-// All three checks for every entry of a table.
-template <class R> void check_contracts(const std::vector<Contract<R>> &table) {
-    for (const auto &c : table) {
-        SCOPED_TRACE(c.name);
-        expect_refusals(c);
-        expect_extremes_survive(c);
-        expect_allocation_failures_handled(c);
+// All three checks for a function, and for its other way of being called.
+template <class R> void check_contract(const std::string &name, const Contract<R> &c) {
+    expect_refusals(name, c);
+    expect_extremes_survive(name, c);
+    expect_allocation_failures_handled(name, c);
+    if (c.also) {
+        Contract<R> other = c;
+        other.call = c.also, other.also = nullptr, other.slot = false;
+        check_contract(name + " (other call)", other);
     }
 }
 

@@ -79,7 +79,7 @@ TEST(Golden, EveryOperationHashesAsRecorded) {
     const std::map<std::string, std::string> got = compute();
     if (const char *update = std::getenv("PXFX_UPDATE_GOLDEN"); update != nullptr && *update == '1') {
         std::ofstream out(kGoldenFile);
-        out << "# operation bits input hash -- written by PXFX_UPDATE_GOLDEN=1 pxfx_tests_golden\n";
+        out << "# operation bits input hash -- written by PXFX_UPDATE_GOLDEN=1 pxfx_tests_registry\n";
         for (const auto &[key, h] : got)
             out << key << " " << h << "\n";
         ASSERT_TRUE(out.good());

@@ -1,0 +1,15 @@
+# Writes the dynamic symbols that LIBRARY defines to OUTPUT, one name per line.
+execute_process(COMMAND ${NM} -D --defined-only ${LIBRARY} OUTPUT_VARIABLE nm_out RESULT_VARIABLE nm_rc)
+if(NOT nm_rc EQUAL 0)
+  message(FATAL_ERROR "nm failed on ${LIBRARY}")
+endif()
+set(names "")
+string(REPLACE "\n" ";" nm_lines "${nm_out}")
+foreach(line IN LISTS nm_lines)
+  if(line MATCHES "^[0-9a-fA-F]* +[A-Za-z] +([^ ]+)$")
+    # Versioned names carry @VERSION; the linker adds no others.
+    string(REGEX REPLACE "@.*$" "" name "${CMAKE_MATCH_1}")
+    string(APPEND names "${name}\n")
+  endif()
+endforeach()
+file(WRITE ${OUTPUT} "${names}")

@@ -1,0 +1,63 @@
+// What a function of the registry promises on hostile input, and how to call
+// it with the pictures, slot and parameter a check or a fuzzer chooses. The
+// contract tests feed every row broken records, pictures of mismatched sizes,
+// extreme parameters and failing allocations; the fuzzers feed it random ones.
+#pragma once
+
+#include <pxfx/pxfx.h>
+
+#include <algorithm>
+#include <cstdint>
+#include <functional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace pxop {
+
+// What one call sees.
+template <class R> struct Call {
+    R *a = nullptr;   // first picture
+    R *b = nullptr;   // second picture (two-picture functions)
+    R *out = nullptr; // the picture the function returned or put in the slot
+    R **slot = &out;  // the result slot handed to the function
+    int32_t p = 0;    // the parameter under test, passed for every parameter
+};
+
+// The failure result of functions that return nothing.
+inline constexpr int64_t kNoResult = INT64_MIN;
+
+// A function "refuses" when it returns its failure result, leaves its result
+// slot empty and changes none of its inputs (records and pixel bytes).
+template <class R> struct Contract {
+    std::vector<int32_t> formats;           // bit counts of the first picture it works on
+    std::function<int64_t(Call<R> &)> call; // runs the function, returns its result
+    int64_t failure = 0;                    // its failure result (kNoResult for void functions)
+    int pictures = 1;                       // pictures it reads: a, then b
+    std::vector<int32_t> formats_b;         // bit counts of b (empty: as a)
+    bool slot = true;                       // a null result slot is refused
+    bool empty_slot = false;                // the slot must be empty: what it holds is not released
+    bool mismatch_fails = false;            // pictures of different sizes are refused
+    bool keeps_result_on_failure = false;   // a failed working allocation leaves the prepared result
+    int32_t typical = 3;                    // an ordinary parameter value
+    bool falls_back_on_failure = false;     // short of memory it finishes another, documented way
+    // Degenerate records ("null pixels", "zero width", "negative height",
+    // "INT_MIN width", "pitch below a row", "zero pitch", "bit count N";
+    // "second: ..." for b) it works on without refusing, reading no pixels:
+    // what it makes of them is pinned by the family's own tests.
+    std::vector<std::string> accepts;
+    // The same function called another way (for example in place, with a
+    // null slot), held to the same promises.
+    std::function<int64_t(Call<R> &)> also;
+
+    bool accepts_record(const std::string &what) const {
+        return std::find(accepts.begin(), accepts.end(), what) != accepts.end();
+    }
+};
+
+// Bit counts the pixel readers take: any (unknown ones read as opaque black).
+inline const std::vector<int32_t> kAnyBits = {8, 16, 24, 32, 0, 1, 4, 12, 48};
+// Records of no pixel rows that a function with nothing to visit takes as done.
+inline const std::vector<std::string> kEmptySizes = {"zero width", "negative height", "INT_MIN width"};
+
+} // namespace pxop
