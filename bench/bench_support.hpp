@@ -89,4 +89,19 @@ inline void set_rate(benchmark::State &state, int32_t w = kWidth, int32_t h = kH
         benchmark::Counter(static_cast<double>(w) * h / 1e6, benchmark::Counter::kIsIterationInvariantRate);
 }
 
+// The picture named by a benchmark's first two arguments: bits, photo.
+inline Image *source_of(benchmark::State &state) {
+    return make_source(static_cast<int32_t>(state.range(0)), state.range(1));
+}
+
+// Runs run(src, &dst) per iteration into a result slot that stays between
+// iterations (so a reused slot image is measured), then releases both.
+template <class Run> void into_slot(benchmark::State &state, Image *src, Run run) {
+    Image *dst = nullptr;
+    timed(state, block_bytes(src), block_bytes(src), [&] { benchmark::DoNotOptimize(run(src, &dst)); });
+    set_rate(state);
+    free_Image(&dst, 0);
+    free_Image(&src, 0);
+}
+
 } // namespace pxbench

@@ -7,7 +7,7 @@ using namespace pxbench;
 namespace {
 
 void BM_SplitCombineHsl(benchmark::State &state) {
-    Image *src = make_source(static_cast<int32_t>(state.range(0)), state.range(1));
+    Image *src = source_of(state);
     Image *h = nullptr, *s = nullptr, *l = nullptr, *a = nullptr;
     timed(state, block_bytes(src), 4.0 * kWidth * kHeight + block_bytes(src), [&] {
         Split(src, &h, &s, &l, &a, 1);
@@ -20,24 +20,14 @@ void BM_SplitCombineHsl(benchmark::State &state) {
         free_Image(p, 0);
 }
 
-// Runs a kernel filter into a result slot that stays between iterations.
-template <class Run> void into_slot(benchmark::State &state, Run run) {
-    Image *src = make_source(static_cast<int32_t>(state.range(0)), state.range(1));
-    Image *dst = nullptr;
-    timed(state, block_bytes(src), block_bytes(src), [&] { benchmark::DoNotOptimize(run(src, &dst)); });
-    set_rate(state);
-    free_Image(&dst, 0);
-    free_Image(&src, 0);
-}
-
-void BM_Blur(benchmark::State &state) { into_slot(state, PX_IMG_Blur); }
-void BM_ImgSharpen(benchmark::State &state) { into_slot(state, PX_IMG_Sharpen); }
+void BM_Blur(benchmark::State &state) { into_slot(state, source_of(state), PX_IMG_Blur); }
+void BM_ImgSharpen(benchmark::State &state) { into_slot(state, source_of(state), PX_IMG_Sharpen); }
 void BM_Transform(benchmark::State &state) {
-    into_slot(state, [](Image *s, Image **d) { return PX_IMG_Transform(s, d, 150, 0); });
+    into_slot(state, source_of(state), [](Image *s, Image **d) { return PX_IMG_Transform(s, d, 150, 0); });
 }
 
 void BM_FilterFast(benchmark::State &state) {
-    Image *img = make_source(static_cast<int32_t>(state.range(0)), state.range(1));
+    Image *img = source_of(state);
     const auto size = static_cast<int32_t>(state.range(2));
     timed(state, block_bytes(img), 0, [&] { benchmark::DoNotOptimize(Filter_fast(img, size, 0)); });
     set_rate(state);
@@ -46,7 +36,7 @@ void BM_FilterFast(benchmark::State &state) {
 
 // The curve filters work in place on 8-bit planes (ColorFilter24 on 24-bit pictures).
 template <class Run> void in_place(benchmark::State &state, Run run) {
-    Image *img = make_source(static_cast<int32_t>(state.range(0)), state.range(1));
+    Image *img = source_of(state);
     timed(state, block_bytes(img), 0, [&] { benchmark::DoNotOptimize(run(img)); });
     set_rate(state);
     free_Image(&img, 0);

@@ -6,12 +6,7 @@ using namespace pxbench;
 namespace {
 
 template <class Run> void deform(benchmark::State &state, Run run) {
-    Image *src = make_source(static_cast<int32_t>(state.range(0)), 0);
-    Image *dst = nullptr;
-    timed(state, block_bytes(src), block_bytes(src), [&] { benchmark::DoNotOptimize(run(src, &dst)); });
-    set_rate(state);
-    free_Image(&dst, 0);
-    free_Image(&src, 0);
+    into_slot(state, make_source(static_cast<int32_t>(state.range(0)), 0), run);
 }
 
 void BM_Polar(benchmark::State &state) {

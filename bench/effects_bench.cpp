@@ -8,14 +8,7 @@ using namespace pxbench;
 
 namespace {
 
-template <class Run> void run_effect(benchmark::State &state, Run run) {
-    Image *src = make_source(static_cast<int32_t>(state.range(0)), state.range(1));
-    Image *dst = nullptr;
-    timed(state, block_bytes(src), block_bytes(src), [&] { benchmark::DoNotOptimize(run(src, &dst)); });
-    set_rate(state);
-    free_Image(&dst, 0);
-    free_Image(&src, 0);
-}
+template <class Run> void run_effect(benchmark::State &state, Run run) { into_slot(state, source_of(state), run); }
 
 void BM_Memcpy(benchmark::State &state) {
     Image *src = make_picture(static_cast<int32_t>(state.range(0)));

@@ -6,12 +6,7 @@ using namespace pxbench;
 namespace {
 
 template <class Run> void on_photo(benchmark::State &state, int32_t bits, Run run) {
-    Image *src = load_photo(bits);
-    Image *dst = nullptr;
-    timed(state, block_bytes(src), block_bytes(src), [&] { benchmark::DoNotOptimize(run(src, &dst)); });
-    set_rate(state);
-    free_Image(&dst, 0);
-    free_Image(&src, 0);
+    into_slot(state, load_photo(bits), run);
 }
 
 void BM_Skin(benchmark::State &state) {
