@@ -2,6 +2,7 @@
 #include <pxfx/color.h>
 #include <pxfx/retouch.h>
 
+#include "core/internal/byte_map.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
@@ -18,11 +19,9 @@ void shift_plane(Image *plane, int32_t delta) {
         const int64_t v = static_cast<int64_t>(i) + delta;
         table[i] = v > 255 ? 255 : (v < 0 ? 0 : static_cast<uint8_t>(v));
     }
-    for (int32_t y = 0; y < plane->height; ++y) {
-        uint8_t *p = row_ptr(plane, y);
-        for (int32_t x = 0; x < plane->width; ++x)
-            p[x] = table[p[x]];
-    }
+    const uint8_t *const tables[1] = {table};
+    for (int32_t y = 0; y < plane->height; ++y)
+        map_bytes(row_ptr(plane, y), row_ptr(plane, y), static_cast<size_t>(plane->width), 1, tables);
 }
 
 } // namespace

@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cstring>
 
+#include "core/internal/byte_map.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
 #include "toolkit/pximage_check.hpp"
@@ -28,8 +29,8 @@ void stretch_plane(uint8_t *plane, size_t n, int32_t t, int32_t lo, int32_t hi, 
         table[j] = clamp_u8(trunc_sat<int32_t>(static_cast<double>((j - lo) * (hi - lo)) / t));
     for (int32_t k = 0; k <= 255 - t; ++k)
         table[t + k] = clamp_u8(trunc_sat<int32_t>(static_cast<double>(k) * span / (256 - t) + base));
-    for (size_t i = 0; i < n; ++i)
-        plane[i] = table[plane[i]];
+    const uint8_t *const tables[1] = {table};
+    map_bytes(plane, plane, n, 1, tables);
 }
 
 // Histogram, Otsu level T and the count S below T of a plane; false when S

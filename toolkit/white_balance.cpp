@@ -2,6 +2,7 @@
 // threshold of an 8-bit plane that gates it.
 #include <pxfx/toolkit.h>
 
+#include "core/internal/byte_map.hpp"
 #include "core/internal/memory.hpp"
 #include "toolkit/pximage_check.hpp"
 
@@ -61,11 +62,8 @@ int32_t balance_colour(PXImage *img, const PXPoint *pt) {
             ProbabilityDensityValue(plane.get(), static_cast<int32_t>(w), static_cast<int32_t>(h)) & 0xFF;
         balance_table(table[b], ref, ref < kWhiteLevel && threshold < ref);
     }
-    for (size_t i = 0; i < pixels; ++i) {
-        d[3 * i] = table[0][d[3 * i]];
-        d[3 * i + 1] = table[1][d[3 * i + 1]];
-        d[3 * i + 2] = table[2][d[3 * i + 2]];
-    }
+    const uint8_t *const tables[3] = {table[0], table[1], table[2]};
+    map_bytes(d, d, pixels, 3, tables);
     return 1;
 }
 
@@ -80,8 +78,8 @@ int32_t balance_gray(PXImage *img, const PXPoint *pt) {
     });
     uint8_t table[256];
     balance_table(table, ref, 128 < ref && ref < kWhiteLevel);
-    for (int64_t i = 0; i < n; ++i)
-        d[i] = table[d[i]];
+    const uint8_t *const tables[1] = {table};
+    map_bytes(d, d, static_cast<size_t>(n), 1, tables);
     return 1;
 }
 
