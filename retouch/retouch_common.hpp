@@ -1,7 +1,7 @@
 // Building blocks shared by the retouch tools: rank statistics of square
 // windows over an 8-bit plane (reads outside the picture clamped to the
-// nearest edge, as GetPixelIndex does), brightening by a per-pixel amount map,
-// and the format dispatch for a source and its result.
+// nearest edge, as GetPixelIndex does) and brightening by a per-pixel amount
+// map, for a source and a result of any formats.
 //
 // A window list sorted largest first (a stable selection sort) is fully
 // determined by its value counts, so the ranks the retouch filters use - the

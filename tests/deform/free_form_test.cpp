@@ -4,11 +4,10 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
-#include <functional>
 #include <vector>
 
 #include "deform/free_form.hpp"
-#include "support/test_images.hpp"
+#include "support/slot_rule.hpp"
 
 using namespace pxtest;
 
@@ -99,32 +98,16 @@ TEST(FreeForm, OnePairIdentityTranslationAndIgnoredPairs) {
     }
 }
 
-// Sources of an empty size with a matching record in the slot, which is
-// reused: nothing to map. The polar transforms return 1; the wave first needs
-// its map of height x stride x 2 bytes, which only two negative sizes give;
-// the warp lays its background (black: no source pixel can be read) over the
-// block the record claims. A reused record without pixels is drawn into by
-// nothing (1).
+// Sources of an empty size (see expect_slot_rule): nothing to map. The polar
+// transforms return 1; the wave first needs its map of height x stride x 2
+// bytes, which only two negative sizes give; the warp lays its background
+// (black: no source pixel can be read) over the block the record claims.
 TEST(FreeForm, EmptySourcesAndReusedSlotsInEveryDeformation) {
     const DeformationPair pair[] = {{1, 1, 2, 2}};
-    const std::function<uint32_t(Image *, Image **)> deformations[] = {
-        Punch_Transform, [](Image *s, Image **d) { return Wave_Transform(s, d, 5); },
-        [&](Image *s, Image **d) { return uint32_t(DeformationImage(s, pair, 1, d)); }};
-    const char *want[] = {"1k 1k 1k 1k", "0k 0k 0k 1k", "1z 1z 1k 1k"}; // zero width, INT_MIN width, heights -7
-    const int32_t shapes[][4] = {{0, 7, 12, 84}, {INT32_MIN, 7, 12, 84}, {9, -7, 28, 64}, {-9, -7, 28, 64}};
-    for (int d = 0; d < 3; ++d) {
-        for (int i = 0; i < 4; ++i) {
-            const auto [w, h, pitch, bytes] = shapes[i];
-            std::vector<uint8_t> block(static_cast<size_t>(bytes), 0x77), held(block.size(), 0x5A);
-            Image src{w, h, 24, block.data(), uint32_t(pitch), 0}, same = src, *slot = &same;
-            same.bits = held.data();
-            EXPECT_EQ(deformations[d](&src, &slot), uint32_t(want[d][3 * i] - '0')) << d << " " << i;
-            EXPECT_EQ(slot, &same);
-            EXPECT_EQ(held, std::vector<uint8_t>(held.size(), want[d][3 * i + 1] == 'z' ? 0 : 0x5A)) << d << " " << i;
-        }
-        Owned src = random_image(9, 7, 24, 5);
-        Image hollow{9, 7, 24, nullptr, 28, 0}, *slot = &hollow;
-        EXPECT_EQ(deformations[d](src.get(), &slot), 1u) << d;
-        EXPECT_TRUE(slot == &hollow && hollow.bits == nullptr) << d;
-    }
+    const SlotRuleCase cases[] = {
+        {"punch", Punch_Transform, "1k 1k 1k 1k"},
+        {"wave", bind_slot(Wave_Transform, 5), "0k 0k 0k 1k"},
+        {"warp", [&](Image *s, Image **d) { return uint32_t(DeformationImage(s, pair, 1, d)); }, "1z 1z 1k 1k"}};
+    for (const auto &c : cases)
+        expect_slot_rule(c);
 }

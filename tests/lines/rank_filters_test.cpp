@@ -72,32 +72,23 @@ TEST(RankFilters, MediansAndEdgeMarkerMatchStraightforwardVersions) {
 // that would read rows the plane lacks, or a missing block, refuses; empty
 // and negative sizes have no result plane.
 TEST(RankFilters, SmallPlanesAndRecordsWithoutPixels) {
-    struct Case {
-        int32_t (*filter)(Image *, Image **);
-        int32_t w, h;
-        bool pixels;
-        int32_t result;
-    };
-    const Case cases[] = {
-        {MyFliter, 15, 1, true, 1},      {MyFliter, 15, 30, false, 1}, {MyFliter, 16, 4, true, 0},
-        {MyFliter, 16, 6, true, 1},      {MyFliter, 16, 9, false, 0},  {MyFliter, 0, 5, true, 0},
-        {MyFliter1, 6, 2, true, 1},      {MyFliter1, 6, 9, false, 1},  {MyFliter1, 7, 4, true, 0},
-        {MyFliter1, 7, 6, true, 1},      {MyFliter1, 7, 9, false, 0},  {MyFliter1, 5, -2, true, 0},
-        {MyEdge, 2, 9, false, 1},        {MyEdge, 9, 2, true, 1},      {MyEdge, 3, 3, false, 0},
-        {MyEdge, INT32_MIN, 4, true, 0},
-    };
+    const std::pair<int32_t (*)(Image *, Image **), ShapeCase> cases[] = {
+        {MyFliter, {15, 1, true, 1}},     {MyFliter, {15, 30, false, 1}}, {MyFliter, {16, 4, true, 0}},
+        {MyFliter, {16, 6, true, 1}},     {MyFliter, {16, 9, false, 0}},  {MyFliter, {0, 5, true, 0}},
+        {MyFliter1, {6, 2, true, 1}},     {MyFliter1, {6, 9, false, 1}},  {MyFliter1, {7, 4, true, 0}},
+        {MyFliter1, {7, 6, true, 1}},     {MyFliter1, {7, 9, false, 0}},  {MyFliter1, {5, -2, true, 0}},
+        {MyEdge, {2, 9, false, 1}},       {MyEdge, {9, 2, true, 1}},      {MyEdge, {3, 3, false, 0}},
+        {MyEdge, {INT32_MIN, 4, true, 0}}};
     uint32_t seed = 40;
-    for (const Case &k : cases) {
+    for (const auto &[filter, k] : cases) {
         Owned held = random_image(std::max(k.w, 1), std::max(k.h, 1), 8, seed++), before = clone(held.get());
-        Image rec = *held;
-        rec.width = k.w, rec.height = k.h;
-        if (!k.pixels) rec.bits = nullptr;
+        Image rec = reshaped(held.get(), k.w, k.h, k.pixels);
         Slot handed;
-        EXPECT_EQ(k.filter(&rec, &handed), k.result) << k.w << "x" << k.h;
+        EXPECT_EQ(filter(&rec, &handed), k.result) << k.w << "x" << k.h;
         EXPECT_EQ(k.result ? diff(handed.get(), make(k.w, k.h, 8).get()) : diff(held.get(), before.get()), "");
         EXPECT_EQ(handed.get() != nullptr, k.result == 1);
         // In place: a plane with pixels becomes all 255.
-        EXPECT_EQ(k.filter(&rec, nullptr), k.result);
+        EXPECT_EQ(filter(&rec, nullptr), k.result);
         EXPECT_EQ(diff(held.get(), k.result && k.pixels ? make(k.w, k.h, 8).get() : before.get()), "");
     }
 }
@@ -134,12 +125,11 @@ TEST(RGB_Reverse, SwapsRedAndBlueOfColourPixelsOnly) {
     const int32_t sizes[][2] = {{0, 2}, {3, -2}, {INT32_MIN, 2}, {3, 0}};
     Owned im = filled(3, 2, 24, 0x112233u), kept = clone(im.get());
     for (auto [w, h] : sizes) {
-        Image rec = *im;
-        rec.width = w, rec.height = h;
+        Image rec = reshaped(im.get(), w, h);
         EXPECT_EQ(RGB_Reverse(&rec), 1) << w << "x" << h;
     }
-    Image hollow = *im, narrow = *im;
-    hollow.bits = nullptr, narrow.pitch = 8;
+    Image hollow = reshaped(im.get(), 3, 2, false), narrow = *im;
+    narrow.pitch = 8;
     EXPECT_EQ(RGB_Reverse(&hollow) + RGB_Reverse(&narrow), 0);
     EXPECT_EQ(diff(im.get(), kept.get()), "");
 }

@@ -60,18 +60,11 @@ TEST(BinImg, SlotGetsAFreshImageAndTheInputStays) {
 // plane that cannot be made. Refused with the slot untouched: a missing block
 // with columns to read, no rows, and widths whose width - 10 overflows.
 TEST(BinImg, EmptyWidthsReleaseTheSlotAndOthersAreRefused) {
-    struct Case {
-        int32_t w, h;
-        bool pixels;
-        int32_t result;
-    };
-    const Case cases[] = {{0, 7, true, 1}, {-5, 3, false, 1}, {INT32_MIN + 10, 7, true, 1}, {9, 7, false, 0},
-                          {9, 0, true, 0}, {9, -1, true, 0},  {INT32_MIN + 9, 7, true, 0}};
-    for (const Case &k : cases) {
+    const ShapeCase cases[] = {{0, 7, true, 1}, {-5, 3, false, 1}, {INT32_MIN + 10, 7, true, 1}, {9, 7, false, 0},
+                               {9, 0, true, 0}, {9, -1, true, 0},  {INT32_MIN + 9, 7, true, 0}};
+    for (const ShapeCase &k : cases) {
         Owned held = random_image(9, 7, 8, 11), before = clone(held.get());
-        Image rec = *held;
-        rec.width = k.w, rec.height = k.h;
-        if (!k.pixels) rec.bits = nullptr;
+        Image rec = reshaped(held.get(), k.w, k.h, k.pixels);
         Slot slot;
         slot.image = malloc_Image(2, 2, 8);
         Image *given = slot.get();
@@ -125,19 +118,12 @@ TEST(DetectLines, MarksLineBandsOnSyntheticPagesAndSurvivesTinyOnes) {
     // One row, or 10 columns and fewer, leave nothing to mark (1, untouched),
     // with or without pixels. Refused: a wider and taller record without
     // pixels, no rows, and a width whose width - 10 overflows.
-    struct Case {
-        int32_t w, h;
-        bool pixels;
-        int32_t result;
-    };
-    const Case cases[] = {{1, 1, true, 1},   {40, 1, true, 1}, {40, 1, false, 1}, {10, 40, true, 1},
-                          {9, 7, false, 1},  {0, 7, true, 1},  {-7, 7, true, 1},  {INT32_MIN + 10, 3, true, 1},
-                          {11, 7, false, 0}, {9, 0, true, 0},  {9, -7, true, 0},  {INT32_MIN + 9, 3, true, 0}};
-    for (const Case &k : cases) {
+    const ShapeCase cases[] = {{1, 1, true, 1},   {40, 1, true, 1}, {40, 1, false, 1}, {10, 40, true, 1},
+                               {9, 7, false, 1},  {0, 7, true, 1},  {-7, 7, true, 1},  {INT32_MIN + 10, 3, true, 1},
+                               {11, 7, false, 0}, {9, 0, true, 0},  {9, -7, true, 0},  {INT32_MIN + 9, 3, true, 0}};
+    for (const ShapeCase &k : cases) {
         Owned held = random_image(40, 40, 8, 6), before = clone(held.get());
-        Image rec = *held;
-        rec.width = k.w, rec.height = k.h;
-        if (!k.pixels) rec.bits = nullptr;
+        Image rec = reshaped(held.get(), k.w, k.h, k.pixels);
         EXPECT_EQ(DetectLines(&rec), k.result) << k.w << "x" << k.h;
         EXPECT_EQ(diff(held.get(), before.get()), "");
     }

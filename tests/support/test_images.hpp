@@ -47,6 +47,20 @@ struct Slot {
     Image *get() const { return image; }
 };
 
+// A record over held's pixels (or none) that claims another size, and a
+// table row of such a shape with the result a function gives for it.
+inline Image reshaped(const Image *held, int32_t w, int32_t h, bool pixels = true) {
+    Image r = *held;
+    r.width = w, r.height = h;
+    if (!pixels) r.bits = nullptr;
+    return r;
+}
+struct ShapeCase {
+    int32_t w, h;
+    bool pixels;
+    int32_t result;
+};
+
 // The bit counts every Image function must handle.
 inline constexpr int32_t kBitCounts[] = {8, 16, 24, 32};
 

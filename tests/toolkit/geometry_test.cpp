@@ -86,7 +86,6 @@ TEST(Geometry, DegenerateSourcesAndSizes) {
                   negH = rec(9, -7, 16), minW = rec(INT_MIN, 7, 8), minH = rec(9, INT_MIN, 8), negs8 = rec(-3, -9, 8),
                   negs24 = rec(-16, -2, 24), flat = rec(-3, -7, 8), narrow = rec(-4, -2, 8);
     const PXImage none{9, 7, 24, nullptr};
-    auto crop = [](const PXImage &im, PXRect r) { return PXImage_Crop(&im, &r); };
     const PXRect r{1, 3, 3, 0};
     const std::pair<std::function<PXImage *()>, const char *> cases[] = {
         {[&] { return PXImage_Resize(&g8, 0, 3); }, "0x3x8 none"},
@@ -101,35 +100,6 @@ TEST(Geometry, DegenerateSourcesAndSizes) {
         {[&] { return PXImage_Resize(&minW, 4, 2); }, "4x2x8 zeros"},
         {[&] { return PXImage_Resize(&g8, 70000, 70000); }, "null"},
         {[&] { return PXImage_Resize(&g8, INT_MIN, 3); }, "null"},
-        // Crops: right < left, top < bottom and top = bottom - 1, then sources without pixel rows.
-        {[&] {
-             return crop(g8, {10, 3, 1, 1});
-         },
-         "0x3x8 none"},
-        {[&] {
-             return crop(g8, {2, 1, 5, 4});
-         },
-         "8x-2x8 none"},
-        {[&] {
-             return crop(g8, {2, 3, 5, 4});
-         },
-         "8x0x8 none"},
-        {[&] { return crop(none, r); }, "8x4x24 zeros"},
-        {[&] { return crop(zeroW, r); }, "0x4x8 none"},
-        {[&] { return crop(minW, r); }, "0x4x8 none"},
-        {[&] { return crop(negH, r); }, "8x1x16 zeros"}, // top and bottom held at -8
-        {[&] {
-             return crop(negH, {1, -1, 3, 0});
-         },
-         "8x9x16 zeros"},
-        {[&] {
-             return crop(negH, {1, 0, 3, -1});
-         },
-         "8x-7x16 none"},
-        {[&] {
-             return crop(minH, {1, -1, 3, 0});
-         },
-         "null"}, // height 2^31 + 2
         // Turns and zooms: an empty block is a failed allocation; two negative sizes give a cleared one.
         {[&] { return PXImage_Rotate90(&negs8); }, "-8x-3x8 zeros"},
         {[&] { return PXImage_Rotate270(&negs8); }, "-8x-3x8 zeros"},
@@ -149,6 +119,26 @@ TEST(Geometry, DegenerateSourcesAndSizes) {
     for (const auto &[call, want] : cases) {
         PX out(call());
         EXPECT_EQ(px_shape(out.get()), want);
+    }
+    // Crops: right < left, top < bottom and top = bottom - 1, then sources
+    // without pixel rows (a negative height holds top and bottom at -8).
+    const struct {
+        const PXImage &src;
+        PXRect r;
+        const char *want;
+    } crops[] = {{g8, {10, 3, 1, 1}, "0x3x8 none"},
+                 {g8, {2, 1, 5, 4}, "8x-2x8 none"},
+                 {g8, {2, 3, 5, 4}, "8x0x8 none"},
+                 {none, r, "8x4x24 zeros"},
+                 {zeroW, r, "0x4x8 none"},
+                 {minW, r, "0x4x8 none"},
+                 {negH, r, "8x1x16 zeros"},
+                 {negH, {1, -1, 3, 0}, "8x9x16 zeros"},
+                 {negH, {1, 0, 3, -1}, "8x-7x16 none"},
+                 {minH, {1, -1, 3, 0}, "null"}}; // height 2^31 + 2
+    for (const auto &c : crops) {
+        PX out(PXImage_Crop(&c.src, &c.r));
+        EXPECT_EQ(px_shape(out.get()), c.want) << c.r.left << "," << c.r.top << "," << c.r.right << "," << c.r.bottom;
     }
     EXPECT_EQ(block, orig);
 }
