@@ -11,7 +11,7 @@
 namespace pxtest {
 
 // 130 x 5 takes rows past the 64-pixel blocks of the vector table lookups.
-inline constexpr int32_t kAwkwardSizes[][2] = {{1, 1}, {1, 7},  {7, 1},   {2, 3},  {5, 5},
+inline constexpr int32_t kAwkwardSizes[][2] = {{1, 1}, {1, 7},  {7, 1},   {2, 3},   {5, 5},
                                                {6, 4}, {13, 9}, {33, 17}, {64, 48}, {130, 5}};
 
 constexpr int chan(uint32_t c, int shift) { return static_cast<int>((c >> shift) & 255); }
