@@ -2,10 +2,13 @@
 #include <pxfx/color.h>
 #include <pxfx/retouch.h>
 
+#include <utility>
+
 #include "core/internal/byte_map.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/result.hpp"
 
 using namespace pxfx;
 
@@ -39,16 +42,14 @@ int32_t ImageExposure(const Image *src, Image **dst, int32_t delta) {
     free_Image(&l, 0);
     free_Image(&a, 0);
     if (!combined) return 0;
-    if (*dst == nullptr && combined->bitCount == src->bitCount) {
-        *dst = combined.release();
-        return 1;
+    // An empty slot receives the result in the source's format.
+    if (*dst == nullptr && combined->bitCount != src->bitCount) {
+        ImagePtr converted(malloc_Image(src->width, src->height, static_cast<int32_t>(src->bitCount)));
+        if (!converted) return 0;
+        PX_Img_Copy(converted.get(), combined.get());
+        combined = std::move(converted);
     }
-    if (*dst == nullptr) {
-        *dst = malloc_Image(src->width, src->height, static_cast<int32_t>(src->bitCount));
-        if (*dst == nullptr) return 0;
-    }
-    PX_Img_Copy(*dst, combined.get());
-    return 1;
+    return InPlaceOrSlot(const_cast<Image *>(src), dst).deliver(std::move(combined));
 }
 
 } // extern "C"

@@ -2,7 +2,8 @@
 // Each rule is named here once and used by name:
 //  - reuse the slot (prepare_slot, acquire_result): effects, deformations
 //    and the retouch tools;
-//  - in place or slot (InPlaceOrSlot): the line tools and PX_IMG_Smooth;
+//  - in place or slot (InPlaceOrSlot): the line tools, PX_IMG_Smooth and,
+//    for a slot it requires, ImageExposure;
 //  - hand over a new record (hand_over): the empty slot of in place or slot.
 // The packed toolkit has no slots: its functions return a new PXImage
 // (px_new, px_record in toolkit/pximage_check.hpp) or work in place on the
