@@ -2,10 +2,8 @@
 # platform's C library offers, Android's bionic (API level 21) included. Any
 # other undefined symbol fails: it would not link or load on the phones.
 # C++ runtime symbols are allowed (the NDK's libc++ provides its own).
-execute_process(COMMAND ${NM} -D --undefined-only ${LIBRARY} OUTPUT_VARIABLE nm_out RESULT_VARIABLE nm_rc)
-if(NOT nm_rc EQUAL 0)
-  message(FATAL_ERROR "nm failed on ${LIBRARY}")
-endif()
+include(${CMAKE_CURRENT_LIST_DIR}/nm_names.cmake)
+nm_names(needed ${LIBRARY} --undefined-only)
 
 set(allowed
   # C library
@@ -19,18 +17,14 @@ set(allowed
   __getauxval)
 
 set(unexpected)
-string(REPLACE "\n" ";" lines "${nm_out}")
-foreach(line IN LISTS lines)
-  if(line MATCHES "^ *[A-Za-z] +([^ ]+)$")
-    string(REGEX REPLACE "@.*$" "" name "${CMAKE_MATCH_1}")
-    # Sanitizer builds add calls into their runtimes; those builds never ship.
-    if(name MATCHES "^(_Z|__cxa_|__gxx_personality|_Unwind_|__aeabi_|__gnu_|__sync_|__atomic_|__asan_|__ubsan_|__lsan_|__sanitizer_)")
-      continue()
-    endif()
-    list(FIND allowed "${name}" at)
-    if(at EQUAL -1)
-      list(APPEND unexpected "${name}")
-    endif()
+foreach(name IN LISTS needed)
+  # Sanitizer builds add calls into their runtimes; those builds never ship.
+  if(name MATCHES "^(_Z|__cxa_|__gxx_personality|_Unwind_|__aeabi_|__gnu_|__sync_|__atomic_|__asan_|__ubsan_|__lsan_|__sanitizer_)")
+    continue()
+  endif()
+  list(FIND allowed "${name}" at)
+  if(at EQUAL -1)
+    list(APPEND unexpected "${name}")
   endif()
 endforeach()
 if(unexpected)
