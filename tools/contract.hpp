@@ -11,6 +11,7 @@
 #include <functional>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 namespace pxop {
@@ -26,6 +27,24 @@ template <class R> struct Call {
 
 // The failure result of functions that return nothing.
 inline constexpr int64_t kNoResult = INT64_MIN;
+// A result a contract does not pin.
+inline constexpr int64_t kUnpinned = INT64_MIN + 1;
+
+// A degenerate record a function works on without refusing, reading no
+// pixels: its kind ("null pixels", "zero width", "negative height",
+// "INT_MIN width", "negative sizes", "pitch below a row", "zero pitch",
+// "bit count N"; "second: ..." for b), what the call returns for it (unless
+// pinned here, the contract's `done`), and whether a record without a pixel
+// block gives the result and picture of the same record with an all-zero
+// block, as the pixel readers read a missing block as 0.
+struct Accepted {
+    std::string what;
+    int64_t result = kUnpinned;
+    bool reads_as_zeros = true;
+    Accepted(const char *kind) : what(kind) {}
+    Accepted(std::string kind, int64_t r, bool zeros = true)
+        : what(std::move(kind)), result(r), reads_as_zeros(zeros) {}
+};
 
 // A function "refuses" when it returns its failure result, leaves its result
 // slot empty and changes none of its inputs (records and pixel bytes).
@@ -41,23 +60,31 @@ template <class R> struct Contract {
     bool keeps_result_on_failure = false;   // a failed working allocation leaves the prepared result
     int32_t typical = 3;                    // an ordinary parameter value
     bool falls_back_on_failure = false;     // short of memory it finishes another, documented way
-    // Degenerate records ("null pixels", "zero width", "negative height",
-    // "INT_MIN width", "pitch below a row", "zero pitch", "bit count N";
-    // "second: ..." for b) it works on without refusing, reading no pixels:
-    // what it makes of them is pinned by the family's own tests.
-    std::vector<std::string> accepts;
+    // Degenerate records it works on without refusing, and what it returns for
+    // them (functions without a result return 1: done, nothing to do).
+    std::vector<Accepted> accepts;
+    int64_t done = 1;
     // The same function called another way (for example in place, with a
     // null slot), held to the same promises.
     std::function<int64_t(Call<R> &)> also;
 
-    bool accepts_record(const std::string &what) const {
-        return std::find(accepts.begin(), accepts.end(), what) != accepts.end();
+    const Accepted *accepted(const std::string &what) const {
+        const auto it = std::find_if(accepts.begin(), accepts.end(), [&](const Accepted &a) { return a.what == what; });
+        return it == accepts.end() ? nullptr : &*it;
     }
 };
 
 // Bit counts the pixel readers take: any (unknown ones read as opaque black).
 inline const std::vector<int32_t> kAnyBits = {8, 16, 24, 32, 0, 1, 4, 12, 48};
 // Records of no pixel rows that a function with nothing to visit takes as done.
-inline const std::vector<std::string> kEmptySizes = {"zero width", "negative height", "INT_MIN width"};
+inline const std::vector<Accepted> kEmptySizes = {"zero width", "negative height", "INT_MIN width", "negative sizes"};
+
+// The kinds given, accepted in the first picture and in the second.
+inline std::vector<Accepted> in_both(const std::vector<Accepted> &kinds) {
+    std::vector<Accepted> v = kinds;
+    for (const Accepted &a : kinds)
+        v.emplace_back("second: " + a.what, a.result, a.reads_as_zeros);
+    return v;
+}
 
 } // namespace pxop

@@ -12,7 +12,7 @@ namespace {
 using C = Call<Image>;
 
 // 8-bit planes only; a null result slot means "in place" where there is one.
-Contract<Image> plane(std::function<int64_t(C &)> call, std::vector<std::string> accepts = {}, int64_t failure = 0) {
+Contract<Image> plane(std::function<int64_t(C &)> call, std::vector<Accepted> accepts = {}, int64_t failure = 0) {
     return {.formats = {8}, .call = std::move(call), .failure = failure, .slot = false, .accepts = std::move(accepts)};
 }
 

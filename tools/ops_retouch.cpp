@@ -31,11 +31,11 @@ using C = Call<Image>;
 const std::vector<int32_t> kRgb = {24, 32};
 // A source without a pixel block reads as 0: the tools preparing a slot from
 // it work on it.
-const std::vector<std::string> kNoPixels = {"null pixels"};
+const std::vector<Accepted> kNoPixels = {"null pixels"};
 
 // A tool filling a result slot from one picture of any bit count.
 Contract<Image> slot_contract(std::function<int64_t(C &)> call, int64_t failure = 0,
-                              std::vector<std::string> accepts = kNoPixels, bool keeps = false) {
+                              std::vector<Accepted> accepts = kNoPixels, bool keeps = false) {
     return {.formats = kAnyBits,
             .call = std::move(call),
             .failure = failure,
@@ -44,7 +44,7 @@ Contract<Image> slot_contract(std::function<int64_t(C &)> call, int64_t failure 
 }
 // Tools changing their picture, with an optional slot or none.
 Contract<Image> no_slot(std::vector<int32_t> formats, std::function<int64_t(C &)> call, int64_t failure = 0,
-                        std::vector<std::string> accepts = {}) {
+                        std::vector<Accepted> accepts = {}) {
     return {.formats = std::move(formats),
             .call = std::move(call),
             .failure = failure,
@@ -53,13 +53,12 @@ Contract<Image> no_slot(std::vector<int32_t> formats, std::function<int64_t(C &)
 }
 // Pastes of a second picture of any size and bit count.
 Contract<Image> paste(std::function<int64_t(C &)> call) {
-    return {.formats = kAnyBits,
-            .call = std::move(call),
-            .pictures = 2,
-            .slot = false,
-            .accepts = {"null pixels", "zero width", "negative height", "INT_MIN width", "second: null pixels",
-                        "second: zero width", "second: negative height", "second: INT_MIN width",
-                        "second: pitch below a row", "second: zero pitch"}};
+    return {.formats = kAnyBits, .call = std::move(call), .pictures = 2, .slot = false, .accepts = [] {
+                std::vector<Accepted> v =
+                    in_both({"null pixels", "zero width", "negative height", "INT_MIN width", "negative sizes"});
+                v.insert(v.end(), {"second: pitch below a row", "second: zero pitch"});
+                return v;
+            }()};
 }
 const int32_t kStrokeX[] = {0, 4, -9, INT_MAX}, kStrokeY[] = {3, INT_MIN, 2, 6};
 
@@ -85,7 +84,9 @@ void add_retouch(std::vector<Operation> &t) {
          kAllFormats,
          [](const Image *in, const Args &) { return slot_tool(in, [](Image *s, Image **d) { SmileDetect(s, d, 0); }); },
          [] {
-             Contract<Image> c = slot_contract([](C &c) { return SmileDetect(c.a, c.slot, c.p); }, 1);
+             // Without a pixel block no mask is made: the slot keeps a new, white image.
+             Contract<Image> c =
+                 slot_contract([](C &c) { return SmileDetect(c.a, c.slot, c.p); }, 1, {{"null pixels", 1, false}});
              c.falls_back_on_failure = true;
              return c;
          }()});
@@ -121,7 +122,7 @@ void add_retouch(std::vector<Operation> &t) {
                  kAllFormats,
                  [](const Image *in, const Args &) { return in_place(in, [](Image *p) { return LightUP(p) == 1; }); },
                  no_slot(kAnyBits, [](C &c) -> int64_t { return LightUP(c.a); }, 0,
-                         {"zero width", "negative height", "INT_MIN width", "null pixels"})});
+                         {"zero width", "negative height", "INT_MIN width", "negative sizes", "null pixels"})});
     t.push_back({"third-largest",
                  PXOP_FN(Best_Color),
                  "Skin",
@@ -272,7 +273,8 @@ void add_retouch(std::vector<Operation> &t) {
                      Contract<Image> c = no_slot(kRgb, [](C &c) -> int64_t { return alg_Img_Blending(c.a, c.slot); }, 0,
                                                  {"null pixels", "bit count 0", "bit count 1", "bit count 4",
                                                   "bit count 8", "bit count 12", "bit count 16", "bit count 48"});
-                     c.keeps_result_on_failure = true;
+                     c.keeps_result_on_failure = true, c.done = 0;
+                     c.accepts.front().reads_as_zeros = false;
                      c.also = [](C &c) -> int64_t { return alg_Img_Blending(c.a, nullptr); };
                      return c;
                  }()});

@@ -59,8 +59,9 @@ const std::vector<int32_t> kGeometry = {8, 16, 24};
 // Every bit count, the broken records made at 0 bits: the filters leave those alone.
 const std::vector<int32_t> kEveryBits = {0, 1, 4, 8, 12, 16, 24, 32, 48};
 // Records without pixel rows (and, where named, without data).
-const std::vector<std::string> kRowless = kEmptySizes;
-const std::vector<std::string> kPixelless = {"null pixels", "zero width", "negative height", "INT_MIN width"};
+const std::vector<Accepted> kRowless = kEmptySizes;
+const std::vector<Accepted> kPixelless = {"null pixels", "zero width", "negative height", "INT_MIN width",
+                                          "negative sizes"};
 
 // A rectangle and a point following the parameter, and the address of such a
 // value for the duration of a call.
@@ -71,7 +72,7 @@ template <class T> const T *ptr(const T &v) { return &v; }
 // Contracts of functions taking the parameter and one picture, returning a
 // new record or changing the picture in place, or two pictures (no result slot).
 Contract<PXImage> made(std::vector<int32_t> formats, std::function<PXImage *(PXImage *, int32_t)> f,
-                       std::vector<std::string> accepts = {}) {
+                       std::vector<Accepted> accepts = {}) {
     return {.formats = std::move(formats),
             .call = [f](P &c) { return (c.out = f(c.a, c.p)) != nullptr; },
             .slot = false,
@@ -79,7 +80,7 @@ Contract<PXImage> made(std::vector<int32_t> formats, std::function<PXImage *(PXI
 }
 template <class R>
 Contract<R> changed(std::vector<int32_t> formats, std::function<int64_t(R *, int32_t)> f,
-                    std::vector<std::string> accepts = {}, int64_t failure = 0) {
+                    std::vector<Accepted> accepts = {}, int64_t failure = 0) {
     return {.formats = std::move(formats),
             .call = [f](Call<R> &c) { return f(c.a, c.p); },
             .failure = failure,
@@ -87,7 +88,7 @@ Contract<R> changed(std::vector<int32_t> formats, std::function<int64_t(R *, int
             .accepts = std::move(accepts)};
 }
 Contract<PXImage> two(std::vector<int32_t> formats, std::function<int64_t(PXImage *, PXImage *, int32_t)> f,
-                      std::vector<std::string> accepts = {}) {
+                      std::vector<Accepted> accepts = {}) {
     return {.formats = std::move(formats),
             .call = [f](P &c) { return f(c.a, c.b, c.p); },
             .pictures = 2,
@@ -163,7 +164,7 @@ void add_toolkit(std::vector<Operation> &t) {
                  {},
                  kPacked,
                  [](const Image *in, const Args &) { return packed_new(in, PXImage_Rotate180); },
-                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_Rotate180(a); })});
+                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_Rotate180(a); }, {"negative sizes"})});
     t.push_back({"rotate270",
                  PXOP_FN(PXImage_Rotate270),
                  "Toolkit geometry",
@@ -180,7 +181,7 @@ void add_toolkit(std::vector<Operation> &t) {
                  {},
                  kPacked,
                  [](const Image *in, const Args &) { return packed_new(in, PXImage_ZoomIn); },
-                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_ZoomIn(a); }),
+                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_ZoomIn(a); }, {"negative sizes"}),
                  false});
     t.push_back({"zoom-out",
                  PXOP_FN(PXImage_ZoomOut),
@@ -210,12 +211,12 @@ void add_toolkit(std::vector<Operation> &t) {
                      PXImage_Free(src);
                      return out;
                  },
-                 two({32},
+                 two(
+                     {32},
                      [](PXImage *a, PXImage *b, int32_t p) -> int64_t {
                          return PXImage_ROI_Zoom(a, b, ptr(rect(p)), p / 3.0, p, 1);
                      },
-                     {"null pixels", "zero width", "negative height", "INT_MIN width", "second: null pixels",
-                      "second: zero width", "second: negative height", "second: INT_MIN width"})});
+                     in_both(kPixelless))});
     t.push_back({"auto-exposure",
                  PXOP_FN(PXImage_AutoExposure),
                  "Toolkit tone",
@@ -249,7 +250,8 @@ void add_toolkit(std::vector<Operation> &t) {
              const PXPoint pt = {kit::at(in, a.values[0], true), kit::at(in, a.values[1], false)};
              return packed_in_place(in, [&](PXImage *p) { return PXImage_AutoWhiteBalance(p, &pt) == 1; });
          },
-         changed<PXImage>({8, 24}, [](PXImage *a, int32_t p) { return PXImage_AutoWhiteBalance(a, ptr(point(p))); })});
+         changed<PXImage>({8, 24}, [](PXImage *a, int32_t p) { return PXImage_AutoWhiteBalance(a, ptr(point(p))); },
+                          {"negative sizes"})});
     t.push_back({"invert",
                  PXOP_FN(PXImage_BlueEnhancement),
                  "Toolkit tone",
@@ -261,16 +263,17 @@ void add_toolkit(std::vector<Operation> &t) {
                  },
                  changed<PXImage>(
                      kGeometry, [](PXImage *a, int32_t) { return PXImage_BlueEnhancement(a); }, kRowless)});
-    t.push_back({"green-gray",
-                 PXOP_FN(PXImage_GreenChannel),
-                 "Toolkit tone",
-                 "Green copied into every channel",
-                 {},
-                 kColour,
-                 [](const Image *in, const Args &) {
-                     return packed_in_place(in, [](PXImage *p) { return PXImage_GreenChannel(p) == 1; });
-                 },
-                 changed<PXImage>({24, 32}, [](PXImage *a, int32_t) { return PXImage_GreenChannel(a); })});
+    t.push_back(
+        {"green-gray",
+         PXOP_FN(PXImage_GreenChannel),
+         "Toolkit tone",
+         "Green copied into every channel",
+         {},
+         kColour,
+         [](const Image *in, const Args &) {
+             return packed_in_place(in, [](PXImage *p) { return PXImage_GreenChannel(p) == 1; });
+         },
+         changed<PXImage>({24, 32}, [](PXImage *a, int32_t) { return PXImage_GreenChannel(a); }, {"negative sizes"})});
     t.push_back({"px-sharpen",
                  PXOP_FN(PXImage_Sharpen),
                  "Toolkit filters",
@@ -311,7 +314,8 @@ void add_toolkit(std::vector<Operation> &t) {
                  [](const Image *in, const Args &) {
                      return packed_in_place(in, [](PXImage *p) { return PXImage_GrayToBinarization(p) == 1; });
                  },
-                 changed<PXImage>(kGeometry, [](PXImage *a, int32_t) { return PXImage_GrayToBinarization(a); })});
+                 changed<PXImage>(kGeometry, [](PXImage *a, int32_t) { return PXImage_GrayToBinarization(a); },
+                                  {"negative sizes"})});
     t.push_back({"frame",
                  PXOP_FN(PXImage_Effect_Clip),
                  "Toolkit filters",

@@ -1,5 +1,5 @@
 // Hostile input beyond the registry's contracts: point lists, curves and
-// caches at their extremes, sources without pixels and of empty sizes.
+// caches at their extremes, and sources of empty sizes.
 #include <climits>
 
 #include "support/hostile.hpp"
@@ -36,38 +36,6 @@ TEST(Hostile, RetouchScalars) {
         ComputeBezier(far, std::min(v, 3), pts);
     }
     EXPECT_EQ(pts[0].x, INT_MIN);
-}
-
-// A source without a pixel block reads as 0, so every tool that prepares a
-// slot from it makes what it makes of an all-zero block of that size; the
-// skin mask alone is not made (the slot stays a new, white image).
-TEST(Hostile, RetouchSourcesWithoutPixels) {
-    using Tool = std::function<int64_t(const Image *, Image **)>;
-    const std::pair<const char *, Tool> tools[] = {
-        {"alg_Img_smooth_1", [](auto s, auto d) { return alg_Img_smooth_1(s, d); }},
-        {"alg_Img_smooth", [](auto s, auto d) { return alg_Img_smooth(s, d), 0; }},
-        {"alg_Img_Skin", [](auto s, auto d) { return alg_Img_Skin(s, d, 1); }},
-        {"MoreLight", [](auto s, auto d) { return MoreLight(s, 3, d), 0; }},
-        {"ImageAutoGradationProcess", [](auto s, auto d) { return ImageAutoGradationProcess(s, d, 60); }},
-        {"ImageAutoGradationProcess1", [](auto s, auto d) { return ImageAutoGradationProcess1(s, d, 0, 1), 0; }},
-        {"thresholdBlur", [](auto s, auto d) { return thresholdBlur(0, 0, 3, 70, s, d), 0; }},
-    };
-    for (int32_t bc : pxtest::kBitCounts) {
-        pxtest::Owned zeros = pxtest::make(9, 7, bc);
-        std::fill(zeros->bits, zeros->bits + zeros->pitch * 7, 0);
-        Image hollow = *zeros;
-        hollow.bits = nullptr;
-        for (const auto &[name, tool] : tools) {
-            pxtest::Slot fromHollow, fromZeros;
-            ASSERT_EQ(tool(&hollow, &fromHollow), tool(zeros.get(), &fromZeros)) << name << " " << bc;
-            ASSERT_NE(fromHollow.get(), nullptr) << name << " " << bc;
-            EXPECT_EQ(picture_bytes(fromHollow.get()), picture_bytes(fromZeros.get())) << name << " " << bc;
-        }
-        pxtest::Slot mask;
-        ASSERT_EQ(SmileDetect(&hollow, &mask, 0), 1);
-        EXPECT_EQ(picture_bytes(mask.get()), picture_bytes(pxtest::make(9, 7, bc).get())) << bc;
-        EXPECT_EQ(LightUP(&hollow), 1);
-    }
 }
 
 // Empty sizes run no pixel loop: the slot rule still replaces a mismatching

@@ -105,6 +105,7 @@ template <class R> std::vector<HeldPtr<R>> broken(const std::vector<int32_t> &fo
         v.push_back(held("zero width", 0, 7, bc, row, size_t(row) * 7, 2));
         v.push_back(held("negative height", 9, -7, bc, row, 64, 3));
         v.push_back(held("INT_MIN width", INT_MIN, 7, bc, row, size_t(row) * 7, 4));
+        v.push_back(held("negative sizes", -3, -2, bc, row, 64, 9));
         v.push_back(held("block over 2^32 bytes", 65536, 65536, bc, padded_pitch(65536, bc), 64, 5));
         v.push_back(held("INT_MAX height", 9, INT_MAX, bc, row, 64, 6));
         if (bc >= 8) v.push_back(held("pitch below a row", 9, 7, bc, 9 * bc / 8 - 1, size_t(9 * bc / 8 - 1) * 7, 7));
@@ -115,12 +116,14 @@ template <class R> std::vector<HeldPtr<R>> broken(const std::vector<int32_t> &fo
         v.push_back(held("zero width", 0, 7, bc, bytes, 2));
         v.push_back(held("negative height", 9, -7, bc, 64, 3));
         v.push_back(held("INT_MIN width", INT_MIN, 7, bc, 64, 4));
+        v.push_back(held("negative sizes", -3, -2, bc, 64, 9));
         v.push_back(held("block over 2^32 bytes", 65536, 65536, bc, 64, 5));
         v.push_back(held("INT_MAX height", 9, INT_MAX, bc, 64, 6));
     }
     return v;
 }
 
+using pxop::Accepted;
 using pxop::Call;
 using pxop::Contract;
 using pxop::kNoResult;
@@ -206,12 +209,11 @@ template <class R> void expect_refusals(const std::string &name, const Contract<
     R *second = c.pictures > 1 ? &b->record : nullptr;
     run.expect_refused(nullptr, second, false, {b.get()}, "null first picture");
     for (auto &bad : broken<R>(c.formats))
-        if (!c.accepts_record(bad->what))
-            run.expect_refused(&bad->record, second, false, {bad.get(), b.get()}, bad->what);
+        if (!c.accepted(bad->what)) run.expect_refused(&bad->record, second, false, {bad.get(), b.get()}, bad->what);
     if (c.pictures > 1) {
         run.expect_refused(&a->record, nullptr, false, {a.get()}, "null second picture");
         for (auto &bad : broken<R>(c.formats_b.empty() ? c.formats : c.formats_b))
-            if (!c.accepts_record("second: " + bad->what))
+            if (!c.accepted("second: " + bad->what))
                 run.expect_refused(&a->record, &bad->record, false, {a.get(), bad.get()}, "second: " + bad->what);
         if (c.mismatch_fails) {
             auto odd = good<R>(5, 11, fb, 13);
@@ -275,9 +277,50 @@ template <class R> void expect_allocation_failures_handled(const std::string &na
     }
 }
 
-// All three checks for a function, and for its other way of being called.
+// Accepted degenerate records in either picture position: the result the
+// contract gives, and for a record without a pixel block, what the same
+// record with an all-zero block gives.
+template <class R> void expect_accepted_outcomes(const std::string &name, const Contract<R> &c) {
+    Runner<R> run{c, name};
+    const int32_t fa = c.formats.front(), fb = run.format_b(fa);
+    for (const bool second : {false, true}) {
+        if (second && c.pictures < 2) break;
+        auto other = good<R>(9, 7, second ? fa : fb, 41);
+        auto call = [&](R *degenerate) {
+            if (!second) return run.run(degenerate, c.pictures > 1 ? &other->record : nullptr, c.typical);
+            return run.run(&other->record, degenerate, c.typical);
+        };
+        for (auto &bad : broken<R>(second ? std::vector<int32_t>{fb} : c.formats)) {
+            const Accepted *acc = c.accepted(second ? "second: " + bad->what : bad->what);
+            if (acc == nullptr) continue;
+            const std::string why = name + ": " + acc->what;
+            const auto o = call(&bad->record);
+            if (c.failure != kNoResult) {
+                EXPECT_EQ(o.result, acc->result != pxop::kUnpinned ? acc->result : c.done) << why;
+            }
+        }
+        // Without a pixel block, at every bit count: as with an all-zero block.
+        const Accepted *none = c.accepted(second ? "second: null pixels" : "null pixels");
+        if (none == nullptr || !none->reads_as_zeros) continue;
+        for (const int32_t bc : second ? std::vector<int32_t>{fb} : c.formats) {
+            auto zeros = good<R>(9, 7, bc, 0);
+            std::fill(zeros->block.begin(), zeros->block.end(), 0);
+            R hollow = zeros->record;
+            if constexpr (std::is_same_v<R, Image>)
+                hollow.bits = nullptr;
+            else
+                hollow.data = nullptr;
+            const auto o = call(&hollow), z = call(&zeros->record);
+            EXPECT_TRUE(o.result == z.result && o.picture == z.picture)
+                << name << ": " << none->what << " at " << bc << " bits, not as an all-zero block";
+        }
+    }
+}
+
+// All the checks for a function, and for its other way of being called.
 template <class R> void check_contract(const std::string &name, const Contract<R> &c) {
     expect_refusals(name, c);
+    expect_accepted_outcomes(name, c);
     expect_extremes_survive(name, c);
     expect_allocation_failures_handled(name, c);
     if (c.also) {

@@ -118,36 +118,6 @@ TEST(WhiteBalance, MatchesLiteralVersionAtEdgesAndCorners) {
         }
 }
 
-// Records without pixel rows or data, one row per record: the results of
-// both exposures, white balance, inversion and green copy. The second table
-// of sizes allocates a scratch plane only when both sizes are negative.
-TEST(Channels, ToneFunctionsOnRecordsWithoutPixelRows) {
-    std::vector<uint8_t> block(64, 33);
-    const auto orig = block;
-    const PXPoint pt{1, 1};
-    const struct {
-        PXImage im;
-        int32_t exposure, balance, invert, green;
-    } cases[] = {
-        {{0, 7, 24, block.data()}, 1, 0, 1, 0},
-        {{9, -7, 24, block.data()}, 1, 0, 1, 0},
-        {{INT_MIN, 7, 24, block.data()}, 1, 0, 1, 0},
-        {{INT_MIN, -2, 24, block.data()}, 1, 0, 1, 0},
-        {{-3, -2, 24, block.data()}, 1, 1, 1, 1},
-        {{-3, -2, 8, block.data()}, 1, 1, 1, 0},
-        {{9, 7, 24, nullptr}, 0, 0, 0, 0},
-    };
-    for (auto c : cases) {
-        SCOPED_TRACE(std::to_string(c.im.width) + "x" + std::to_string(c.im.height));
-        EXPECT_EQ(PXImage_AutoExposure(&c.im), c.exposure);
-        EXPECT_EQ(PXImage_AutoExposure_1(&c.im), c.exposure);
-        EXPECT_EQ(PXImage_AutoWhiteBalance(&c.im, &pt), c.balance);
-        EXPECT_EQ(PXImage_BlueEnhancement(&c.im), c.invert);
-        EXPECT_EQ(PXImage_GreenChannel(&c.im), c.green);
-    }
-    EXPECT_EQ(block, orig);
-}
-
 TEST(Channels, InversionAndGreenCopy) {
     PX rgba = px_random(4, 3, 32, 10), a0 = px_clone(rgba.get());
     PX rgb = px_random(4, 3, 24, 9), r0 = px_clone(rgb.get());

@@ -15,7 +15,8 @@ PXRect rect(int32_t p) { return {1, p, p, 0}; }
 PXPoint point(int32_t p) { return {p, p}; }
 template <class T> const T *ptr(const T &v) { return &v; }
 
-const std::vector<std::string> pixelless = {"null pixels", "zero width", "negative height", "INT_MIN width"};
+const std::vector<std::string> pixelless = {"null pixels", "zero width", "negative height", "INT_MIN width",
+                                            "negative sizes"};
 
 } // namespace
 
