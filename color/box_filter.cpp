@@ -12,11 +12,13 @@
 
 #include <algorithm>
 #include <cstring>
+#include <optional>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/view.hpp"
 
 using namespace pxfx;
 
@@ -101,37 +103,37 @@ void row_means(const Sum *col, Sum *diff, int32_t w, const Box &box, const MeanF
 // (ringRows rows, at least half + 2 or the whole height) before it is
 // overwritten, and the rows leaving the box are read back from there.
 template <class Sum, int Bpp, class MeanFn>
-void running_box(const Image *src, Image *dst, const Box &box, const MeanFn &mean, Sum *col, uint8_t *ring,
+void running_box(const View &src, const View &dst, const Box &box, const MeanFn &mean, Sum *col, uint8_t *ring,
                  int32_t ringRows) {
-    const int32_t w = src->width, h = src->height;
+    const int32_t w = src.width, h = src.height;
     const size_t n = static_cast<size_t>(w) * Bpp;
     for (size_t j = 0; j < n; ++j) {
-        col[j] = clamped_sum<Sum>(box.first(0), box.last(0), h,
-                                  [&](int32_t r) { return static_cast<Sum>(row_ptr(src, r)[j]); });
+        col[j] =
+            clamped_sum<Sum>(box.first(0), box.last(0), h, [&](int32_t r) { return static_cast<Sum>(src.row(r)[j]); });
     }
     for (int32_t y = 0; y < h; ++y) {
-        if (ring != nullptr) std::memcpy(ring + static_cast<size_t>(y % ringRows) * n, row_ptr(src, y), n);
+        if (ring != nullptr) std::memcpy(ring + static_cast<size_t>(y % ringRows) * n, src.row(y), n);
         if (y > 0) {
             // The entering row is at or below y, so it still holds source pixels.
-            const uint8_t *in = row_ptr(src, clamp_coord(box.last(y), h));
+            const uint8_t *in = src.row(clamp_coord(box.last(y), h));
             const int32_t r = clamp_coord(box.first(y) - 1, h);
-            const uint8_t *gone = ring != nullptr ? ring + static_cast<size_t>(r % ringRows) * n : row_ptr(src, r);
+            const uint8_t *gone = ring != nullptr ? ring + static_cast<size_t>(r % ringRows) * n : src.row(r);
             for (size_t j = 0; j < n; ++j)
                 col[j] += static_cast<Sum>(in[j]) - static_cast<Sum>(gone[j]);
         }
-        row_means<Sum, Bpp>(col, col + n, w, box, mean, row_ptr(dst, y));
+        row_means<Sum, Bpp>(col, col + n, w, box, mean, dst.row(y));
     }
 }
 
 // Every box summed in full, for when the column sums cannot be had.
-template <class Sum, int Bpp> void full_box(const Image *src, Image *dst, const Box &box, const Mean<Sum> &mean) {
-    const int32_t w = src->width, h = src->height;
+template <class Sum, int Bpp> void full_box(const View &src, const View &dst, const Box &box, const Mean<Sum> &mean) {
+    const int32_t w = src.width, h = src.height;
     for (int32_t y = 0; y < h; ++y) {
-        uint8_t *out = row_ptr(dst, y);
+        uint8_t *out = dst.row(y);
         for (int32_t x = 0; x < w; ++x)
             for (int k = 0; k < Bpp; ++k) {
                 const Sum s = clamped_sum<Sum>(box.first(y), box.last(y), h, [&](int32_t r) {
-                    const uint8_t *row = row_ptr(src, r);
+                    const uint8_t *row = src.row(r);
                     return clamped_sum<Sum>(box.first(x), box.last(x), w,
                                             [&](int32_t c) { return static_cast<Sum>(row[Bpp * c + k]); });
                 });
@@ -142,12 +144,13 @@ template <class Sum, int Bpp> void full_box(const Image *src, Image *dst, const 
 
 // Smooths src into dst; with a ring (see running_box) dst is src itself.
 template <class Sum, int Bpp>
-bool smooth(const Image *src, Image *dst, int32_t size, int32_t offset, bool running, uint8_t *ring, int32_t ringRows) {
+bool smooth(const View &src, const View &dst, int32_t size, int32_t offset, bool running, uint8_t *ring,
+            int32_t ringRows) {
     const Box box{size, size / 2};
     const Mean<Sum> mean(size, offset);
     // Column sums and a row of their differences.
     Buffer<Sum> col =
-        running ? alloc_zeroed<Sum>(checked_size(static_cast<uint64_t>(src->width), 2 * Bpp)) : Buffer<Sum>();
+        running ? alloc_zeroed<Sum>(checked_size(static_cast<uint64_t>(src.width), 2 * Bpp)) : Buffer<Sum>();
     if (col && mean.table) {
         // The table through a local pointer: stores to the result rows cannot
         // alias it, so the loop keeps it in a register.
@@ -169,7 +172,7 @@ bool smooth(const Image *src, Image *dst, int32_t size, int32_t offset, bool run
 constexpr int32_t kMaxSize32 = 2901;
 
 template <int Bpp>
-bool smooth_any(const Image *src, Image *dst, int32_t size, int32_t offset, bool running, uint8_t *ring = nullptr,
+bool smooth_any(const View &src, const View &dst, int32_t size, int32_t offset, bool running, uint8_t *ring = nullptr,
                 int32_t ringRows = 0) {
     if (size <= kMaxSize32) return smooth<int32_t, Bpp>(src, dst, size, offset, running, ring, ringRows);
     return smooth<int64_t, Bpp>(src, dst, size, offset, running, ring, ringRows);
@@ -178,13 +181,13 @@ bool smooth_any(const Image *src, Image *dst, int32_t size, int32_t offset, bool
 // Running sums straight into the image, keeping only the source rows that
 // are still to leave the box; false (image untouched) when the working
 // memory cannot be had.
-bool smooth_in_place(Image *image, int32_t size, int32_t offset) {
-    const int32_t ringRows = static_cast<int32_t>(std::min<int64_t>(size / 2 + 2, image->height));
-    const uint32_t bpp = image->bitCount / 8;
+bool smooth_in_place(const View &image, int32_t size, int32_t offset) {
+    const int32_t ringRows = static_cast<int32_t>(std::min<int64_t>(size / 2 + 2, image.height));
+    const uint32_t bpp = image.bitCount / 8;
     Buffer<uint8_t> ring =
-        alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(image->width), bpp, static_cast<uint64_t>(ringRows)));
+        alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(image.width), bpp, static_cast<uint64_t>(ringRows)));
     if (!ring) return false;
-    switch (image->bitCount) {
+    switch (image.bitCount) {
     case 8: return smooth_any<1>(image, image, size, offset, true, ring.get(), ringRows);
     case 24: return smooth_any<3>(image, image, size, offset, true, ring.get(), ringRows);
     default: return smooth_any<4>(image, image, size, offset, true, ring.get(), ringRows);
@@ -196,33 +199,35 @@ bool smooth_in_place(Image *image, int32_t size, int32_t offset) {
 namespace pxfx {
 
 int32_t box_filter(Image *image, int32_t size, int32_t offset, bool runningSums) {
-    if (!has_pixels(image) || image->bitCount < 8 || size == 0 || size < -kMaxBoxSize || size > kMaxBoxSize) return 0;
+    const std::optional<View> v = view_of(image);
+    if (!v || v->bitCount < 8 || size == 0 || size < -kMaxBoxSize || size > kMaxBoxSize) return 0;
     // The result is made in a new white image and copied back with
     // PX_Img_Copy: the whole block, padding bytes (255) included, when the
     // image has the new image's pitch; otherwise pixel by pixel, a 32-bit
     // image keeping its own alpha. Smoothing in place gives the same only in
     // the first case.
-    const bool direct = image->bitCount == 8 || image->bitCount == 24 || image->bitCount == 32;
-    const bool wholeBlock = direct && image->pitch == fresh_pitch(image->width, image->bitCount);
-    if (size > 0 && runningSums && wholeBlock && smooth_in_place(image, size, offset)) {
-        const size_t used = static_cast<size_t>(image->width) * (image->bitCount / 8);
-        for (int32_t y = 0; y < image->height; ++y)
-            std::memset(row_ptr(image, y) + used, 255, image->pitch - used);
+    const bool direct = v->bitCount == 8 || v->bitCount == 24 || v->bitCount == 32;
+    const bool wholeBlock = direct && v->pitch == fresh_pitch(v->width, v->bitCount);
+    if (size > 0 && runningSums && wholeBlock && smooth_in_place(*v, size, offset)) {
+        const size_t used = static_cast<size_t>(v->width) * (v->bitCount / 8);
+        for (int32_t y = 0; y < v->height; ++y)
+            std::memset(v->row(y) + used, 255, v->pitch - used);
         return 1;
     }
-    ImagePtr work = make_image(image->width, image->height, static_cast<int32_t>(image->bitCount));
+    ImagePtr work = make_image(v->width, v->height, static_cast<int32_t>(v->bitCount));
     if (!work) return 0;
+    const View w = *view_of(work.get());
     if (size < 0 && direct) {
         // A negative size makes every box empty: each channel is its sum 0
         // divided by size^2, plus the offset, clamped.
         const uint8_t flat = static_cast<uint8_t>(std::clamp(offset, 0, 255));
-        for (int32_t y = 0; y < image->height; ++y)
-            std::memset(row_ptr(work.get(), y), flat, static_cast<size_t>(image->width) * (image->bitCount / 8));
+        for (int32_t y = 0; y < w.height; ++y)
+            std::memset(w.row(y), flat, static_cast<size_t>(w.width) * (w.bitCount / 8));
     } else if (size > 0) {
-        switch (image->bitCount) {
-        case 8: smooth_any<1>(image, work.get(), size, offset, runningSums); break;
-        case 24: smooth_any<3>(image, work.get(), size, offset, runningSums); break;
-        case 32: smooth_any<4>(image, work.get(), size, offset, runningSums); break;
+        switch (v->bitCount) {
+        case 8: smooth_any<1>(*v, w, size, offset, runningSums); break;
+        case 24: smooth_any<3>(*v, w, size, offset, runningSums); break;
+        case 32: smooth_any<4>(*v, w, size, offset, runningSums); break;
         default: break; // the working image stays white
         }
     }
@@ -246,7 +251,9 @@ int32_t PX_IMG_Smooth(const Image *src, Image **out, int32_t strength) {
     // What the box filter refuses (a size of 0, a target without pixels or
     // below 8 bits) is left as it is; a picture it takes fails only when its
     // working image cannot be made.
-    if (size == 0 || !has_pixels(target) || target->bitCount < 8 || Filter_fast(target, size, 0) == 1) return 1;
+    if (size == 0) return 1;
+    if (const std::optional<View> t = view_of(target); !t || t->bitCount < 8 || Filter_fast(target, size, 0) == 1)
+        return 1;
     rule.discard_new();
     return 0;
 }

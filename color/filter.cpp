@@ -11,11 +11,13 @@
 #include <climits>
 #include <cstdint>
 #include <cstring>
+#include <optional>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/view.hpp"
 
 using namespace pxfx;
 
@@ -113,8 +115,8 @@ constexpr int64_t kMaxFinishTable = 1 << 16;
 // in one pass over the output pixels where all of them read inside the row;
 // the pixels nearer the ends go one tap at a time with clamped columns.
 template <int S, class T>
-void accumulate(const Image *src, const Taps &taps, int32_t y, int32_t x0, int32_t x1, T *acc) {
-    const int32_t w = src->width, h = src->height;
+void accumulate(const View &src, const Taps &taps, int32_t y, int32_t x0, int32_t x1, T *acc) {
+    const int32_t w = src.width, h = src.height;
     std::memset(acc, 0, sizeof(T) * S * static_cast<size_t>(x1 - x0));
     const ptrdiff_t first = static_cast<ptrdiff_t>(S) * x0; // acc index of output pixel x: S * x - first
     for (size_t g = 0; g < taps.count;) {
@@ -123,8 +125,7 @@ void accumulate(const Image *src, const Taps &taps, int32_t y, int32_t x0, int32
         while (g + n < taps.count && group[n].dy == group[0].dy)
             ++n;
         g += n;
-        const uint8_t *row =
-            row_ptr(src, static_cast<int32_t>(std::clamp<int64_t>(int64_t{y} + group[0].dy, 0, h - 1)));
+        const uint8_t *row = src.row(static_cast<int32_t>(std::clamp<int64_t>(int64_t{y} + group[0].dy, 0, h - 1)));
         int64_t lo = x0, hi = x1;
         for (size_t t = 0; t < n; ++t) {
             lo = std::max<int64_t>(lo, -int64_t{group[t].dx});
@@ -179,11 +180,19 @@ void accumulate(const Image *src, const Taps &taps, int32_t y, int32_t x0, int32
 // Output pixels per accumulation pass, so that the sums stay in the L1 cache.
 constexpr int32_t kChunk = 1024;
 
+// The bytes of a mask that selects pixels of an 8-bit destination: the block
+// the mask claims, `bytes` bytes (none for no mask, or a mask without pixels:
+// every pixel is then selected) in rows of `pitch` bytes.
+struct MaskBytes {
+    const uint8_t *bits;
+    uint64_t pitch;
+    size_t bytes;
+};
+
 struct Job {
-    const Image *src; // 8-bit for an 8-bit destination, else 24- or 32-bit
-    Image *dst;
-    const Image *mask; // selects pixels of an 8-bit destination; may be null
-    size_t maskBytes;  // bytes of the block the mask claims (0 without pixels)
+    View src; // 8-bit for an 8-bit destination, else 24- or 32-bit
+    View dst;
+    MaskBytes mask;
     int32_t width, height;
     int32_t lastDx, lastDy; // the bottom-right tap, whose alpha a 32-bit result takes
     bool anyTap;
@@ -193,24 +202,24 @@ struct Job {
 
 // Mask byte at (x, y) read from the mask's rows, y * pitch + x bytes into its
 // block (past the end of a row, the next row's bytes); bytes beyond the block
-// it claims, and all bytes of a mask without one, count as set.
-bool selected(const Job &job, int32_t x, int32_t y) {
-    const uint64_t at = static_cast<uint64_t>(y) * job.mask->pitch + static_cast<uint64_t>(x);
-    return at >= job.maskBytes || job.mask->bits[at] != 0;
+// it claims count as set.
+bool selected(const MaskBytes &mask, int32_t x, int32_t y) {
+    const uint64_t at = static_cast<uint64_t>(y) * mask.pitch + static_cast<uint64_t>(x);
+    return at >= mask.bytes || mask.bits[at] != 0;
 }
 
 template <class T> void filter_index(const Job &job, const Taps &taps, T *acc) {
-    const Image *src = job.src;
+    const View &src = job.src;
     const Finish finish = job.finish; // a local copy: result stores cannot alias its table
     for (int32_t y = 0; y < job.height; ++y) {
-        uint8_t *out = row_ptr(job.dst, y);
-        const uint8_t *own = row_ptr(src, std::min(y, src->height - 1));
+        uint8_t *out = job.dst.row(y);
+        const uint8_t *own = src.row(std::min(y, src.height - 1));
         for (int32_t x0 = 0; x0 < job.width; x0 += kChunk) {
             const int32_t x1 = std::min(job.width, x0 + kChunk);
             accumulate<1>(src, taps, y, x0, x1, acc);
             for (int32_t x = x0; x < x1; ++x) {
-                if (job.mask != nullptr && !selected(job, x, y))
-                    out[x] = own[std::min(x, src->width - 1)];
+                if (job.mask.bytes != 0 && !selected(job.mask, x, y))
+                    out[x] = own[std::min(x, src.width - 1)];
                 else
                     out[x] = finish(acc[x - x0]);
             }
@@ -230,7 +239,7 @@ int32_t place_finished(const Job &job, const uint8_t *done, const uint8_t *alpha
         return x1;
     } else if constexpr (S == 4 && D == 4) {
         if (!job.anyTap) return x0;
-        const int32_t hi = static_cast<int32_t>(std::clamp<int64_t>(int64_t{job.src->width} - job.lastDx, x0, x1));
+        const int32_t hi = static_cast<int32_t>(std::clamp<int64_t>(int64_t{job.src.width} - job.lastDx, x0, x1));
         const uint8_t colourBytes[4] = {0xFF, 0xFF, 0xFF, 0};
         uint32_t colour;
         std::memcpy(&colour, colourBytes, 4);
@@ -249,11 +258,11 @@ int32_t place_finished(const Job &job, const uint8_t *done, const uint8_t *alpha
 }
 
 template <int S, int D, class T> void filter_colour(const Job &job, const Taps &taps, T *acc, uint8_t *done) {
-    const Image *src = job.src;
+    const View &src = job.src;
     const Finish finish = job.finish; // a local copy: result stores cannot alias its table
     for (int32_t y = 0; y < job.height; ++y) {
-        uint8_t *out = row_ptr(job.dst, y);
-        const uint8_t *alphaRow = row_ptr(src, std::clamp(y + job.lastDy, 0, src->height - 1));
+        uint8_t *out = job.dst.row(y);
+        const uint8_t *alphaRow = src.row(std::clamp(y + job.lastDy, 0, src.height - 1));
         for (int32_t x0 = 0; x0 < job.width; x0 += kChunk) {
             const int32_t x1 = std::min(job.width, x0 + kChunk);
             accumulate<S>(src, taps, y, x0, x1, acc);
@@ -280,7 +289,7 @@ template <int S, int D, class T> void filter_colour(const Job &job, const Taps &
                 p[2] = r;
                 if constexpr (D == 4) {
                     if (job.anyTap) {
-                        const int32_t ax = std::clamp(x + job.lastDx, 0, src->width - 1);
+                        const int32_t ax = std::clamp(x + job.lastDx, 0, src.width - 1);
                         p[3] = S == 4 ? alphaRow[4 * ax + 3] : 255;
                     }
                 }
@@ -289,67 +298,68 @@ template <int S, int D, class T> void filter_colour(const Job &job, const Taps &
     }
 }
 
-bool overlaps(const Image *a, const Image *b) {
-    const uintptr_t a0 = reinterpret_cast<uintptr_t>(a->bits), b0 = reinterpret_cast<uintptr_t>(b->bits);
-    return a0 < b0 + block_bytes(b) && b0 < a0 + block_bytes(a);
+bool overlaps(const View &a, const View &b) {
+    const uintptr_t a0 = reinterpret_cast<uintptr_t>(a.bits), b0 = reinterpret_cast<uintptr_t>(b.bits);
+    return a0 < b0 + b.block_bytes() && b0 < a0 + a.block_bytes();
 }
 
 // A source readable by the row loops: the picture itself when its format is
 // `want` (or 24/32 for colour), else a copy made through the pixel readers
 // (GetPixelIndex for index work, GetPixelColor as 32 bits for colour work).
-// A picture of an empty size reads as 0 everywhere: one zero pixel, which the
-// clamped reads repeat. A direct source sharing pixels with dst is read from a
-// snapshot.
+// A picture of an empty size (no view) reads as 0 everywhere: one zero pixel,
+// which the clamped reads repeat. A direct source sharing pixels with dst is
+// read from a snapshot.
 struct Source {
-    Image view{};
+    View view{};
     ImagePtr converted;
     Buffer<uint8_t> snapshot;
 
-    bool prepare(const Image *src, bool index, const Image *dst) {
-        if (src->width <= 0 || src->height <= 0) {
+    bool prepare(const std::optional<View> &from, bool index, const View &dst) {
+        if (!from) {
             converted = make_image(1, 1, index ? 8 : 32);
             if (!converted) return false;
-            std::memset(converted->bits, 0, converted->pitch);
-            view = *converted;
+            view = *view_of(converted.get());
+            std::memset(view.bits, 0, view.pitch);
             return true;
         }
-        view = *src;
-        const bool direct = index ? src->bitCount == 8 : (src->bitCount == 24 || src->bitCount == 32);
+        const View &src = *from;
+        view = src;
+        const bool direct = index ? src.bitCount == 8 : (src.bitCount == 24 || src.bitCount == 32);
         if (direct) {
             if (!overlaps(src, dst)) return true;
-            snapshot = alloc_buffer<uint8_t>(block_bytes(src));
+            snapshot = alloc_buffer<uint8_t>(src.block_bytes());
             if (!snapshot) return false;
-            std::memcpy(snapshot.get(), src->bits, block_bytes(src));
+            std::memcpy(snapshot.get(), src.bits, src.block_bytes());
             view.bits = snapshot.get();
             return true;
         }
-        converted = make_image(src->width, src->height, index ? 8 : 32);
+        converted = make_image(src.width, src.height, index ? 8 : 32);
         if (!converted) return false;
-        Image *c = converted.get();
-        for (int32_t y = 0; y < src->height; ++y) {
-            uint8_t *row = row_ptr(c, y);
-            for (int32_t x = 0; x < src->width; ++x) {
+        view = *view_of(converted.get());
+        for (int32_t y = 0; y < src.height; ++y) {
+            uint8_t *row = view.row(y);
+            for (int32_t x = 0; x < src.width; ++x) {
                 if (index)
-                    row[x] = GetPixelIndex(src, x, y);
+                    row[x] = GetPixelIndex(src.record, x, y);
                 else
-                    Bgra32::store(row, x, GetPixelColor(src, x, y));
+                    Bgra32::store(row, x, GetPixelColor(src.record, x, y));
             }
         }
-        view = *c;
         return true;
     }
 };
 
-// Filters src into dst (a record with pixels); src has a pixel block and may
-// be of an empty size. The kernel is checked only where taps are read.
+// Filters src into dst; src has a pixel block and may be of an empty size
+// (the sizes it claims still bound the taps). The kernel is checked only where
+// taps are read.
 int32_t run_filter(const Image *src, const int32_t *kernel, int32_t size, int32_t divisor, int32_t offset,
-                   const Image *mask, Image *dst, int32_t gray) {
-    const uint32_t bits = dst->bitCount;
+                   const Image *mask, const View &dst, int32_t gray) {
+    const uint32_t bits = dst.bitCount;
     if (bits != 8 && bits != 24 && bits != 32) return 1;
     // An 8-bit mask limits the area to its size, with or without pixels; a
     // mask whose rows overrun its block is ignored.
     if (mask != nullptr && !rows_inside(mask)) mask = nullptr;
-    int32_t width = dst->width, height = dst->height;
+    int32_t width = dst.width, height = dst.height;
     if (mask != nullptr && mask->bitCount == 8) {
         width = std::min(width, mask->width);
         height = std::min(height, mask->height);
@@ -358,7 +368,7 @@ int32_t run_filter(const Image *src, const int32_t *kernel, int32_t size, int32_
     if (size > 0 && (kernel == nullptr || checked_size(static_cast<uint64_t>(size), static_cast<uint64_t>(size)) == 0))
         return 0;
     Source source;
-    if (!source.prepare(src, bits == 8, dst)) return 0;
+    if (!source.prepare(view_of(src), bits == 8, dst)) return 0;
     const Taps taps(kernel, size, std::max(width, src->width), std::max(height, src->height));
     if (!taps.ok) return 0;
     Finish finish{divisor == 0 ? 0.0 : static_cast<double>(divisor), offset};
@@ -386,12 +396,12 @@ int32_t run_filter(const Image *src, const int32_t *kernel, int32_t size, int32_
         }
     }
     const Image *selector = bits == 8 ? mask : nullptr;
-    const size_t maskBytes =
+    const MaskBytes selection =
         selector != nullptr && selector->bits != nullptr && selector->height > 0 && block_claim_ok(selector)
-            ? block_bytes(selector)
-            : 0;
+            ? MaskBytes{selector->bits, selector->pitch, block_bytes(selector)}
+            : MaskBytes{nullptr, 0, 0};
     const int32_t last = size - size / 2 - 1; // offset of the bottom-right tap
-    Job job{&source.view, dst, selector, maskBytes, width, height, last, last, size > 0, gray >= 1, finish};
+    Job job{source.view, dst, selection, width, height, last, last, size > 0, gray >= 1, finish};
     // 16-bit sums when the table covers them: twice as many per vector.
     auto run = [&](auto zero) {
         using T = decltype(zero);
@@ -438,12 +448,13 @@ int32_t Filter(Image *src, const int32_t *kernel, int32_t size, int32_t divisor,
         // A destination without pixels, or of an empty size, takes nothing;
         // a source of an empty size reads as 0.
         if (!rows_inside(dst)) return 0;
-        return has_pixels(dst) ? run_filter(src, kernel, size, divisor, offset, mask, dst, gray) : 1;
+        const std::optional<View> to = view_of(dst);
+        return to ? run_filter(src, kernel, size, divisor, offset, mask, *to, gray) : 1;
     }
     // In place: the working image of the source's size cannot be made for an
     // empty size.
     ImagePtr work = make_image(src->width, src->height, static_cast<int32_t>(src->bitCount));
-    if (!work || run_filter(src, kernel, size, divisor, offset, mask, work.get(), gray) == 0) return 0;
+    if (!work || run_filter(src, kernel, size, divisor, offset, mask, *view_of(work.get()), gray) == 0) return 0;
     PX_Img_Copy(src, work.get());
     return 1;
 }

@@ -5,10 +5,13 @@
 // a plane and combining them, without the four planes.
 #include <pxfx/color.h>
 
+#include <optional>
+
 #include "color/colorspace.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/view.hpp"
 
 using namespace pxfx;
 using namespace pxfx::colour;
@@ -38,21 +41,21 @@ void linear_map(int32_t amount, Map &m) {
     }
 }
 
-int32_t map_plane(Image *plane, const Map &m) {
-    for (int32_t y = 0; y < plane->height; ++y) {
-        uint8_t *row = row_ptr(plane, y);
-        for (int32_t x = 0; x < plane->width; ++x)
+int32_t map_plane(const View &plane, const Map &m) {
+    for (int32_t y = 0; y < plane.height; ++y) {
+        uint8_t *row = plane.row(y);
+        for (int32_t x = 0; x < plane.width; ++x)
             row[x] = m[row[x]];
     }
     return 1;
 }
 
 // maps[0] is applied to hue, maps[1] to saturation, maps[2] to lightness.
-template <class F> void transform_rows(const Image *src, Image *dst, const Map *maps) {
-    for (int32_t y = 0; y < src->height; ++y) {
+template <class F> void transform_rows(const View &src, const View &dst, const Map *maps) {
+    for (int32_t y = 0; y < src.height; ++y) {
         const typename F::CRow in = F::crow(src, y);
-        uint8_t *out = row_ptr(dst, y);
-        for (int32_t x = 0; x < src->width; ++x) {
+        uint8_t *out = dst.row(y);
+        for (int32_t x = 0; x < src.width; ++x) {
             const uint32_t hsl = rgb_to_hsl(F::load(in, x));
             const uint32_t moved =
                 pack(maps[2][blue_of(hsl)], maps[1][green_of(hsl)], maps[0][red_of(hsl)], 0) | keep_alpha(hsl);
@@ -72,37 +75,43 @@ extern "C" {
 
 int32_t BaseTran_Hue(Image *plane, int32_t amount) {
     if (!shiftable(plane)) return 0;
-    if (plane->width <= 0 || plane->height <= 0) return 1;
+    // A shiftable plane has pixels unless its size is empty.
+    const std::optional<View> v = view_of(plane);
+    if (!v) return 1;
     Map m;
     hue_map(amount, m);
-    return map_plane(plane, m);
+    return map_plane(*v, m);
 }
 
 int32_t BaseTran_LS(Image *plane, int32_t amount) {
     if (!shiftable(plane)) return 0;
-    if (plane->width <= 0 || plane->height <= 0) return 1;
+    const std::optional<View> v = view_of(plane);
+    if (!v) return 1;
     Map m;
     linear_map(amount, m);
-    return map_plane(plane, m);
+    return map_plane(*v, m);
 }
 
 int32_t PX_IMG_Transform(const Image *src, Image **out, int32_t amount, int32_t component) {
-    if (out == nullptr || !has_pixels(src)) return 0;
+    if (out == nullptr) return 0;
+    const std::optional<View> from = view_of(src);
+    if (!from) return 0;
     Map maps[3];
     for (int i = 0; i < 3; ++i)
         for (int v = 0; v < 256; ++v)
             maps[i][v] = static_cast<uint8_t>(v);
     if (component == 0) hue_map(amount, maps[0]);
     if (component == 1 || component == 2) linear_map(amount, maps[component]);
-    ImagePtr combined = make_image(src->width, src->height, 32);
+    ImagePtr combined = make_image(from->width, from->height, 32);
     if (!combined) return 0;
-    with_format(src->bitCount, [&](auto f) { transform_rows<decltype(f)>(src, combined.get(), maps); });
-    if (*out == nullptr && src->bitCount == 32) {
+    const View to = *view_of(combined.get());
+    with_format(from->bitCount, [&](auto f) { transform_rows<decltype(f)>(*from, to, maps); });
+    if (*out == nullptr && from->bitCount == 32) {
         *out = combined.release();
         return 1;
     }
     if (*out == nullptr) {
-        *out = malloc_Image(src->width, src->height, static_cast<int32_t>(src->bitCount));
+        *out = malloc_Image(from->width, from->height, static_cast<int32_t>(from->bitCount));
         if (*out == nullptr) return 0;
     }
     PX_Img_Copy(*out, combined.get());

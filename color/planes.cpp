@@ -3,25 +3,33 @@
 // walk rows and run the conversion inline, specialised per format and mode.
 #include <pxfx/color.h>
 
+#include <cstring>
 #include <initializer_list>
+#include <optional>
 
 #include "color/colorspace.hpp"
 #include "core/internal/cpu.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/view.hpp"
 
 using namespace pxfx;
 using namespace pxfx::colour;
 
 namespace {
 
-template <class F, Mode M, bool Alpha> void split_rows(const Image *src, Image *p1, Image *p2, Image *p3, Image *pa) {
-    const int32_t w = src->width;
-    for (int32_t y = 0; y < src->height; ++y) {
+// The planes of Split: three components and, with Alpha, the alpha plane.
+struct PlaneViews {
+    View p1, p2, p3, pa;
+};
+
+template <class F, Mode M, bool Alpha> void split_rows(const View &src, const PlaneViews &p) {
+    const int32_t w = src.width;
+    for (int32_t y = 0; y < src.height; ++y) {
         const typename F::CRow in = F::crow(src, y);
-        uint8_t *o1 = row_ptr(p1, y), *o2 = row_ptr(p2, y), *o3 = row_ptr(p3, y);
-        uint8_t *oa = Alpha ? row_ptr(pa, y) : nullptr;
+        uint8_t *o1 = p.p1.row(y), *o2 = p.p2.row(y), *o3 = p.p3.row(y);
+        uint8_t *oa = Alpha ? p.pa.row(y) : nullptr;
         for (int32_t x = 0; x < w; ++x) {
             const uint32_t c = from_rgb<M>(F::load(in, x));
             o1[x] = static_cast<uint8_t>(c >> 16);
@@ -45,29 +53,33 @@ void release_slots(Image **const *slots, int n) {
 }
 
 // Row source of a plane for Combine: the plane's own row when it is an 8-bit
-// record at least `width` wide, else the row read through GetPixelIndex
-// (clamped) into a scratch row.
+// record with pixels at least `width` wide, else the row read through
+// GetPixelIndex (clamped; 0 for a plane without pixels) into a scratch row.
 struct PlaneRows {
-    const Image *im;
+    std::optional<View> view;
     bool direct;
     uint8_t *scratch = nullptr;
     PlaneRows(const Image *plane, int32_t width)
-        : im(plane), direct(plane->bitCount == 8 && plane->width >= width && has_pixels(plane)) {}
+        : view(view_of(plane)), direct(view && view->bitCount == 8 && view->width >= width) {}
     const uint8_t *row(int32_t y, int32_t width) const {
-        if (direct) return row_ptr(im, y < im->height ? y : im->height - 1);
+        if (direct) return view->row(y < view->height ? y : view->height - 1);
+        if (!view) {
+            std::memset(scratch, 0, static_cast<size_t>(width));
+            return scratch;
+        }
         for (int32_t x = 0; x < width; ++x)
-            scratch[x] = GetPixelIndex(im, x, y);
+            scratch[x] = GetPixelIndex(view->record, x, y);
         return scratch;
     }
 };
 
 template <Mode M, int Bpp>
-void combine_rows(Image *out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3, const PlaneRows *ra) {
-    const int32_t w = out->width;
-    for (int32_t y = 0; y < out->height; ++y) {
+void combine_rows(const View &out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3, const PlaneRows *ra) {
+    const int32_t w = out.width;
+    for (int32_t y = 0; y < out.height; ++y) {
         const uint8_t *c1 = r1.row(y, w), *c2 = r2.row(y, w), *c3 = r3.row(y, w);
         const uint8_t *ca = Bpp == 4 ? ra->row(y, w) : nullptr;
-        uint8_t *o = row_ptr(out, y);
+        uint8_t *o = out.row(y);
         for (int32_t x = 0; x < w; ++x) {
             const uint32_t a = Bpp == 4 ? ca[x] : 0;
             const uint32_t c = to_rgb<M>(pack(c3[x], c2[x], c1[x], a));
@@ -81,22 +93,21 @@ void combine_rows(Image *out, const PlaneRows &r1, const PlaneRows &r2, const Pl
 
 // Split and Combine rows through a copy compiled for AVX-512 where the
 // processor has it: more of the conversions then run in vectors.
-template <class F, Mode M, bool Alpha>
-PXFX_WIDE void split_rows_wide(const Image *src, Image *p1, Image *p2, Image *p3, Image *pa) {
-    split_rows<F, M, Alpha>(src, p1, p2, p3, pa);
+template <class F, Mode M, bool Alpha> PXFX_WIDE void split_rows_wide(const View &src, const PlaneViews &p) {
+    split_rows<F, M, Alpha>(src, p);
 }
 template <Mode M, int Bpp>
-PXFX_WIDE void combine_rows_wide(Image *out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3,
+PXFX_WIDE void combine_rows_wide(const View &out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3,
                                  const PlaneRows *ra) {
     combine_rows<M, Bpp>(out, r1, r2, r3, ra);
 }
 
-template <class F, Mode M, bool Alpha> void split_any(const Image *src, Image *p1, Image *p2, Image *p3, Image *pa) {
-    cpu::pick(&split_rows<F, M, Alpha>, &split_rows_wide<F, M, Alpha>)(src, p1, p2, p3, pa);
+template <class F, Mode M, bool Alpha> void split_any(const View &src, const PlaneViews &p) {
+    cpu::pick(&split_rows<F, M, Alpha>, &split_rows_wide<F, M, Alpha>)(src, p);
 }
 
 template <Mode M, int Bpp>
-void combine_any(Image *out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3, const PlaneRows *ra) {
+void combine_any(const View &out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3, const PlaneRows *ra) {
     cpu::pick(&combine_rows<M, Bpp>, &combine_rows_wide<M, Bpp>)(out, r1, r2, r3, ra);
 }
 
@@ -118,12 +129,16 @@ int32_t Split(const Image *src, Image **plane1, Image **plane2, Image **plane3, 
         return 0;
     }
     ImagePtr pa = alphaPlane != nullptr ? make_image(w, h, 8) : ImagePtr();
-    with_format(src->bitCount, [&](auto f) {
+    // Planes of the source's size exist only for a source with pixels. Without
+    // an alpha plane (or when it cannot be made) no alpha is written.
+    const View from = *view_of(src);
+    const PlaneViews p{*view_of(p1.get()), *view_of(p2.get()), *view_of(p3.get()), pa ? *view_of(pa.get()) : View{}};
+    with_format(from.bitCount, [&](auto f) {
         with_mode(mode, [&](auto m) {
             if (pa)
-                split_any<decltype(f), decltype(m)::value, true>(src, p1.get(), p2.get(), p3.get(), pa.get());
+                split_any<decltype(f), decltype(m)::value, true>(from, p);
             else
-                split_any<decltype(f), decltype(m)::value, false>(src, p1.get(), p2.get(), p3.get(), nullptr);
+                split_any<decltype(f), decltype(m)::value, false>(from, p);
         });
     });
     // The old images go only now: a slot may hold the source itself.
@@ -154,11 +169,12 @@ Image *Combine(const Image *plane1, const Image *plane2, const Image *plane3, co
         }
     Image *out = malloc_Image(w, h, alphaPlane != nullptr ? 32 : 24);
     if (out == nullptr) return nullptr;
+    const View to = *view_of(out);
     with_mode(mode, [&](auto m) {
         if (alphaPlane != nullptr)
-            combine_any<decltype(m)::value, 4>(out, r1, r2, r3, &ra);
+            combine_any<decltype(m)::value, 4>(to, r1, r2, r3, &ra);
         else
-            combine_any<decltype(m)::value, 3>(out, r1, r2, r3, nullptr);
+            combine_any<decltype(m)::value, 3>(to, r1, r2, r3, nullptr);
     });
     return out;
 }

@@ -10,13 +10,13 @@ using namespace pxfx;
 
 namespace {
 
-bool inside(const Image *im, int32_t x, int32_t y) { return x >= 0 && y >= 0 && x < im->width && y < im->height; }
+bool inside(const View &v, int32_t x, int32_t y) { return x >= 0 && y >= 0 && x < v.width && y < v.height; }
 
 // Converting copy: walks dst, reading src with clamping. A 32-bit destination
 // keeps its own alpha bytes.
-template <class S, class D> void copy_convert(Image *dst, const Image *src) {
-    const int32_t sw = src->width, sh = src->height;
-    const int32_t dw = dst->width, dh = dst->height;
+template <class S, class D> void copy_convert(const View &dst, const View &src) {
+    const int32_t sw = src.width, sh = src.height;
+    const int32_t dw = dst.width, dh = dst.height;
     const int32_t direct = dw < sw ? dw : sw;
     for (int32_t y = 0; y < dh; ++y) {
         const typename S::CRow s = S::crow(src, y < sh ? y : sh - 1);
@@ -76,11 +76,11 @@ void free_Image(Image **image, int32_t keepRecord) {
 }
 
 uint8_t GetPixelIndex(const Image *image, int32_t x, int32_t y) {
-    if (!has_pixels(image) || static_cast<int32_t>(image->bitCount) > 8) return 0;
-    x = clamp_coord(x, image->width);
-    y = clamp_coord(y, image->height);
-    const uint8_t *row = row_ptr(image, y);
-    switch (image->bitCount) {
+    const std::optional<View> v = view_of(image);
+    if (!v || static_cast<int32_t>(v->bitCount) > 8) return 0;
+    x = clamp_coord(x, v->width);
+    const uint8_t *row = v->row(clamp_coord(y, v->height));
+    switch (v->bitCount) {
     case 8: return row[x];
     case 4: return (row[x / 2] >> ((1 - x % 2) * 4)) & 15;
     case 1: return (row[x / 8] >> (7 - x % 8)) & 1;
@@ -89,13 +89,14 @@ uint8_t GetPixelIndex(const Image *image, int32_t x, int32_t y) {
 }
 
 uint32_t GetPixelColor(const Image *image, int32_t x, int32_t y) {
-    if (!has_pixels(image)) return 0;
-    const int32_t cx = clamp_coord(x, image->width);
-    const int32_t cy = clamp_coord(y, image->height);
-    switch (image->bitCount) {
-    case 24: return Bgr24::load(row_ptr(image, cy), cx);
-    case 32: return Bgra32::load(row_ptr(image, cy), cx);
-    case 16: return Word16::load(row_ptr(image, cy), cx);
+    const std::optional<View> v = view_of(image);
+    if (!v) return 0;
+    const int32_t cx = clamp_coord(x, v->width);
+    const int32_t cy = clamp_coord(y, v->height);
+    switch (v->bitCount) {
+    case 24: return Bgr24::load(v->row(cy), cx);
+    case 32: return Bgra32::load(v->row(cy), cx);
+    case 16: return Word16::load(v->row(cy), cx);
     default: {
         const uint32_t i = GetPixelIndex(image, cx, cy);
         return pack(i, i, i, 255);
@@ -109,9 +110,10 @@ uint8_t GetPixelGray(const Image *image, int32_t x, int32_t y) {
 }
 
 void SetPixelIndex(Image *image, int32_t x, int32_t y, int32_t index) {
-    if (!has_pixels(image) || !inside(image, x, y)) return;
-    uint8_t *row = row_ptr(image, y);
-    switch (image->bitCount) {
+    const std::optional<View> v = view_of(image);
+    if (!v || !inside(*v, x, y)) return;
+    uint8_t *row = v->row(y);
+    switch (v->bitCount) {
     case 8: row[x] = static_cast<uint8_t>(index); break;
     case 4: {
         const int shift = (1 - x % 2) * 4;
@@ -128,15 +130,16 @@ void SetPixelIndex(Image *image, int32_t x, int32_t y, int32_t index) {
 }
 
 void SetPixelColor(Image *image, int32_t x, int32_t y, uint32_t colour) {
-    if (!has_pixels(image) || !inside(image, x, y)) return;
-    if (static_cast<int32_t>(image->bitCount) <= 8) {
+    const std::optional<View> v = view_of(image);
+    if (!v || !inside(*v, x, y)) return;
+    if (static_cast<int32_t>(v->bitCount) <= 8) {
         SetPixelIndex(image, x, y, static_cast<int32_t>(green_of(colour)));
         return;
     }
-    switch (image->bitCount) {
-    case 16: Word16::store(row_ptr(image, y), x, colour); break;
-    case 24: Bgr24::store(row_ptr(image, y), x, colour); break;
-    case 32: Bgra32::store(row_ptr(image, y), x, colour); break;
+    switch (v->bitCount) {
+    case 16: Word16::store(v->row(y), x, colour); break;
+    case 24: Bgr24::store(v->row(y), x, colour); break;
+    case 32: Bgra32::store(v->row(y), x, colour); break;
     default: break;
     }
 }
@@ -156,12 +159,14 @@ int32_t PX_Img_Copy(Image *dst, const Image *src) {
     }
     // The converting walk writes only where the destination has pixels; a
     // source without them reads as 0 everywhere.
-    if (!has_pixels(dst)) return 1;
-    with_format(dst->bitCount, [&](auto d) {
-        if (has_pixels(src))
-            with_format(src->bitCount, [&](auto s) { copy_convert<decltype(s), decltype(d)>(dst, src); });
+    const std::optional<View> to = view_of(dst);
+    if (!to) return 1;
+    with_format(to->bitCount, [&](auto d) {
+        if (const std::optional<View> from = view_of(src))
+            with_format(from->bitCount, [&](auto s) { copy_convert<decltype(s), decltype(d)>(*to, *from); });
         else
-            copy_convert<AnyFormat, decltype(d)>(dst, src);
+            copy_convert<AnyFormat, decltype(d)>(
+                *to, View{nullptr, 0, src->width, src->height, src->bitCount, const_cast<Image *>(src)});
     });
     return 1;
 }
@@ -171,11 +176,13 @@ int32_t PX_Img_CopyAlpha(Image *dst, const Image *src) {
     if (dst->bitCount != 32 || src->bitCount != 32 || dst->height != src->height || dst->width != src->width) return 0;
     if (dst->width <= 0 || dst->height <= 0) return 1;
     if (!rows_inside(dst) || !rows_inside(src)) return 0;
-    if (dst->bits == nullptr) return 1;
-    for (int32_t y = 0; y < dst->height; ++y) {
-        const uint8_t *s = src->bits != nullptr ? row_ptr(src, y) : nullptr;
-        uint8_t *d = row_ptr(dst, y);
-        for (int32_t x = 0; x < dst->width; ++x)
+    const std::optional<View> to = view_of(dst);
+    if (!to) return 1;
+    const std::optional<View> from = view_of(src);
+    for (int32_t y = 0; y < to->height; ++y) {
+        const uint8_t *s = from ? from->row(y) : nullptr;
+        uint8_t *d = to->row(y);
+        for (int32_t x = 0; x < to->width; ++x)
             d[4 * x + 3] = s != nullptr ? s[4 * x + 3] : 0;
     }
     return 1;

@@ -6,11 +6,13 @@
 #include <algorithm>
 #include <cmath>
 #include <cstring>
+#include <optional>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/view.hpp"
 #include "deform/free_form.hpp"
 
 using namespace pxfx;
@@ -41,8 +43,7 @@ PXPoint centroid(double s, double sx, double sy) {
 }
 
 struct Warp {
-    const Image *src;
-    Image *dst;
+    View src, dst;
     int32_t w, h;
     const ControlPoint *pts;
     int32_t n;
@@ -133,7 +134,7 @@ uint32_t mix4(uint32_t c00, uint32_t c10, uint32_t c01, uint32_t c11, double a, 
 // at once, so later holes of the same pass may use them. A filled pixel takes
 // the alpha of its nearest source pixel (the left or upper one on a tie).
 template <class D> struct Holes {
-    Image *dst;
+    View dst;
     uint8_t *mask;
     int32_t w, h;
 
@@ -210,7 +211,7 @@ template <class D> struct Holes {
 template <class S, class D> void warp(const Warp &k) {
     // Background by the green byte of the source's top-left pixel.
     const int bg = green_of(S::load(S::crow(k.src, 0), 0)) != 0 ? 255 : 0;
-    std::memset(k.dst->bits, bg, block_bytes(k.dst));
+    std::memset(k.dst.bits, bg, k.dst.block_bytes());
     for (int32_t i = 0; i < k.n; ++i) {
         const ControlPoint &c = k.pts[i];
         k.mask[static_cast<size_t>(c.py) * k.w + c.px] |= kSourcePoint;
@@ -242,8 +243,8 @@ void warp_row_weights(double *wr, int32_t w, int32_t y, int32_t px, int32_t py) 
         wr[x] = weight(x);
 }
 
-void fill_warp_holes(Image *dst, uint8_t *mask) {
-    with_format(dst->bitCount, [&](auto f) { Holes<decltype(f)>{dst, mask, dst->width, dst->height}.run(); });
+void fill_warp_holes(const View &dst, uint8_t *mask) {
+    with_format(dst.bitCount, [&](auto f) { Holes<decltype(f)>{dst, mask, dst.width, dst.height}.run(); });
 }
 
 } // namespace pxfx
@@ -275,8 +276,10 @@ int32_t DeformationFunc(Image *src, Image *dst, const DeformationPair *pairs, in
         if (h > 0 && block_claim_ok(dst)) std::memset(dst->bits, 0, block_bytes(dst));
         return 1;
     }
-    // A source without pixels reads as 0 everywhere.
+    // A source without pixels reads as 0 everywhere. The result has pixels:
+    // it has the source's size, and its rows lie inside its block.
     const ReadView view(src);
+    const View to = *view_of(dst);
     int32_t n = 0;
     for (int32_t i = 0; i < count; ++i)
         n += inside(pairs[i], w, h);
@@ -290,9 +293,9 @@ int32_t DeformationFunc(Image *src, Image *dst, const DeformationPair *pairs, in
         pts[j++] = {static_cast<int32_t>(p.srcX), static_cast<int32_t>(p.srcY), static_cast<int32_t>(p.dstX),
                     static_cast<int32_t>(p.dstY)};
     }
-    const Warp k{view.get(), dst, w, h, pts.get(), n, weights.get(), mask.get()};
-    with_formats(view.get(), dst, [&](auto s, auto d) { warp<decltype(s), decltype(d)>(k); });
-    fill_warp_holes(dst, mask.get());
+    const Warp k{view.view(), to, w, h, pts.get(), n, weights.get(), mask.get()};
+    with_formats(k.src, k.dst, [&](auto s, auto d) { warp<decltype(s), decltype(d)>(k); });
+    fill_warp_holes(to, mask.get());
     return 1;
 }
 

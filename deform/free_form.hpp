@@ -2,9 +2,9 @@
 // on their own: the per-row weights and the hole filling.
 #pragma once
 
-#include <pxfx/core.h>
-
 #include <cstdint>
+
+#include "core/internal/view.hpp"
 
 namespace pxfx {
 
@@ -21,7 +21,7 @@ void warp_row_weights(double *wr, int32_t w, int32_t y, int32_t px, int32_t py);
 // from known pixels at most 5 away: by four surrounding pixels, else by the
 // nearest pair left and right, else by the nearest pair above and below.
 // Filled pixels are flagged at once; pixels without such neighbours keep
-// their value. dst must be a record with pixels.
-void fill_warp_holes(Image *dst, uint8_t *mask);
+// their value.
+void fill_warp_holes(const View &dst, uint8_t *mask);
 
 } // namespace pxfx

@@ -4,10 +4,12 @@
 
 #include <cmath>
 #include <cstdlib>
+#include <optional>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/view.hpp"
 
 using namespace pxfx;
 
@@ -51,7 +53,7 @@ Coord inside_source(const Circle &c, int32_t x, int32_t y, int64_t dx, int64_t d
             c.cy - static_cast<int64_t>(trunc_sat<int32_t>(rr * std::sin(th)))};
 }
 
-template <class S, class D> void circle_transform(const Image *src, Image *dst, const Circle &c) {
+template <class S, class D> void circle_transform(const View &src, const View &dst, const Circle &c) {
     // Every pixel outside the circle takes the source's pixel (0, 0).
     const uint32_t outside = S::load(S::crow(src, 0), 0);
     for (int32_t y = 0; y < c.height; ++y) {
@@ -78,23 +80,21 @@ extern "C" {
 
 uint32_t CircleTransform(Image *src, Image **dst, int32_t mode, int32_t radius, float factor) {
     if (src == nullptr) return 0;
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
-    Circle c;
-    c.mode = mode;
-    c.width = src->width;
-    c.height = src->height;
-    c.cx = c.width / 2;
-    c.cy = c.height / 2;
-    if (radius == 0) {
-        const int64_t half2 = static_cast<int64_t>(c.cx) * c.cx + static_cast<int64_t>(c.cy) * c.cy;
-        radius = static_cast<int32_t>(std::sqrt(static_cast<double>(static_cast<float>(half2))));
-    }
-    c.radius = radius;
-    c.factor = factor == 0.0f ? 1.0 : static_cast<double>(factor);
-    with_formats(src, out, [&](auto s, auto d) { circle_transform<decltype(s), decltype(d)>(src, out, c); });
-    return 1;
+    return draw_result(src, dst, [&](const View &from, const View &to) {
+        Circle c;
+        c.mode = mode;
+        c.width = from.width;
+        c.height = from.height;
+        c.cx = c.width / 2;
+        c.cy = c.height / 2;
+        if (radius == 0) {
+            const int64_t half2 = static_cast<int64_t>(c.cx) * c.cx + static_cast<int64_t>(c.cy) * c.cy;
+            radius = static_cast<int32_t>(std::sqrt(static_cast<double>(static_cast<float>(half2))));
+        }
+        c.radius = radius;
+        c.factor = factor == 0.0f ? 1.0 : static_cast<double>(factor);
+        with_formats(from, to, [&](auto s, auto d) { circle_transform<decltype(s), decltype(d)>(from, to, c); });
+    });
 }
 
 uint32_t Punch_Transform(Image *src, Image **dst) { return CircleTransform(src, dst, kPunch, 0, 100.0f); }

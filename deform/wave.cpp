@@ -7,12 +7,14 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstdlib>
+#include <optional>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/view.hpp"
 
 using namespace pxfx;
 
@@ -93,8 +95,8 @@ bool fill_tabulated(int16_t *map, size_t stride, int32_t width, int32_t height, 
     return true;
 }
 
-template <class S, class D> void render(const Image *src, Image *dst, const int16_t *map) {
-    const int32_t w = src->width, h = src->height;
+template <class S, class D> void render(const View &src, const View &dst, const int16_t *map) {
+    const int32_t w = src.width, h = src.height;
     const size_t stride = map_stride(w);
     for (int32_t y = 1; y + 1 < h; ++y) {
         const int16_t *up = map + static_cast<size_t>(y - 1) * stride;
@@ -129,6 +131,11 @@ template <class S, class D> void render(const Image *src, Image *dst, const int1
     }
 }
 
+// Renders src, moved by the map, into dst of the same size.
+void render_views(const View &src, const View &dst, const int16_t *map) {
+    with_formats(src, dst, [&](auto s, auto d) { render<decltype(s), decltype(d)>(src, dst, map); });
+}
+
 } // namespace
 
 extern "C" {
@@ -144,13 +151,13 @@ int32_t create_wave(int16_t *map, int32_t width, int32_t height, int32_t cx, int
 }
 
 int32_t render_wave(Image *src, Image *dst, const int16_t *map, int32_t, int32_t) {
-    if (map == nullptr || src == nullptr || !rows_inside(src) || !has_pixels(dst) || src->width != dst->width ||
-        src->height != dst->height)
-        return 1;
+    if (map == nullptr || src == nullptr || !rows_inside(src)) return 1;
+    const std::optional<View> to = view_of(dst);
+    if (!to || src->width != to->width || src->height != to->height) return 1;
     // A source without pixels reads as 0 everywhere.
     const ReadView view(src);
     if (!view.ok()) return 1;
-    with_formats(view.get(), dst, [&](auto s, auto d) { render<decltype(s), decltype(d)>(view.get(), dst, map); });
+    render_views(view.view(), *to, map);
     return 1;
 }
 
@@ -167,13 +174,11 @@ uint32_t Wave_Transform(Image *src, Image **dst, int32_t amplitude) {
     }
     Buffer<int16_t> map = alloc_zeroed<int16_t>(checked_size(static_cast<uint64_t>(h), map_stride(w)));
     if (!map) return 0;
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
-    const int32_t cx = w >> 1, cy = h >> 1;
-    create_wave(map.get(), w, h, cx, cy, amplitude);
-    render_wave(src, out, map.get(), cx, cy);
-    return 1;
+    return draw_result(src, dst, [&](const View &from, const View &to) {
+        const int32_t cx = w >> 1, cy = h >> 1;
+        create_wave(map.get(), w, h, cx, cy, amplitude);
+        render_views(from, to, map.get());
+    });
 }
 
 } // extern "C"

@@ -3,11 +3,14 @@
 #include <pxfx/effects.h>
 #include <pxfx/toolkit.h>
 
+#include <optional>
+
 #include "core/internal/channel_map.hpp"
 #include "core/internal/curve_blend.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/view.hpp"
 
 using namespace pxfx;
 
@@ -52,13 +55,11 @@ void channel_table(uint32_t mode, int32_t d, uint8_t *out) {
 } // namespace
 
 extern "C" uint32_t PX_IMG_Alter(Image *src, Image **dst, int32_t dR, int32_t dG, int32_t dB, uint32_t mode) {
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
-    ChannelTables t;
-    channel_table(mode, dR, t.r);
-    channel_table(mode, dG, t.g);
-    channel_table(mode, dB, t.b);
-    map_channels(src, out, t.map());
-    return 1;
+    return draw_result(src, dst, [&](const View &from, const View &to) {
+        ChannelTables t;
+        channel_table(mode, dR, t.r);
+        channel_table(mode, dG, t.g);
+        channel_table(mode, dB, t.b);
+        map_channels(from, to, t.map());
+    });
 }

@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <optional>
 
 #include "core/internal/channel_map.hpp"
 #include "core/internal/image_check.hpp"
@@ -12,6 +13,7 @@
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/view.hpp"
 
 using namespace pxfx;
 
@@ -76,10 +78,10 @@ inline uint32_t screen(uint32_t a, uint32_t b) {
 
 // Screen-blends the glow of the blurred picture `blur` (format TF) over the
 // source (format F) into dst; alpha is the source's.
-template <class F, class TF> void glow(const Image *src, const Image *blur, Image *dst) {
+template <class F, class TF> void glow(const View &src, const View &blur, const View &dst) {
     const ChannelTables t = glow_tables<TF>();
-    const int32_t w = src->width;
-    for (int32_t y = 0; y < src->height; ++y) {
+    const int32_t w = src.width;
+    for (int32_t y = 0; y < src.height; ++y) {
         const typename F::CRow in = F::crow(src, y);
         const typename TF::CRow soft = TF::crow(blur, y);
         const typename F::Row out = F::row(dst, y);
@@ -126,9 +128,9 @@ uint32_t PX_IMG_Light_Alter(Image *src, Image **dst, uint32_t percent, uint32_t 
         PX_Img_Copy(out, src);
     } else if (percent == 0) {
         if (const size_t n = claimed_bytes(out); n > 0) std::memset(out->bits, 0, n);
-    } else if (has_pixels(out)) {
+    } else if (const std::optional<View> to = view_of(out)) {
         const ChannelTables t = light_tables(percent, channel);
-        map_channels(src, out, t.map());
+        map_channels(*view_of(src), *to, t.map()); // the result's size: the source has pixels too
     }
     return 1;
 }
@@ -146,27 +148,33 @@ uint32_t PX_IMG_Ballance(Image *src, Image **dst, int32_t contrast) {
         if (n > 0) std::memmove(out->bits, src->bits, n);
         return 1;
     }
-    if (!has_pixels(out)) return 1;
-    map_channels(src, out, {table, table, table});
+    const std::optional<View> to = view_of(out);
+    if (!to) return 1;
+    const View from = *view_of(src); // the result's size: the source has pixels too
+    map_channels(from, *to, {table, table, table});
     return 1;
 }
 
 uint32_t PX_IMG_Lambency(Image *src, Image **dst) {
-    if (dst == nullptr || !has_pixels(src)) return 0;
-    ImagePtr blur = make_image(src->width, src->height, static_cast<int32_t>(src->bitCount));
+    if (dst == nullptr) return 0;
+    const std::optional<View> from = view_of(src);
+    if (!from) return 0;
+    ImagePtr blur = make_image(from->width, from->height, static_cast<int32_t>(from->bitCount));
     // Blurred first: when its working memory cannot be had, nothing is touched.
     if (!blur || Filter(src, kGlowKernel, 3, 16, 0, nullptr, blur.get(), 0) == 0) return 0;
+    const View soft = *view_of(blur.get());
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
+    const std::optional<View> to = view_of(out);
+    if (!to) return 1;
     // The blurred image has the source's format, or 8 bits for a source of
     // any other bit count (as malloc_Image makes it).
-    with_format(src->bitCount, [&](auto f) {
+    with_format(from->bitCount, [&](auto f) {
         using F = decltype(f);
         if constexpr (F::kDirect) {
-            glow<F, F>(src, blur.get(), out);
+            glow<F, F>(*from, soft, *to);
         } else {
-            glow<AnyFormat, Gray8>(src, blur.get(), out);
+            glow<AnyFormat, Gray8>(*from, soft, *to);
         }
     });
     return 1;

@@ -2,11 +2,13 @@
 #include <pxfx/effects.h>
 
 #include <cstdlib>
+#include <optional>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/view.hpp"
 
 using namespace pxfx;
 
@@ -17,8 +19,8 @@ uint32_t neon_channel(int32_t c, int32_t r, int32_t d) {
     return clamp_u8(static_cast<int32_t>(2 * isqrt_round(static_cast<uint32_t>(dx * dx + dy * dy))));
 }
 
-template <class F> void neon(const Image *src, Image *dst) {
-    const int32_t w = src->width, h = src->height;
+template <class F> void neon(const View &src, const View &dst) {
+    const int32_t w = src.width, h = src.height;
     for (int32_t y = 0; y + 1 < h; ++y) {
         const typename F::CRow row = F::crow(src, y);
         const typename F::CRow below = F::crow(src, y + 1);
@@ -56,8 +58,8 @@ uint32_t green_gray(uint32_t c) {
     return pack(g, g, g, 255);
 }
 
-template <class F> void emboss(const Image *src, Image *dst) {
-    const int32_t w = src->width, h = src->height;
+template <class F> void emboss(const View &src, const View &dst) {
+    const int32_t w = src.width, h = src.height;
     for (int32_t y = 0; y < h; ++y) {
         const typename F::CRow row = F::crow(src, y);
         const typename F::Row out = F::row(dst, y);
@@ -85,18 +87,14 @@ template <class F> void emboss(const Image *src, Image *dst) {
 extern "C" {
 
 uint32_t PX_IMG_Neon(Image *src, Image **dst) {
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
-    with_format(src->bitCount, [&](auto f) { neon<decltype(f)>(src, out); });
-    return 1;
+    return draw_result(src, dst, [&](const View &from, const View &to) {
+        with_format(from.bitCount, [&](auto f) { neon<decltype(f)>(from, to); });
+    });
 }
 
 uint32_t PX_IMG_Emboss(Image *src, Image **dst) {
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
-    with_format(src->bitCount, [&](auto f) { emboss<decltype(f)>(src, out); });
-    return 1;
+    return draw_result(src, dst, [&](const View &from, const View &to) {
+        with_format(from.bitCount, [&](auto f) { emboss<decltype(f)>(from, to); });
+    });
 }
 } // extern "C"

@@ -4,11 +4,14 @@
 #include <pxfx/color.h>
 #include <pxfx/effects.h>
 
+#include <optional>
+
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/rank.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/view.hpp"
 
 using namespace pxfx;
 
@@ -58,8 +61,8 @@ template <class S> uint32_t dominant(const Hist<S> &h, uint32_t alpha) {
 // per-column histograms over rows y - r .. y + r; moving down a row updates
 // each column by one pixel out and one in, moving right adds one column and
 // subtracts another, so the cost per pixel does not depend on r.
-template <class F, class S> void oil(const Image *src, Image *dst, int32_t r, Hist<S> *cols) {
-    const int32_t w = src->width, h = src->height;
+template <class F, class S> void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols) {
+    const int32_t w = src.width, h = src.height;
     for (int32_t x = 0; x < w; ++x)
         cols[x] = Hist<S>{};
     for (int32_t y = 0; y < 2 * r; ++y) {
@@ -97,14 +100,14 @@ template <class F, class S> void oil(const Image *src, Image *dst, int32_t r, Hi
     }
 }
 
-template <class F> bool oil_with_sums(const Image *src, Image *dst, int32_t r) {
+template <class F> bool oil_with_sums(const View &src, const View &dst, int32_t r) {
     const uint64_t side = 2 * static_cast<uint64_t>(r) + 1;
     if (side < 0x10000 && side * side * 255 <= 0xFFFFFFFFu) {
-        Buffer<Hist<uint32_t>> cols = alloc_buffer<Hist<uint32_t>>(static_cast<size_t>(src->width));
+        Buffer<Hist<uint32_t>> cols = alloc_buffer<Hist<uint32_t>>(static_cast<size_t>(src.width));
         if (!cols) return false;
         oil<F>(src, dst, r, cols.get());
     } else {
-        Buffer<Hist<uint64_t>> cols = alloc_buffer<Hist<uint64_t>>(static_cast<size_t>(src->width));
+        Buffer<Hist<uint64_t>> cols = alloc_buffer<Hist<uint64_t>>(static_cast<size_t>(src.width));
         if (!cols) return false;
         oil<F>(src, dst, r, cols.get());
     }
@@ -137,14 +140,17 @@ uint32_t imOil(Image *src, Image **dst, int32_t r) {
     // A negative radius leaves no first interior pixel at which the window
     // would be set up: refused like a window larger than the picture.
     if (r < 0 || 2 * static_cast<int64_t>(r) >= src->width || 2 * static_cast<int64_t>(r) >= src->height) return 0;
-    if (!has_pixels(out)) return 1;
-    return with_format(src->bitCount, [&](auto f) { return oil_with_sums<decltype(f)>(src, out, r); }) ? 1 : 0;
+    const std::optional<View> to = view_of(out);
+    if (!to) return 1;
+    const View from = *view_of(src); // the result's size: the source has pixels too
+    return with_format(from.bitCount, [&](auto f) { return oil_with_sums<decltype(f)>(from, *to, r); }) ? 1 : 0;
 }
 
 uint32_t imOil_1(Image *src, Image **dst) {
-    if (!has_pixels(src) || (src->bitCount != 24 && src->bitCount != 32) || dst == nullptr) return 0;
+    const std::optional<View> from = view_of(src);
+    if (!from || (from->bitCount != 24 && from->bitCount != 32) || dst == nullptr) return 0;
     Planes p;
-    const bool alpha = src->bitCount == 32;
+    const bool alpha = from->bitCount == 32;
     if (!Split(src, &p.hue, &p.saturation, &p.lightness, alpha ? &p.alpha : nullptr, kHslMode)) return 0;
     ColorCompress(p.hue, 3);
     ColorCompress(p.lightness, 12);
@@ -155,12 +161,15 @@ uint32_t imOil_1(Image *src, Image **dst) {
 int32_t ColorCompress(Image *plane, int32_t levels) {
     if (plane == nullptr || plane->bits == nullptr || plane->bitCount != 8 || !rows_inside(plane) || levels < 1)
         return 0;
+    // A plane of an empty size has nothing to compress.
+    const std::optional<View> v = view_of(plane);
+    if (!v) return 1;
     const int32_t group = 256 / levels + (256 % levels != 0 ? 1 : 0);
     rank::Histogram<256, uint32_t> count;
     count.reset();
-    for (int32_t y = 0; y < plane->height; ++y) {
-        const uint8_t *row = row_ptr(plane, y);
-        for (int32_t x = 0; x < plane->width; ++x)
+    for (int32_t y = 0; y < v->height; ++y) {
+        const uint8_t *row = v->row(y);
+        for (int32_t x = 0; x < v->width; ++x)
             count.add(row[x]);
     }
     // Each group of `group` consecutive values maps to its most frequent
@@ -172,9 +181,9 @@ int32_t ColorCompress(Image *plane, int32_t levels) {
         for (int32_t v = first; v < end; ++v)
             map[v] = static_cast<uint8_t>(rep);
     }
-    for (int32_t y = 0; y < plane->height; ++y) {
-        uint8_t *row = row_ptr(plane, y);
-        for (int32_t x = 0; x < plane->width; ++x)
+    for (int32_t y = 0; y < v->height; ++y) {
+        uint8_t *row = v->row(y);
+        for (int32_t x = 0; x < v->width; ++x)
             row[x] = map[row[x]];
     }
     return 1;

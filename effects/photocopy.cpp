@@ -3,10 +3,13 @@
 // dark or bright; percentiles of the ratio histogram set the tone mapping.
 #include <pxfx/effects.h>
 
+#include <optional>
+
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/view.hpp"
 
 using namespace pxfx;
 
@@ -16,11 +19,11 @@ constexpr int32_t kWeights[5] = {1, 2, 4, 2, 1};
 constexpr int32_t kBins = 2000;
 constexpr int32_t kBrightFrom = 990;
 
-template <class F> void gray_plane(const Image *src, uint8_t *g, int32_t stride) {
-    for (int32_t y = 0; y < src->height; ++y) {
+template <class F> void gray_plane(const View &src, uint8_t *g, int32_t stride) {
+    for (int32_t y = 0; y < src.height; ++y) {
         const typename F::CRow row = F::crow(src, y);
         uint8_t *out = g + static_cast<size_t>(y) * stride;
-        for (int32_t x = 0; x < src->width; ++x)
+        for (int32_t x = 0; x < src.width; ++x)
             out[x] = static_cast<uint8_t>(drawing_gray(F::load(row, x)));
     }
 }
@@ -121,14 +124,13 @@ void tone_map(uint8_t *g, const uint8_t *u, const uint16_t *q, int32_t w, int32_
     }
 }
 
-template <class F> void write_gray(const Image *src, Image *dst, const uint8_t *g, int32_t s) {
-    for (int32_t y = 0; y < dst->height; ++y) {
+template <class F> void write_gray(const View &dst, const uint8_t *g, int32_t s) {
+    for (int32_t y = 0; y < dst.height; ++y) {
         const uint8_t *in = g + static_cast<size_t>(y) * s;
         const typename F::Row out = F::row(dst, y);
-        for (int32_t x = 0; x < dst->width; ++x)
+        for (int32_t x = 0; x < dst.width; ++x)
             F::store(out, x, pack(in[x], in[x], in[x], 255));
     }
-    PX_Img_CopyAlpha(dst, src);
 }
 
 } // namespace
@@ -148,7 +150,9 @@ extern "C" uint32_t PX_IMG_Photocopy(Image *src, Image **dst) {
         free_Image(dst, 0);
         return 0;
     }
-    if (!has_pixels(out)) return 1;
+    const std::optional<View> to = view_of(out);
+    if (!to) return 1;
+    const View from = *view_of(src); // the result's size: the source has pixels too
     const int32_t s = static_cast<int32_t>((static_cast<int64_t>(w) + 3) & ~int64_t{3});
     const size_t plane = checked_size(static_cast<uint64_t>(s), static_cast<uint64_t>(h));
     Buffer<uint8_t> g = alloc_zeroed<uint8_t>(plane);
@@ -159,10 +163,11 @@ extern "C" uint32_t PX_IMG_Photocopy(Image *src, Image **dst) {
         free_Image(dst, 0);
         return 0;
     }
-    with_format(src->bitCount, [&](auto f) { gray_plane<decltype(f)>(src, g.get(), s); });
+    with_format(from.bitCount, [&](auto f) { gray_plane<decltype(f)>(from, g.get(), s); });
     Stats st;
     local_stats(g.get(), u.get(), q.get(), w, h, s, cols.get(), cols.get() + w, st);
     tone_map(g.get(), u.get(), q.get(), w, h, s, dark_threshold(st), bright_threshold(st));
-    with_format(out->bitCount, [&](auto f) { write_gray<decltype(f)>(src, out, g.get(), s); });
+    with_format(to->bitCount, [&](auto f) { write_gray<decltype(f)>(*to, g.get(), s); });
+    PX_Img_CopyAlpha(out, src);
     return 1;
 }

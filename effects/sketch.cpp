@@ -4,11 +4,13 @@
 
 #include <algorithm>
 #include <cstring>
+#include <optional>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/view.hpp"
 
 using namespace pxfx;
 
@@ -41,9 +43,9 @@ const SketchTables &tables() {
     return t;
 }
 
-template <class F> void gray_plane(const Image *src, uint8_t *g) {
-    const int32_t w = src->width;
-    for (int32_t y = 0; y < src->height; ++y) {
+template <class F> void gray_plane(const View &src, uint8_t *g) {
+    const int32_t w = src.width;
+    for (int32_t y = 0; y < src.height; ++y) {
         const typename F::CRow row = F::crow(src, y);
         uint8_t *out = g + static_cast<size_t>(y) * w;
         for (int32_t x = 0; x < w; ++x)
@@ -99,7 +101,7 @@ void edges_and_negative(const uint8_t *g, uint8_t *e, uint8_t *n, int32_t w, int
 // Colour dodge of gray a with blurred negative b, then the cube law; with an
 // edge plane, the edge value wins where it is darker and the gray is below 170.
 template <class F>
-void compose(Image *dst, const uint8_t *g, const uint8_t *b, const uint8_t *e, int32_t w, int32_t h) {
+void compose(const View &dst, const uint8_t *g, const uint8_t *b, const uint8_t *e, int32_t w, int32_t h) {
     const SketchTables &t = tables();
     for (int32_t y = 0; y < h; ++y) {
         const size_t o = static_cast<size_t>(y) * w;
@@ -124,7 +126,9 @@ uint32_t sketch(Image *src, Image **dst, bool withEdges) {
         // prepared result kept), a positive one (both sizes negative) can.
         return buffer_size_ok(block_size(w, h, withEdges ? 4 : 3)) ? 1 : 0;
     }
-    if (!has_pixels(out)) return 1;
+    const std::optional<View> to = view_of(out);
+    if (!to) return 1;
+    const View from = *view_of(src); // the result's size: the source has pixels too
     const size_t plane = static_cast<size_t>(w) * h;
     // The planes share one allocation so that temp_ex's read past the gray
     // plane lands in the edge plane; it starts zeroed for a defined first read.
@@ -132,18 +136,18 @@ uint32_t sketch(Image *src, Image **dst, bool withEdges) {
         alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h), withEdges ? 4 : 3));
     if (!buf) return 0;
     uint8_t *g = buf.get();
-    with_format(src->bitCount, [&](auto f) { gray_plane<decltype(f)>(src, g); });
+    with_format(from.bitCount, [&](auto f) { gray_plane<decltype(f)>(from, g); });
     if (withEdges) {
         uint8_t *e = g + plane, *b = g + 2 * plane, *n = g + 3 * plane;
         edges_and_negative(g, e, n, w, h);
         blur_negative(n, b, w, h);
-        with_format(out->bitCount, [&](auto f) { compose<decltype(f)>(out, g, b, e, w, h); });
+        with_format(to->bitCount, [&](auto f) { compose<decltype(f)>(*to, g, b, e, w, h); });
     } else {
         uint8_t *n = g + plane, *b = g + 2 * plane;
         for (size_t i = 0; i < plane; ++i)
             n[i] = static_cast<uint8_t>(255 - g[i]);
         blur_negative(n, b, w, h);
-        with_format(out->bitCount, [&](auto f) { compose<decltype(f)>(out, g, b, nullptr, w, h); });
+        with_format(to->bitCount, [&](auto f) { compose<decltype(f)>(*to, g, b, nullptr, w, h); });
     }
     return 1;
 }

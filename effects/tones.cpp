@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <optional>
 
 #include "core/internal/byte_map.hpp"
 #include "core/internal/channel_map.hpp"
@@ -11,15 +12,16 @@
 #include "core/internal/math.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/view.hpp"
 #include "effects/tone_tables.hpp"
 
 using namespace pxfx;
 
 namespace {
 
-template <class F> void negative(const Image *src, Image *dst) {
-    const int32_t w = src->width;
-    for (int32_t y = 0; y < src->height; ++y) {
+template <class F> void negative(const View &src, const View &dst) {
+    const int32_t w = src.width;
+    for (int32_t y = 0; y < src.height; ++y) {
         const typename F::CRow in = F::crow(src, y);
         const typename F::Row out = F::row(dst, y);
         if constexpr (F::kBitCount == 24) {
@@ -80,11 +82,9 @@ ChannelTables old_photo_tables() {
 }
 
 template <class Fn> uint32_t point_effect(Image *src, Image **dst, Fn fn) {
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
-    with_format(src->bitCount, [&](auto f) { map_pixels<decltype(f)>(src, out, fn); });
-    return 1;
+    return draw_result(src, dst, [&](const View &from, const View &to) {
+        with_format(from.bitCount, [&](auto f) { map_pixels<decltype(f)>(from, to, fn); });
+    });
 }
 
 // warm and cold on 24- and 32-bit rows as byte tables: blue and red through
@@ -106,20 +106,16 @@ ToneTables tone_tables(bool warm) {
     return {tables.b[warm], tables.r[warm], tables.q[warm], warm};
 }
 
-template <bool Warm> void tone_rows(const Image *src, Image *dst) {
+template <bool Warm> void tone_rows(const View &src, const View &dst) {
     const ToneTables t = tone_tables(Warm);
-    const int channels = static_cast<int>(src->bitCount / 8);
-    for (int32_t y = 0; y < src->height; ++y)
-        tone_bytes(row_ptr(src, y), row_ptr(dst, y), static_cast<size_t>(src->width), channels, t);
+    const int channels = static_cast<int>(src.bitCount / 8);
+    for (int32_t y = 0; y < src.height; ++y)
+        tone_bytes(src.row(y), dst.row(y), static_cast<size_t>(src.width), channels, t);
 }
 
 template <bool Warm, class Fn> uint32_t tone_effect(Image *src, Image **dst, Fn fn) {
     if (src == nullptr || (src->bitCount != 24 && src->bitCount != 32)) return point_effect(src, dst, fn);
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
-    tone_rows<Warm>(src, out);
-    return 1;
+    return draw_result(src, dst, [&](const View &from, const View &to) { tone_rows<Warm>(from, to); });
 }
 
 } // namespace
@@ -127,11 +123,9 @@ template <bool Warm, class Fn> uint32_t tone_effect(Image *src, Image **dst, Fn 
 extern "C" {
 
 uint32_t PX_IMG_Negative(Image *src, Image **dst) {
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
-    with_format(src->bitCount, [&](auto f) { negative<decltype(f)>(src, out); });
-    return 1;
+    return draw_result(src, dst, [&](const View &from, const View &to) {
+        with_format(from.bitCount, [&](auto f) { negative<decltype(f)>(from, to); });
+    });
 }
 
 uint32_t PX_IMG_WARM_YELLOW(Image *src, Image **dst) { return tone_effect<true>(src, dst, warm); }
@@ -141,24 +135,24 @@ uint32_t PX_IMG_COLD_PUPRLE(Image *src, Image **dst) { return tone_effect<false>
 uint32_t PX_IMG_Repristination(Image *src, Image **dst) { return point_effect(src, dst, restored); }
 
 uint32_t PX_IMG_Classical_Photograph(Image *src, Image **dst) {
-    Image *out = acquire_result(src, dst);
-    if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
-    const ChannelTables t = old_photo_tables();
-    map_channels(src, out, t.map());
-    return 1;
+    return draw_result(src, dst, [&](const View &from, const View &to) {
+        const ChannelTables t = old_photo_tables();
+        map_channels(from, to, t.map());
+    });
 }
 
 uint32_t PX_IMG_Line(Image *src, Image **dst) {
     Image *out = acquire_result(src, dst);
     if (out == nullptr) return 0;
-    if (!has_pixels(out)) return 1;
+    const std::optional<View> to = view_of(out);
+    if (!to) return 1;
+    const View from = *view_of(src); // the result's size: the source has pixels too
     uint8_t darker[256];
     for (int i = 0; i < 256; ++i)
         darker[i] = static_cast<uint8_t>(i > 128 ? i - 128 : 0);
     const ChannelMap dark{darker, darker, darker}, same{kIdentityMap, kIdentityMap, kIdentityMap};
     // Rows 2, 5, 8, ... are copied; all others are darkened.
-    map_channel_rows(src, out, [&](int32_t y) { return y % 3 == 2 ? &same : &dark; });
+    map_channel_rows(from, *to, [&](int32_t y) { return y % 3 == 2 ? &same : &dark; });
     return 1;
 }
 

@@ -20,15 +20,15 @@ constexpr int32_t kNotReached = 256;
 
 namespace pxfx::lines {
 
-void band_threshold(const Image *src, Image *dst) {
-    const int32_t w = src->width, h = src->height;
+void band_threshold(const View &src, const View &dst) {
+    const int32_t w = src.width, h = src.height;
     // Four interleaved partial histograms keep runs of equal levels from
     // serialising on one counter.
     uint32_t part[4][256] = {};
     uint32_t hist[256];
     int32_t bandStart = 0;
     for (int32_t y = 0; y < h; ++y) {
-        const uint8_t *row = row_ptr(src, y);
+        const uint8_t *row = src.row(y);
         int32_t x = 0;
         for (; x + 4 <= w; x += 4) {
             ++part[0][row[x]];
@@ -43,8 +43,8 @@ void band_threshold(const Image *src, Image *dst) {
             hist[v] = part[0][v] + part[1][v] + part[2][v] + part[3][v];
         const int32_t t = GetMaxHtoThrod2(hist, 0);
         for (int32_t r = bandStart; r <= y; ++r) {
-            const uint8_t *in = row_ptr(src, r);
-            uint8_t *out = row_ptr(dst, r);
+            const uint8_t *in = src.row(r);
+            uint8_t *out = dst.row(r);
             for (int32_t i = 0; i < w; ++i)
                 out[i] = in[i] <= t ? 1 : 255;
         }
@@ -57,12 +57,12 @@ void band_threshold(const Image *src, Image *dst) {
 // the same result as a strict left-to-right scan: a pixel is only cleared
 // when its right neighbour is not 1, and that neighbour then stays as it is
 // whatever its left neighbour has become.
-void remove_isolated_dots(Image *img) {
+void remove_isolated_dots(const View &img) {
     constexpr int32_t kChunk = 64;
-    const int32_t w = img->width;
+    const int32_t w = img.width, h = img.height;
     uint8_t judged[kChunk];
-    for (int32_t y = 0; y < img->height; ++y) {
-        uint8_t *row = row_ptr(img, y);
+    for (int32_t y = 0; y < h; ++y) {
+        uint8_t *row = img.row(y);
         for (int32_t x = 1; x < w - 1; x += kChunk) {
             const int32_t n = w - 1 - x < kChunk ? w - 1 - x : kChunk;
             for (int32_t i = 0; i < n; ++i) {
@@ -128,25 +128,26 @@ int32_t BinImg(Image *img, Image **out) {
     // Without columns there is nothing to read or write; otherwise the
     // thresholding reads every pixel, which needs a block.
     const bool empty = img->width <= 0;
-    if (!empty && img->bits == nullptr) return 0;
+    const std::optional<View> in = view_of(img);
+    if (!empty && !in) return 0;
     // The marking's scratch comes first, so that a failure touches nothing.
     Buffer<int32_t> scratch;
     if (!lines::marks_nothing(img)) {
-        scratch = lines::line_scratch(img);
+        scratch = lines::line_scratch(*in);
         if (!scratch) return 0;
     }
     // The slot's image is replaced even when the new one cannot be made (an
     // empty width makes none): the work then goes into the input.
-    Image *dst = img;
+    std::optional<View> dst = in;
     if (out != nullptr && *out != img) {
         free_Image(out, 0);
         *out = malloc_Image(img->width, img->height, static_cast<int32_t>(img->bitCount));
-        if (*out != nullptr) dst = *out;
+        if (const std::optional<View> made = view_of(*out)) dst = made;
     }
     if (empty) return 1;
-    lines::band_threshold(img, dst);
-    lines::remove_isolated_dots(dst);
-    if (scratch) lines::mark_line_bands(dst, scratch.get());
+    lines::band_threshold(*in, *dst);
+    lines::remove_isolated_dots(*dst);
+    if (scratch) lines::mark_line_bands(*dst, scratch.get());
     return 1;
 }
 

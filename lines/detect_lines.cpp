@@ -31,9 +31,9 @@ void label_calm_rows(int32_t *a, const int32_t *b, const int32_t *c, int32_t n, 
 
 // Rows of a band: 0 where the row belongs to no long enough run, else
 // label * 50 - 24 + pixel raised to 255 and kept to its low byte.
-void mark_rows(Image *img, const int32_t *a, const int32_t *c, int32_t rows, int32_t cols) {
+void mark_rows(const View &img, const int32_t *a, const int32_t *c, int32_t rows, int32_t cols) {
     for (int32_t y = 0; y < rows; ++y) {
-        uint8_t *row = row_ptr(img, y);
+        uint8_t *row = img.row(y);
         if (c[y] == 0) {
             std::memset(row, 0, static_cast<size_t>(cols));
             continue;
@@ -80,19 +80,19 @@ int32_t CheckMaxSame(const int32_t *labels, int32_t n, int32_t *first, int32_t *
 
 namespace pxfx::lines {
 
-Buffer<int32_t> line_scratch(const Image *img) {
-    return alloc_buffer<int32_t>(checked_size(static_cast<uint64_t>(img->height - 1), 3));
+Buffer<int32_t> line_scratch(const View &img) {
+    return alloc_buffer<int32_t>(checked_size(static_cast<uint64_t>(img.height - 1), 3));
 }
 
-void mark_line_bands(Image *img, int32_t *scratch) {
-    const int32_t height = img->height;
-    const int32_t h1 = height - 1, cols = img->width - 10, q = img->width >> 2;
+void mark_line_bands(const View &img, int32_t *scratch) {
+    const int32_t height = img.height;
+    const int32_t h1 = height - 1, cols = img.width - 10, q = img.width >> 2;
     int32_t *a = scratch, *b = a + h1, *c = b + h1;
 
     // Vertical changes per row in the central half.
     int32_t maxChanges = 0;
     for (int32_t y = 0; y < h1; ++y) {
-        const uint8_t *r0 = row_ptr(img, y), *r1 = row_ptr(img, y + 1);
+        const uint8_t *r0 = img.row(y), *r1 = img.row(y + 1);
         int32_t n = 0;
         for (int32_t x = q; x < cols - q; ++x)
             n += r0[x] != r1[x];
@@ -175,10 +175,11 @@ int32_t DetectLines(Image *img) {
     if (!lines::markable(img)) return 0;
     if (lines::marks_nothing(img)) return 1;
     // Marking a record without pixels would write through its missing block.
-    if (img->bits == nullptr) return 0;
-    Buffer<int32_t> scratch = lines::line_scratch(img);
+    const std::optional<View> v = view_of(img);
+    if (!v) return 0;
+    Buffer<int32_t> scratch = lines::line_scratch(*v);
     if (!scratch) return 0;
-    lines::mark_line_bands(img, scratch.get());
+    lines::mark_line_bands(*v, scratch.get());
     return 1;
 }
 

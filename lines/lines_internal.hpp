@@ -9,6 +9,7 @@
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
+#include "core/internal/view.hpp"
 
 namespace pxfx::lines {
 
@@ -24,18 +25,18 @@ inline constexpr int32_t kMinRecognizeHeight = 13;
 // Boundary row of every column of a plane of at least kMinRecognizeWidth x
 // kMinRecognizeHeight: the line through the two strip boundaries, shifted by
 // the edge refinement. `line` holds width entries.
-void detect_boundary(const Image *img, int32_t *line);
+void detect_boundary(const View &img, int32_t *line);
 
 // result(r, c) = img(line[c] + r, c) for the rows that every column can fill;
 // rows above the picture read as row 0. The rest of res is left as it is.
-void straighten(const Image *img, const int32_t *line, Image *res);
+void straighten(const View &img, const int32_t *line, const View &res);
 
 // Binarises src into dst (same size, 8 bits) in bands of 37 rows: 1 for levels
 // up to the band's threshold, 255 above. src and dst may be the same image.
-void band_threshold(const Image *src, Image *dst);
+void band_threshold(const View &src, const View &dst);
 
 // A 1 between two pixels that are not 1 becomes 255.
-void remove_isolated_dots(Image *img);
+void remove_isolated_dots(const View &img);
 
 // True for an 8-bit record that the line-band marking can run on: rows its
 // block holds, at least one row (its scratch lists have height - 1 entries
@@ -53,9 +54,9 @@ inline bool marks_nothing(const Image *img) { return img->height == 1 || img->wi
 // Scratch of the line-band marking of a plane with pixels for which
 // marks_nothing does not hold (three words per row but one); empty when it
 // cannot be had.
-Buffer<int32_t> line_scratch(const Image *img);
+Buffer<int32_t> line_scratch(const View &img);
 
 // Marks the line bands of such a binarised plane in place.
-void mark_line_bands(Image *img, int32_t *scratch);
+void mark_line_bands(const View &img, int32_t *scratch);
 
 } // namespace pxfx::lines

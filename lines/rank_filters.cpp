@@ -29,14 +29,14 @@ constexpr int32_t kCrossMinWidth = 16, kBoxMinWidth = 7;
 // the column's five pixels of rows y - 2 .. y + 2 and the fourteen other
 // pixels of row y in columns x - 7 .. x + 7. The rank is tracked along the
 // row.
-bool cross_median(const Image *img, Image *res) {
-    const int32_t w = img->width, h = img->height;
+bool cross_median(const View &img, const View &res) {
+    const int32_t w = img.width, h = img.height;
     const int32_t x0 = 7, x1 = w - 9;
     Buffer<Hist> block = alloc_zeroed<Hist>(static_cast<size_t>(x1 - x0 + 1));
     if (!block) return false;
     Hist *const hists = block.get();
     for (int32_t y = 0; y < 5; ++y) {
-        const uint8_t *r = row_ptr(img, y);
+        const uint8_t *r = img.row(y);
         for (int32_t x = x0; x <= x1; ++x)
             hists[x - x0].add(r[x]);
     }
@@ -44,8 +44,8 @@ bool cross_median(const Image *img, Image *res) {
     for (int32_t y = 3; y <= h - 4; ++y) {
         const uint8_t *rows[5];
         for (int32_t d = 0; d < 5; ++d)
-            rows[d] = row_ptr(img, y - 2 + d);
-        const uint8_t *gone = row_ptr(img, y - 3), *r = rows[2];
+            rows[d] = img.row(y - 2 + d);
+        const uint8_t *gone = img.row(y - 3), *r = rows[2];
         for (int32_t x = x0; x <= x1; ++x) {
             hists[x - x0].remove(gone[x]);
             hists[x - x0].add(rows[4][x]);
@@ -54,7 +54,7 @@ bool cross_median(const Image *img, Image *res) {
         for (int32_t x = x0 - 7; x <= x0 + 7; ++x)
             rowHist.add(r[x]);
         rank::Cursor t{};
-        uint8_t *out = row_ptr(res, y);
+        uint8_t *out = res.row(y);
         for (int32_t x = x0; x <= x1; ++x) {
             if (x > x0) {
                 // Window x - 7 .. x + 7 from x - 8 .. x + 6; the old centre
@@ -85,8 +85,8 @@ bool cross_median(const Image *img, Image *res) {
 // Rows 3 .. h - 4, columns 2 .. w - 5 (at least one): the 13th smallest of
 // the 5 x 5 block around the pixel. Each column's block histogram carries its
 // own rank down the picture.
-bool box_median(const Image *img, Image *res) {
-    const int32_t w = img->width, h = img->height;
+bool box_median(const View &img, const View &res) {
+    const int32_t w = img.width, h = img.height;
     const int32_t x0 = 2, x1 = w - 5;
     const int32_t cols = x1 - x0 + 1;
     Buffer<Hist> block = alloc_zeroed<Hist>(static_cast<size_t>(cols));
@@ -95,14 +95,14 @@ bool box_median(const Image *img, Image *res) {
     Hist *const hists = block.get();
     rank::Cursor *const track = trackers.get();
     for (int32_t y = 0; y < 5; ++y) {
-        const uint8_t *r = row_ptr(img, y);
+        const uint8_t *r = img.row(y);
         for (int32_t x = x0; x <= x1; ++x)
             for (int32_t d = -2; d <= 2; ++d)
                 hists[x - x0].add(r[x + d]);
     }
     for (int32_t y = 3; y <= h - 4; ++y) {
-        const uint8_t *gone = row_ptr(img, y - 3), *come = row_ptr(img, y + 2);
-        uint8_t *out = row_ptr(res, y);
+        const uint8_t *gone = img.row(y - 3), *come = img.row(y + 2);
+        uint8_t *out = res.row(y);
         for (int32_t x = x0; x <= x1; ++x) {
             Hist &col = hists[x - x0];
             rank::Cursor &t = track[x - x0];
@@ -125,9 +125,11 @@ bool box_median(const Image *img, Image *res) {
 template <class Filter> int32_t run_median(Image *img, Image **out, int32_t minWidth, Filter filter) {
     if (img == nullptr || img->bitCount != 8 || !rows_inside(img)) return 0;
     const bool filters = img->width >= minWidth;
-    if (filters && (img->bits == nullptr || img->height < 5)) return 0;
+    const std::optional<View> in = view_of(img);
+    if (filters && (!in || in->height < 5)) return 0;
     ImagePtr res = make_image(img->width, img->height, 8);
-    if (!res || (filters && !filter(img, res.get()))) return 0;
+    const std::optional<View> to = view_of(res.get());
+    if (!to || (filters && !filter(*in, *to))) return 0;
     return InPlaceOrSlot(img, out).deliver(std::move(res));
 }
 
@@ -141,12 +143,14 @@ int32_t MyEdge(Image *img, Image **out) {
     // smaller ones, with or without pixels, give a new image as it is made.
     const int32_t w = img->width, h = img->height;
     const int32_t rows = w >= 3 && h >= 3 ? h - 2 : 0;
-    if (rows > 0 && img->bits == nullptr) return 0;
+    const std::optional<View> in = view_of(img);
+    if (rows > 0 && !in) return 0;
     ImagePtr res = make_image(w, h, 8);
-    if (!res) return 0;
+    const std::optional<View> to = view_of(res.get());
+    if (!to) return 0;
     for (int32_t y = 0; y < rows; ++y) {
-        const uint8_t *ra = row_ptr(img, y), *rb = row_ptr(img, y + 2);
-        uint8_t *o = row_ptr(res.get(), y);
+        const uint8_t *ra = in->row(y), *rb = in->row(y + 2);
+        uint8_t *o = to->row(y);
         for (int32_t x = 1; x < w - 1; ++x) {
             const int32_t a = ra[x], b = rb[x];
             o[x] = a > b + 9 ? 0 : (b > a + 9 ? 255 : static_cast<uint8_t>(a));

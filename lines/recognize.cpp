@@ -27,10 +27,10 @@ constexpr int32_t kRightStripFromEnd = 70, kRightCentreFromEnd = 55;
 
 // First row from kFirstRow on where fewer than kMinDark pixels of the strip
 // are darker than t; height - 2 when every row is dark enough.
-int32_t boundary_row(const Image *img, int32_t x0, int32_t t) {
-    const int32_t h = img->height;
+int32_t boundary_row(const View &img, int32_t x0, int32_t t) {
+    const int32_t h = img.height;
     for (int32_t y = kFirstRow; y < h - 2; ++y) {
-        const uint8_t *r = row_ptr(img, y) + x0;
+        const uint8_t *r = img.row(y) + x0;
         int32_t dark = 0;
         for (int32_t i = 0; i < kStripWidth; ++i)
             dark += r[i] < t;
@@ -54,12 +54,12 @@ namespace pxfx::lines {
 // |(c + 1 - 66) (r2 - r1)| < width * height < 2^31 and |line[c] - r1| is at
 // most 65 |r2 - r1| < 65 * 2^31 / 121, so the rows fit 32 bits; products are formed in 64 bits
 // all the same, and the level sum of the refinement is exact.
-void detect_boundary(const Image *img, int32_t *line) {
-    const int32_t w = img->width, h = img->height;
+void detect_boundary(const View &img, int32_t *line) {
+    const int32_t w = img.width, h = img.height;
     const int32_t right = w - kRightStripFromEnd;
     uint32_t histL[256] = {}, histR[256] = {};
     for (int32_t y = kFirstRow; y <= h - 3; ++y) {
-        const uint8_t *r = row_ptr(img, y);
+        const uint8_t *r = img.row(y);
         for (int32_t i = 0; i < kStripWidth; ++i) {
             ++histL[r[kLeftStrip + i]];
             ++histR[r[right + i]];
@@ -78,14 +78,14 @@ void detect_boundary(const Image *img, int32_t *line) {
     const int32_t top = std::max(std::min(r1, r2) - 8, 0), bottom = std::max(r1, r2);
     int64_t sum = 0;
     for (int32_t y = top; y <= bottom + 7; ++y)
-        sum += row_sum(row_ptr(img, std::min(y, h - 1)), kLeftCentre, mid);
+        sum += row_sum(img.row(std::min(y, h - 1)), kLeftCentre, mid);
     const int64_t mean = sum / ((static_cast<int64_t>(bottom) + 8 - top) * span);
 
     // The edge test looks at the same pixel pair, rows top and top + 1 of
     // column 65, for every column and row it walks: when the pair is an
     // upward edge every column's edge is the last row walked, bottom + 6,
     // otherwise no column has one. (top <= height - 10, so top + 1 exists.)
-    const uint8_t above = row_ptr(img, top)[kLeftCentre], below = row_ptr(img, top + 1)[kLeftCentre];
+    const uint8_t above = img.row(top)[kLeftCentre], below = img.row(top + 1)[kLeftCentre];
     if (!(above < mean && below >= mean)) return;
     const int64_t edge = static_cast<int64_t>(bottom) + 6;
     int64_t off = 0;
@@ -102,18 +102,18 @@ void detect_boundary(const Image *img, int32_t *line) {
 // rows copied lies below the last row. Column 65 holds r1 >= 0, so at most
 // `height` rows are copied. Only ends extrapolated above the picture can ask
 // for a negative row; those read row 0.
-void straighten(const Image *img, const int32_t *line, Image *res) {
-    const int32_t w = img->width, h = img->height;
+void straighten(const View &img, const int32_t *line, const View &res) {
+    const int32_t w = img.width, h = img.height;
     const int64_t rows = std::min(static_cast<int64_t>(h) - line[0], static_cast<int64_t>(h) - line[w - 1]);
     auto source = [&](int32_t c, int64_t r) {
         const int64_t sr = line[c] + r;
-        return row_ptr(img, static_cast<int32_t>(sr < 0 ? 0 : sr));
+        return img.row(static_cast<int32_t>(sr < 0 ? 0 : sr));
     };
     // A nearly level line changes its value rarely: columns sharing a value
     // are copied as pieces of their source row.
     if (std::abs(static_cast<int64_t>(line[w - 1]) - line[0]) * 64 <= w) {
         for (int64_t r = 0; r < rows; ++r) {
-            uint8_t *out = row_ptr(res, static_cast<int32_t>(r));
+            uint8_t *out = res.row(static_cast<int32_t>(r));
             for (int32_t c = 0; c < w;) {
                 int32_t e = c + 1;
                 while (e < w && line[e] == line[c])
@@ -130,7 +130,7 @@ void straighten(const Image *img, const int32_t *line, Image *res) {
     for (int32_t c0 = 0; c0 < w; c0 += kStrip) {
         const int32_t c1 = std::min(c0 + kStrip, w);
         for (int64_t r = 0; r < rows; ++r) {
-            uint8_t *out = row_ptr(res, static_cast<int32_t>(r));
+            uint8_t *out = res.row(static_cast<int32_t>(r));
             for (int32_t c = c0; c < c1; ++c)
                 out[c] = source(c, r)[c];
         }
@@ -142,15 +142,16 @@ void straighten(const Image *img, const int32_t *line, Image *res) {
 extern "C" {
 
 int32_t RecognizeYUV(Image *img, Image **out) {
-    if (!is_plane(img)) return 0;
-    if (img->width < lines::kMinRecognizeWidth || img->height < lines::kMinRecognizeHeight) return 0;
-    ImagePtr res = make_image(img->width, img->height, 8);
-    if (!res) return 0;
-    std::memset(res->bits, 0, block_bytes(res.get()));
-    Buffer<int32_t> line = alloc_buffer<int32_t>(static_cast<size_t>(img->width));
+    const std::optional<View> in = plane_view_of(img);
+    if (!in || in->width < lines::kMinRecognizeWidth || in->height < lines::kMinRecognizeHeight) return 0;
+    ImagePtr res = make_image(in->width, in->height, 8);
+    const std::optional<View> to = view_of(res.get());
+    if (!to) return 0;
+    std::memset(to->bits, 0, to->block_bytes());
+    Buffer<int32_t> line = alloc_buffer<int32_t>(static_cast<size_t>(in->width));
     if (!line) return 0;
-    lines::detect_boundary(img, line.get());
-    lines::straighten(img, line.get(), res.get());
+    lines::detect_boundary(*in, line.get());
+    lines::straighten(*in, line.get(), *to);
     line.reset();
     if (BinImg(res.get(), nullptr) == 0) return 0;
     return InPlaceOrSlot(img, out).deliver(std::move(res));
@@ -169,16 +170,18 @@ Image *MyResample2(Image *img, int32_t factor) {
     const int32_t w = img->width, h = img->height;
     // A plane of one row is read by nothing but the copy of its last row; a
     // taller one needs its block.
-    if (img->bits == nullptr && h > 1) return nullptr;
+    const std::optional<View> in = view_of(img);
+    if (!in && h > 1) return nullptr;
     const int64_t newHeight = static_cast<int64_t>(factor) * (h - 1) + 1;
     if (newHeight > INT32_MAX) return nullptr;
-    Image *res = malloc_Image(w, static_cast<int32_t>(newHeight), 8);
-    if (res == nullptr) return nullptr;
+    ImagePtr res = make_image(w, static_cast<int32_t>(newHeight), 8);
+    const std::optional<View> to = view_of(res.get());
+    if (!to) return nullptr;
     const uint32_t f = static_cast<uint32_t>(factor), round = (f + 1) >> 1, m = (1u << 23) / f + 1;
     for (int32_t y = 0; y < h - 1; ++y) {
-        const uint8_t *a = row_ptr(img, y), *b = row_ptr(img, y + 1);
+        const uint8_t *a = in->row(y), *b = in->row(y + 1);
         for (uint32_t k = 0; k < f; ++k) {
-            uint8_t *o = row_ptr(res, static_cast<int32_t>(static_cast<uint32_t>(y) * f + k));
+            uint8_t *o = to->row(static_cast<int32_t>(static_cast<uint32_t>(y) * f + k));
             const uint32_t wa = f - k;
             for (int32_t x = 0; x < w; ++x)
                 o[x] = static_cast<uint8_t>(((a[x] * wa + b[x] * k + round) * m) >> 23);
@@ -186,12 +189,13 @@ Image *MyResample2(Image *img, int32_t factor) {
     }
     // The last row lies exactly on the last source row; without a block it
     // stays as malloc_Image made it.
-    if (img->bits != nullptr) std::memcpy(row_ptr(res, res->height - 1), row_ptr(img, h - 1), static_cast<size_t>(w));
+    if (in) std::memcpy(to->row(to->height - 1), in->row(h - 1), static_cast<size_t>(w));
     // A plane below the straightening's minimum size is returned as it is; a
     // straightening that runs out of memory fails the call.
-    if (RecognizeYUV(res, nullptr) == 0 && w >= lines::kMinRecognizeWidth && res->height >= lines::kMinRecognizeHeight)
-        free_Image(&res, 0);
-    return res;
+    if (RecognizeYUV(res.get(), nullptr) == 0 && w >= lines::kMinRecognizeWidth &&
+        to->height >= lines::kMinRecognizeHeight)
+        return nullptr;
+    return res.release();
 }
 
 void ImgLineDecode(void) {}

@@ -14,11 +14,12 @@ int32_t RGB_Reverse(Image *img) {
     // A record whose rows overrun its block is refused like one without a block.
     if (img == nullptr || img->bits == nullptr || !rows_inside(img)) return 0;
     // Other bit counts and empty sizes have no pixel to swap.
-    if ((img->bitCount != 24 && img->bitCount != 32) || img->width <= 0 || img->height <= 0) return 1;
-    const size_t step = img->bitCount / 8;
-    const size_t bytes = static_cast<size_t>(img->width) * step;
-    for (int32_t y = 0; y < img->height; ++y) {
-        uint8_t *row = row_ptr(img, y);
+    const std::optional<View> v = view_of(img);
+    if (!v || (v->bitCount != 24 && v->bitCount != 32)) return 1;
+    const size_t step = v->bitCount / 8;
+    const size_t bytes = static_cast<size_t>(v->width) * step;
+    for (int32_t y = 0; y < v->height; ++y) {
+        uint8_t *row = v->row(y);
         for (size_t i = 0; i < bytes; i += step)
             std::swap(row[i], row[i + 2]);
     }

@@ -24,12 +24,12 @@ bool same_size(const Image *a, const Image *b) { return a->height == b->height &
 
 // Pixels of the picture shifted by (dx, dy) into the clone copy, where the
 // source pixel lies in the picture.
-template <class FS, class FD> void shift_into(const Image *pic, Image *copy, int64_t dx, int64_t dy) {
-    const int64_t xa = std::max<int64_t>(0, -dx), xb = std::min<int64_t>(copy->width, pic->width - dx);
+template <class FS, class FD> void shift_into(const View &pic, const View &copy, int64_t dx, int64_t dy) {
+    const int64_t xa = std::max<int64_t>(0, -dx), xb = std::min<int64_t>(copy.width, pic.width - dx);
     if (xa >= xb) return;
-    for (int32_t y = 0; y < copy->height; ++y) {
+    for (int32_t y = 0; y < copy.height; ++y) {
         const int64_t sy = y + dy;
-        if (sy < 0 || sy >= pic->height) continue;
+        if (sy < 0 || sy >= pic.height) continue;
         const typename FS::CRow in = FS::crow(pic, static_cast<int32_t>(sy));
         const typename FD::Row out = FD::row(copy, y);
         if constexpr (FS::kDirect && std::is_same_v<FS, FD>) {
@@ -124,10 +124,11 @@ int32_t PX_Mimic(Image *picture, int32_t srcX, int32_t srcY, const Image *refere
     copy = *cache;
     if (copy == nullptr) return 0;
     PX_Img_Copy(copy, base);
-    if (reload != 0) {
+    // A picture without pixel rows has no pixel to shift in.
+    const std::optional<View> from = view_of(picture), to = view_of(copy);
+    if (reload != 0 && from && to) {
         const int64_t dx = static_cast<int64_t>(srcX) - dstX, dy = static_cast<int64_t>(srcY) - dstY;
-        with_formats(picture, copy,
-                     [&](auto fs, auto fd) { shift_into<decltype(fs), decltype(fd)>(picture, copy, dx, dy); });
+        with_formats(*from, *to, [&](auto fs, auto fd) { shift_into<decltype(fs), decltype(fd)>(*from, *to, dx, dy); });
     }
     if (r != 0) PointArea_Copy(picture, copy, cx, cy, r);
     return 1;

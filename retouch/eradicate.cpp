@@ -23,7 +23,7 @@ int32_t dist(int32_t x, int32_t y, int32_t cx, int32_t cy) {
         distance2d(static_cast<int32_t>(dx < 0 ? -dx : dx), static_cast<int32_t>(dy < 0 ? -dy : dy)));
 }
 
-template <class F> void eradicate(Image *img, int32_t cx, int32_t cy, int32_t r, const Rect &q) {
+template <class F> void eradicate(const View &img, int32_t cx, int32_t cy, int32_t r, const Rect &q) {
     int64_t sb = 0, sg = 0, sr = 0, count = 0;
     for (int32_t y = q.y0; y <= q.y1; ++y) {
         const typename F::CRow in = F::crow(img, y);
@@ -63,15 +63,16 @@ template <class F> void eradicate(Image *img, int32_t cx, int32_t cy, int32_t r,
 extern "C" {
 
 void alg_Img_Eradicate(Image *picture, int32_t cx, int32_t cy, int32_t r) {
-    if (!has_pixels(picture)) return;
+    const std::optional<View> v = view_of(picture);
+    if (!v) return;
     const int64_t x0 = std::max<int64_t>(static_cast<int64_t>(cx) - r, 0);
-    const int64_t x1 = std::min<int64_t>(static_cast<int64_t>(cx) + r, picture->width - 1);
+    const int64_t x1 = std::min<int64_t>(static_cast<int64_t>(cx) + r, v->width - 1);
     const int64_t y0 = std::max<int64_t>(static_cast<int64_t>(cy) - r, 0);
-    const int64_t y1 = std::min<int64_t>(static_cast<int64_t>(cy) + r, picture->height - 1);
+    const int64_t y1 = std::min<int64_t>(static_cast<int64_t>(cy) + r, v->height - 1);
     if (x0 >= x1 || y0 > y1) return;
     const Rect q{static_cast<int32_t>(x0), static_cast<int32_t>(x1), static_cast<int32_t>(y0),
                  static_cast<int32_t>(y1)};
-    with_format(picture->bitCount, [&](auto f) { eradicate<decltype(f)>(picture, cx, cy, r, q); });
+    with_format(v->bitCount, [&](auto f) { eradicate<decltype(f)>(*v, cx, cy, r, q); });
 }
 
 } // extern "C"

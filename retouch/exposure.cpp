@@ -16,15 +16,16 @@ namespace {
 
 constexpr int32_t kHsl = 1;
 
-void shift_plane(Image *plane, int32_t delta) {
+void shift_plane(const View &plane, int32_t delta) {
     uint8_t table[256];
     for (int32_t i = 0; i < 256; ++i) {
         const int64_t v = static_cast<int64_t>(i) + delta;
         table[i] = v > 255 ? 255 : (v < 0 ? 0 : static_cast<uint8_t>(v));
     }
     const uint8_t *const tables[1] = {table};
-    for (int32_t y = 0; y < plane->height; ++y)
-        map_bytes(row_ptr(plane, y), row_ptr(plane, y), static_cast<size_t>(plane->width), 1, tables);
+    const auto w = static_cast<size_t>(plane.width);
+    for (int32_t y = 0; y < plane.height; ++y)
+        map_bytes(plane.row(y), plane.row(y), w, 1, tables);
 }
 
 } // namespace
@@ -35,7 +36,7 @@ int32_t ImageExposure(const Image *src, Image **dst, int32_t delta) {
     if (!has_pixels(src) || dst == nullptr) return 0;
     Image *h = nullptr, *s = nullptr, *l = nullptr, *a = nullptr;
     if (!Split(src, &h, &s, &l, src->bitCount == 32 ? &a : nullptr, kHsl)) return 0;
-    shift_plane(l, delta);
+    if (const std::optional<View> lightness = view_of(l)) shift_plane(*lightness, delta);
     ImagePtr combined(Combine(h, s, l, a, kHsl));
     free_Image(&h, 0);
     free_Image(&s, 0);

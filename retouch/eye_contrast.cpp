@@ -24,7 +24,7 @@ struct Area {
     }
 };
 
-template <class F> int64_t green_sum(const Image *img, const Area &q) {
+template <class F> int64_t green_sum(const View &img, const Area &q) {
     int64_t s = 0;
     for (int32_t y = q.y0; y < q.y1; ++y) {
         const typename F::CRow in = F::crow(img, y);
@@ -34,7 +34,7 @@ template <class F> int64_t green_sum(const Image *img, const Area &q) {
     return s;
 }
 
-template <class F> void boost(Image *img, const Area &q, const uint8_t table[256]) {
+template <class F> void boost(const View &img, const Area &q, const uint8_t table[256]) {
     for (int32_t y = q.y0; y < q.y1; ++y) {
         const typename F::CRow in = F::crow(img, y);
         const typename F::Row out = F::row(img, y);
@@ -63,12 +63,13 @@ template <class F> void boost(Image *img, const Area &q, const uint8_t table[256
 extern "C" {
 
 void alg_Img_EyesMoreContrast_ellipse(Image *img, int32_t cx, int32_t cy, int32_t a, int32_t contrast) {
-    if (!has_pixels(img)) return;
+    const std::optional<View> v = view_of(img);
+    if (!v) return;
     const int64_t half = a / 2;
     const int64_t y0 = std::max<int64_t>(cy - half, 0);
-    const int64_t y1 = std::min<int64_t>(cy + (static_cast<int64_t>(a) + 1) / 2, img->height - 1);
+    const int64_t y1 = std::min<int64_t>(cy + (static_cast<int64_t>(a) + 1) / 2, v->height - 1);
     const int64_t x0 = std::max<int64_t>(static_cast<int64_t>(cx) - a, 0);
-    const int64_t x1 = std::min<int64_t>(static_cast<int64_t>(cx) + a, img->width - 1);
+    const int64_t x1 = std::min<int64_t>(static_cast<int64_t>(cx) + a, v->width - 1);
     if (y1 <= y0 || x1 <= x0) return;
     const uint32_t ua = static_cast<uint32_t>(a), uh = static_cast<uint32_t>(half);
     const int64_t f = isqrt_round(ua * ua - uh * uh);
@@ -78,18 +79,18 @@ void alg_Img_EyesMoreContrast_ellipse(Image *img, int32_t cx, int32_t cy, int32_
                  static_cast<int32_t>(y1),
                  a,
                  cy,
-                 std::clamp<int64_t>(cx - f, 0, img->width - 1),
-                 std::clamp<int64_t>(cx + f, 0, img->width - 1)};
+                 std::clamp<int64_t>(cx - f, 0, v->width - 1),
+                 std::clamp<int64_t>(cx + f, 0, v->width - 1)};
     const float gain = static_cast<float>(static_cast<int64_t>(contrast) + 100) / 100.0f;
-    with_format(img->bitCount, [&](auto fmt) {
+    with_format(v->bitCount, [&](auto fmt) {
         using F = decltype(fmt);
-        const int64_t m = (green_sum<F>(img, q) / (y1 - y0 + 1)) / (x1 - x0 + 1);
+        const int64_t m = (green_sum<F>(*v, q) / (y1 - y0 + 1)) / (x1 - x0 + 1);
         uint8_t table[256];
         for (int32_t i = 0; i < 256; ++i) {
             const float t = static_cast<float>(i - m) * gain + static_cast<float>(m) + 0.5f;
             table[i] = t < 0.0f ? 0 : (t >= 255.0f ? 255 : static_cast<uint8_t>(static_cast<int32_t>(t)));
         }
-        boost<F>(img, q, table);
+        boost<F>(*v, q, table);
     });
 }
 

@@ -55,7 +55,7 @@ struct CircleShape {
 };
 
 template <class F, class S> struct Stretch {
-    Image *img;
+    const View &img;
     int64_t cy;
     const S &shape;
 
@@ -66,13 +66,13 @@ template <class F, class S> struct Stretch {
         if (k == 0.0f) return;
         int32_t shift = static_cast<int32_t>(static_cast<float>(abs_diff(y, cy)) / k);
         if (shift < minShift) shift = minShift;
-        const int64_t sy = std::clamp<int64_t>(cy + dir * static_cast<int64_t>(shift), 0, img->height - 1);
+        const int64_t sy = std::clamp<int64_t>(cy + dir * static_cast<int64_t>(shift), 0, img.height - 1);
         const int32_t xi = static_cast<int32_t>(x);
         F::store(F::row(img, static_cast<int32_t>(y)), xi, F::load(F::crow(img, static_cast<int32_t>(sy)), xi));
     }
 };
 
-template <class F, class S> void stretch(Image *img, int64_t cx, int64_t cy, const Box &b, const S &shape) {
+template <class F, class S> void stretch(const View &img, int64_t cx, int64_t cy, const Box &b, const S &shape) {
     const Stretch<F, S> s{img, cy, shape};
     // Upper left: rows top .. cy, columns left .. cx.
     for (int64_t y = b.y0; y <= std::min(cy, b.y1); ++y)
@@ -92,9 +92,9 @@ template <class F, class S> void stretch(Image *img, int64_t cx, int64_t cy, con
             s.pixel(x, y, -1, 1);
 }
 
-Box clip_box(const Image *img, int64_t cx, int64_t cy, int64_t left, int64_t right, int64_t up, int64_t down) {
-    return Box{std::max<int64_t>(cx - left, 0), std::min<int64_t>(cx + right, img->width - 1),
-               std::max<int64_t>(cy - up, 0), std::min<int64_t>(cy + down, img->height - 1)};
+Box clip_box(const View &img, int64_t cx, int64_t cy, int64_t left, int64_t right, int64_t up, int64_t down) {
+    return Box{std::max<int64_t>(cx - left, 0), std::min<int64_t>(cx + right, img.width - 1),
+               std::max<int64_t>(cy - up, 0), std::min<int64_t>(cy + down, img.height - 1)};
 }
 
 // ---- Automatic search -------------------------------------------------------------
@@ -125,10 +125,10 @@ void longest_run(const int64_t *counts, int32_t n, int64_t threshold, int32_t &s
     }
 }
 
-template <class F> int64_t skin_counts(const Image *img, uint8_t *mask, int64_t *cols, int64_t *rows) {
-    const int32_t w = img->width;
+template <class F> int64_t skin_counts(const View &img, uint8_t *mask, int64_t *cols, int64_t *rows) {
+    const int32_t w = img.width, h = img.height;
     int64_t total = 0;
-    for (int32_t y = 0; y < img->height; ++y) {
+    for (int32_t y = 0; y < h; ++y) {
         const typename F::CRow in = F::crow(img, y);
         uint8_t *m = mask + static_cast<size_t>(y) * w;
         for (int32_t x = 0; x < w; ++x) {
@@ -197,22 +197,30 @@ Blob fill_hole(uint8_t *mask, int32_t w, const Face &f, int32_t sx, int32_t sy, 
     return b;
 }
 
-int32_t find_and_enlarge(Image *img) {
-    const int32_t w = img->width, h = img->height;
+// The two eyes the search settles on, and the size both are enlarged by.
+struct Eyes {
+    bool found = false;
+    Blob best{}, second{};
+    int32_t size = 0;
+};
+
+// Searches the picture for its eyes; false when working memory fails.
+bool find_eyes(const View &img, Eyes &eyes) {
+    const int32_t w = img.width, h = img.height;
     Buffer<int64_t> counts = alloc_zeroed<int64_t>(static_cast<size_t>(w) + static_cast<size_t>(h));
     Buffer<uint8_t> mask = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h)));
-    if (!counts || !mask) return 0;
+    if (!counts || !mask) return false;
     int64_t *cols = counts.get(), *rows = cols + w;
     const int64_t total =
-        with_format(img->bitCount, [&](auto f) { return skin_counts<decltype(f)>(img, mask.get(), cols, rows); });
+        with_format(img.bitCount, [&](auto f) { return skin_counts<decltype(f)>(img, mask.get(), cols, rows); });
     Face f{};
     longest_run(cols, w, (total / h) / 2, f.left, f.right);
     longest_run(rows, h, (total / w) / 2, f.top, f.bottom);
-    if (f.right <= f.left || f.bottom <= f.top) return 1;
+    if (f.right <= f.left || f.bottom <= f.top) return true;
     // Each pixel of the band enters the fill stack at most once.
     Buffer<uint32_t> stack = alloc_buffer<uint32_t>(
         checked_size(static_cast<uint64_t>(f.right - f.left), static_cast<uint64_t>(f.bottom - f.top)));
-    if (!stack) return 0;
+    if (!stack) return false;
     BlobList list;
     const int32_t middle = (f.top + f.bottom) / 2;
     for (int32_t y = f.top; y < f.bottom; ++y)
@@ -220,9 +228,9 @@ int32_t find_and_enlarge(Image *img) {
             if (mask[static_cast<size_t>(y) * w + x] != 0) continue;
             const Blob b = fill_hole(mask.get(), w, f, x, y, stack.get());
             const int64_t bh = b.bottom - b.top, bw = b.right - b.left;
-            if (bh * bw < 2 * b.count && bh < bw && b.top > middle && !list.push(b)) return 0;
+            if (bh * bw < 2 * b.count && bh < bw && b.top > middle && !list.push(b)) return false;
         }
-    if (list.size == 0) return 1;
+    if (list.size == 0) return true;
     // Candidates are taken newest first; the first one is compared with itself.
     Blob best = list.items[list.size - 1], second{0, 0, 0, 0, 0};
     for (size_t i = list.size; i-- > 0;) {
@@ -234,10 +242,11 @@ int32_t find_and_enlarge(Image *img) {
             best = c;
         }
     }
-    const int32_t size = ((best.right - best.left) + (second.right - second.left)) / 2;
-    alg_Img_EyesEnlarge(img, (best.left + best.right) / 2, (best.top + best.bottom) / 2, size, 1);
-    alg_Img_EyesEnlarge(img, (second.left + second.right) / 2, (second.top + second.bottom) / 2, size, 1);
-    return 1;
+    eyes.found = true;
+    eyes.best = best;
+    eyes.second = second;
+    eyes.size = ((best.right - best.left) + (second.right - second.left)) / 2;
+    return true;
 }
 
 } // namespace
@@ -245,7 +254,8 @@ int32_t find_and_enlarge(Image *img) {
 extern "C" {
 
 void alg_Img_EyesEnlarge_ellipse(Image *img, int32_t cx, int32_t cy, int32_t a) {
-    if (!has_pixels(img)) return;
+    const std::optional<View> v = view_of(img);
+    if (!v) return;
     const int64_t half = a / 2;
     const uint32_t ua = static_cast<uint32_t>(a), uh = static_cast<uint32_t>(half);
     const int64_t f = isqrt_round(ua * ua - uh * uh);
@@ -254,17 +264,18 @@ void alg_Img_EyesEnlarge_ellipse(Image *img, int32_t cx, int32_t cy, int32_t a) 
     s.a2 = 2 * static_cast<int64_t>(a);
     s.t = a + f / 2;
     s.k = s.a2 - s.t;
-    s.f1 = std::clamp<int64_t>(cx - f, 0, img->width - 1);
-    s.f2 = std::clamp<int64_t>(cx + f, 0, img->width - 1);
-    const Box b = clip_box(img, cx, cy, a, a, half, (static_cast<int64_t>(a) + 1) / 2);
-    with_format(img->bitCount, [&](auto fmt) { stretch<decltype(fmt)>(img, cx, cy, b, s); });
+    s.f1 = std::clamp<int64_t>(cx - f, 0, v->width - 1);
+    s.f2 = std::clamp<int64_t>(cx + f, 0, v->width - 1);
+    const Box b = clip_box(*v, cx, cy, a, a, half, (static_cast<int64_t>(a) + 1) / 2);
+    with_format(v->bitCount, [&](auto fmt) { stretch<decltype(fmt)>(*v, cx, cy, b, s); });
 }
 
 void alg_Img_EyesEnlarge_circle(Image *img, int32_t cx, int32_t cy, int32_t r) {
-    if (!has_pixels(img)) return;
+    const std::optional<View> v = view_of(img);
+    if (!v) return;
     const CircleShape s{cx, cy, r};
-    const Box b = clip_box(img, cx, cy, r, r, r, r);
-    with_format(img->bitCount, [&](auto fmt) { stretch<decltype(fmt)>(img, cx, cy, b, s); });
+    const Box b = clip_box(*v, cx, cy, r, r, r, r);
+    with_format(v->bitCount, [&](auto fmt) { stretch<decltype(fmt)>(*v, cx, cy, b, s); });
 }
 
 void alg_Img_EyesEnlarge(Image *img, int32_t cx, int32_t cy, int32_t size, int32_t shape) {
@@ -275,8 +286,16 @@ void alg_Img_EyesEnlarge(Image *img, int32_t cx, int32_t cy, int32_t size, int32
 }
 
 int32_t EyesEnlarge(Image *img) {
-    if (!has_pixels(img)) return 0;
-    return find_and_enlarge(img);
+    const std::optional<View> v = view_of(img);
+    if (!v) return 0;
+    Eyes eyes;
+    if (!find_eyes(*v, eyes)) return 0;
+    if (eyes.found) {
+        const Blob &a = eyes.best, &b = eyes.second;
+        alg_Img_EyesEnlarge(img, (a.left + a.right) / 2, (a.top + a.bottom) / 2, eyes.size, 1);
+        alg_Img_EyesEnlarge(img, (b.left + b.right) / 2, (b.top + b.bottom) / 2, eyes.size, 1);
+    }
+    return 1;
 }
 
 } // extern "C"

@@ -51,10 +51,11 @@ void make_mapping(const int64_t hist[256], float lowFraction, float highThreshol
     }
 }
 
-template <class F> void channel_histogram(const Image *src, int64_t hist[256]) {
-    for (int32_t y = 0; y < src->height; ++y) {
+template <class F> void channel_histogram(const View &src, int64_t hist[256]) {
+    const int32_t w = src.width, h = src.height;
+    for (int32_t y = 0; y < h; ++y) {
         const typename F::CRow in = F::crow(src, y);
-        for (int32_t x = 0; x < src->width; ++x) {
+        for (int32_t x = 0; x < w; ++x) {
             const uint32_t c = F::load(in, x);
             ++hist[blue_of(c)];
             ++hist[green_of(c)];
@@ -64,12 +65,13 @@ template <class F> void channel_histogram(const Image *src, int64_t hist[256]) {
 }
 
 // Loads row y of src into buf[1..w] with the edge pixels repeated at 0 and w + 1.
-template <class F> void load_row(const Image *src, int32_t y, uint32_t *buf) {
+template <class F> void load_row(const View &src, int32_t y, uint32_t *buf) {
     const typename F::CRow in = F::crow(src, y);
-    for (int32_t x = 0; x < src->width; ++x)
+    const int32_t w = src.width;
+    for (int32_t x = 0; x < w; ++x)
         buf[x + 1] = F::load(in, x);
     buf[0] = buf[1];
-    buf[src->width + 1] = buf[src->width];
+    buf[w + 1] = buf[w];
 }
 
 struct LocalScreen {
@@ -79,7 +81,8 @@ struct LocalScreen {
 };
 
 template <class FS, class FD>
-void auto_levels(const Image *src, Image *out, const int32_t map[256], int32_t amount, LocalScreen &t, uint32_t *rows) {
+void auto_levels(const View &src, const View &out, const int32_t map[256], int32_t amount, LocalScreen &t,
+                 uint32_t *rows) {
     for (int32_t i = 0; i < 256; ++i)
         t.map[i] = static_cast<uint8_t>(map[i]);
     for (int32_t n = 0; n < 256; ++n)
@@ -88,7 +91,7 @@ void auto_levels(const Image *src, Image *out, const int32_t map[256], int32_t a
     for (int32_t s = 0; s < 256; ++s)
         for (int32_t v = 0; v < 256; ++v)
             t.blend[s][v] = static_cast<uint8_t>((amount * s + (100 - amount) * v) / 100);
-    const int32_t w = src->width, h = src->height;
+    const int32_t w = src.width, h = src.height;
     uint32_t *up = rows, *cur = up + (w + 2), *down = cur + (w + 2);
     load_row<FS>(src, 0, cur);
     load_row<FS>(src, h > 1 ? 1 : 0, down);
@@ -120,13 +123,14 @@ void auto_levels(const Image *src, Image *out, const int32_t map[256], int32_t a
     }
 }
 
-template <class F> void green_and_dark_histograms(const Image *src, int64_t green[256], int64_t dark[256]) {
-    for (int32_t y = 0; y < src->height; ++y) {
+template <class F> void green_and_dark_histograms(const View &src, int64_t green[256], int64_t dark[256]) {
+    const int32_t w = src.width, h = src.height;
+    for (int32_t y = 0; y < h; ++y) {
         const typename F::CRow in = F::crow(src, y);
-        for (int32_t x = 0; x < src->width; ++x)
+        for (int32_t x = 0; x < w; ++x)
             ++green[green_of(F::load(in, x))];
     }
-    int64_t half = static_cast<int64_t>(src->width) * src->height / 2, sum = 0;
+    int64_t half = static_cast<int64_t>(w) * h / 2, sum = 0;
     int32_t split = 255;
     for (int32_t i = 255; i > 0; --i) {
         sum += green[i];
@@ -135,9 +139,9 @@ template <class F> void green_and_dark_histograms(const Image *src, int64_t gree
             break;
         }
     }
-    for (int32_t y = 0; y < src->height; ++y) {
+    for (int32_t y = 0; y < h; ++y) {
         const typename F::CRow in = F::crow(src, y);
-        for (int32_t x = 0; x < src->width; ++x) {
+        for (int32_t x = 0; x < w; ++x) {
             const uint32_t c = F::load(in, x);
             if (red_of(c) <= static_cast<uint32_t>(split)) {
                 ++dark[blue_of(c)];
@@ -180,16 +184,16 @@ int32_t ImageAutoGradationProcess(const Image *src, Image **dst, int32_t amount)
     Buffer<LocalScreen> tables = alloc_buffer<LocalScreen>(1);
     Buffer<uint32_t> rows = alloc_buffer<uint32_t>(checked_size(static_cast<uint64_t>(src->width) + 2, 3));
     if (!view.ok() || !tables || !rows) return 1;
-    Image *out = prepare_slot(src, dst);
-    if (!has_pixels(out)) return 1;
-    const Image *in = view.get();
+    const std::optional<View> out = view_of(prepare_slot(src, dst));
+    if (!out) return 1;
+    const View &in = view.view();
     amount = clamp_to(amount, 0, 100);
     int64_t hist[256] = {};
-    with_format(in->bitCount, [&](auto f) { channel_histogram<decltype(f)>(in, hist); });
+    with_format(in.bitCount, [&](auto f) { channel_histogram<decltype(f)>(in, hist); });
     int32_t map[256];
     make_mapping(hist, 0.0005f, 0.0005f, map);
-    with_formats(in, out, [&](auto fs, auto fd) {
-        auto_levels<decltype(fs), decltype(fd)>(in, out, map, amount, tables[0], rows.get());
+    with_formats(in, *out, [&](auto fs, auto fd) {
+        auto_levels<decltype(fs), decltype(fd)>(in, *out, map, amount, tables[0], rows.get());
     });
     return 1;
 }
@@ -198,9 +202,9 @@ void ImageAutoGradationProcess1(const Image *src, Image **dst, int32_t, int32_t 
     if (src == nullptr || dst == nullptr || !rows_inside(src)) return;
     const ReadView view(src);
     if (!view.ok()) return;
-    Image *out = prepare_slot(src, dst);
-    if (!has_pixels(out)) return;
-    const Image *in = view.get();
+    const std::optional<View> out = view_of(prepare_slot(src, dst));
+    if (!out) return;
+    const View &in = view.view();
     uint8_t gamma[256];
     if (gammaFlag != 0)
         BuildTable(gamma, 0.8333333f);
@@ -210,13 +214,13 @@ void ImageAutoGradationProcess1(const Image *src, Image **dst, int32_t, int32_t 
     // The stretch of the brighter half would be written first and then
     // overwritten everywhere by the darker half's, so only the latter is made.
     int64_t green[256] = {}, dark[256] = {};
-    with_format(in->bitCount, [&](auto f) { green_and_dark_histograms<decltype(f)>(in, green, dark); });
+    with_format(in.bitCount, [&](auto f) { green_and_dark_histograms<decltype(f)>(in, green, dark); });
     int32_t map[256];
     make_mapping(dark, 0.0f, 0.0f, map);
     uint8_t table[256];
     for (int32_t i = 0; i < 256; ++i)
         table[i] = gamma[map[i]];
-    map_channels(in, out, {table, table, table});
+    map_channels(in, *out, {table, table, table});
 }
 
 } // extern "C"

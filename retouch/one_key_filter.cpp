@@ -22,17 +22,17 @@ using Hist = rank::GroupedHistogram<256, uint8_t>;
 
 // Column histograms slide down one row per output row; the histogram of the
 // 15 pixels of the centre row slides along it.
-void cross_median(const Image *src, Image *res, Hist *cols) {
-    const int32_t w = src->width, h = src->height;
+void cross_median(const View &src, const View &res, Hist *cols) {
+    const int32_t w = src.width, h = src.height;
     if (h < 2 * kArm + 3 || w < 2 * kArm + 2) return;
     for (int32_t x = kArm; x <= w - 9; ++x)
         for (int32_t y = 0; y < 2 * kArm + 1; ++y)
-            cols[x].add(row_ptr(src, y)[x]);
+            cols[x].add(src.row(y)[x]);
     Hist row;
     for (int32_t y = kArm + 1; y < h - kArm - 1; ++y) {
-        const uint8_t *leaving = row_ptr(src, y - kArm - 1), *entering = row_ptr(src, y + kArm);
-        const uint8_t *r = row_ptr(src, y);
-        uint8_t *out = row_ptr(res, y);
+        const uint8_t *leaving = src.row(y - kArm - 1), *entering = src.row(y + kArm);
+        const uint8_t *r = src.row(y);
+        uint8_t *out = res.row(y);
         row.reset();
         for (int32_t i = 0; i < 2 * kArm; ++i)
             row.add(r[i]);
@@ -53,16 +53,18 @@ void cross_median(const Image *src, Image *res, Hist *cols) {
 extern "C" {
 
 int32_t MyOneKeyFliter(Image *src, Image **dst) {
-    if (!is_plane(src)) return 0;
-    const int32_t w = src->width, h = src->height;
+    const std::optional<View> in = plane_view_of(src);
+    if (!in) return 0;
+    const int32_t w = in->width, h = in->height;
     ImagePtr res = make_image(w, h, 8);
-    if (!res) return 0;
+    const std::optional<View> out = view_of(res.get());
+    if (!out) return 0;
     Buffer<Hist> cols = alloc_zeroed<Hist>(static_cast<size_t>(w));
     if (!cols) return 0;
-    cross_median(src, res.get(), cols.get());
+    cross_median(*in, *out, cols.get());
     if (dst == nullptr) {
         for (int32_t y = kArm + 1; y < h - kArm - 1 && w > 2 * kArm + 1; ++y)
-            std::memcpy(row_ptr(src, y) + kArm, row_ptr(res.get(), y) + kArm, static_cast<size_t>(w - 2 * kArm - 1));
+            std::memcpy(in->row(y) + kArm, out->row(y) + kArm, static_cast<size_t>(w - 2 * kArm - 1));
     } else if (*dst == nullptr) {
         *dst = res.release();
     } else {

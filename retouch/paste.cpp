@@ -59,13 +59,13 @@ constexpr int64_t kMaxSteppedOffset = 46340; // 2 * 46340^2 < 2^32
 // Pixel layout of a paste: bytes per destination and source pixel, colour
 // bytes, and whether the alpha byte follows the source inside the brush.
 template <int DS, int SS, int NC, bool Alpha, class Rule, class T>
-void paste_rect(Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t x0, int32_t x1, int32_t y0, int32_t y1,
-                const Ring<T> &g, T level) {
+void paste_rect(const View &dst, const View &src, int32_t cx, int32_t cy, int32_t x0, int32_t x1, int32_t y0,
+                int32_t y1, const Ring<T> &g, T level) {
     const bool stepped = std::max<int64_t>(std::abs(x0 - cx), std::abs(x1 - cx)) <= kMaxSteppedOffset &&
                          std::max<int64_t>(std::abs(y0 - cy), std::abs(y1 - cy)) <= kMaxSteppedOffset;
     for (int32_t y = y0; y <= y1; ++y) {
-        uint8_t *o = row_ptr(dst, y);
-        const uint8_t *s = row_ptr(src, y);
+        uint8_t *o = dst.row(y);
+        const uint8_t *s = src.row(y);
         const int32_t dy = std::abs(y - cy);
         RowDistance root{distance2d(std::abs(x0 - cx), dy)};
         for (int32_t x = x0; x <= x1; ++x) {
@@ -84,6 +84,20 @@ void paste_rect(Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t x0
             if constexpr (Alpha) op[3] = sp[3];
         }
     }
+}
+
+// The source block as a paste reads it, in the destination's layout: its
+// rows of `pitch` bytes hold pitch / bytes pixels of `bytes` bytes, whatever
+// the source's own width and bit count. Nothing for a source without a block
+// or without rows. The block claim must have been checked (block_claim_ok).
+std::optional<View> layout_view(const Image *src, int32_t bytes) {
+    if (src->bits == nullptr || src->height <= 0) return std::nullopt;
+    return View{src->bits,
+                src->pitch,
+                static_cast<int32_t>(src->pitch / static_cast<uint32_t>(bytes)),
+                src->height,
+                static_cast<uint32_t>(bytes) * 8,
+                nullptr};
 }
 
 template <class Rule>
@@ -106,12 +120,12 @@ int32_t paste(Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t r, d
     // The source is read in the destination's layout; rows and columns it
     // does not hold (none without a pixel block) are left unchanged, and a
     // destination without a block takes nothing.
-    if (dst->bits == nullptr || src->bits == nullptr) return 1;
-    const int64_t srcCols = src->pitch / ss;
+    const std::optional<View> to = view_of(dst), from = layout_view(src, ss);
+    if (!to || !from) return 1;
     const int64_t x0 = std::max<int64_t>(static_cast<int64_t>(cx) - r, 0);
-    const int64_t x1 = std::min<int64_t>({static_cast<int64_t>(cx) + r, w - 1, srcCols - 1});
+    const int64_t x1 = std::min<int64_t>({static_cast<int64_t>(cx) + r, w - 1, from->width - 1});
     const int64_t y0 = std::max<int64_t>(static_cast<int64_t>(cy) - r, 0);
-    const int64_t y1 = std::min<int64_t>({static_cast<int64_t>(cy) + r, h - 1, src->height - 1});
+    const int64_t y1 = std::min<int64_t>({static_cast<int64_t>(cy) + r, h - 1, from->height - 1});
     if (x0 > x1 || y0 > y1) return 1;
     int64_t ri = static_cast<int32_t>(innerFactor * r), rw = r - ri;
     if (rw < 2) {
@@ -124,14 +138,14 @@ int32_t paste(Image *dst, const Image *src, int32_t cx, int32_t cy, int32_t r, d
         using T = decltype(zero);
         const Ring<T> g{static_cast<T>(r), static_cast<T>(ri), static_cast<T>(rw)};
         const T lv = static_cast<T>(level);
-        if (dst->bitCount == 8)
-            paste_rect<1, 1, 1, false, Rule>(dst, src, cx, cy, a, b, c, e, g, lv);
-        else if (dst->bitCount == 24)
-            paste_rect<3, 3, 3, false, Rule>(dst, src, cx, cy, a, b, c, e, g, lv);
+        if (to->bitCount == 8)
+            paste_rect<1, 1, 1, false, Rule>(*to, *from, cx, cy, a, b, c, e, g, lv);
+        else if (to->bitCount == 24)
+            paste_rect<3, 3, 3, false, Rule>(*to, *from, cx, cy, a, b, c, e, g, lv);
         else if (ss == 4)
-            paste_rect<4, 4, 3, true, Rule>(dst, src, cx, cy, a, b, c, e, g, lv);
+            paste_rect<4, 4, 3, true, Rule>(*to, *from, cx, cy, a, b, c, e, g, lv);
         else
-            paste_rect<4, 3, 3, false, Rule>(dst, src, cx, cy, a, b, c, e, g, lv);
+            paste_rect<4, 3, 3, false, Rule>(*to, *from, cx, cy, a, b, c, e, g, lv);
     };
     if (r <= kNarrowRadius && level >= -kNarrowLevel && level <= kNarrowLevel)
         run(int32_t{0});

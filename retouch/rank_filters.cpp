@@ -25,22 +25,23 @@ int32_t window_hi(int32_t size) { return size - size / 2 - 1; }
 
 // The index plane MoreLight reads: 8-bit pictures directly, 1- and 4-bit ones
 // through GetPixelIndex into `own`; null when every index reads 0.
-const uint8_t *index_plane(const Image *src, Buffer<uint8_t> &own, size_t &stride, bool &failed) {
+const uint8_t *index_plane(const View &src, Buffer<uint8_t> &own, size_t &stride, bool &failed) {
     failed = false;
-    if (src->bitCount == 8) {
-        stride = src->pitch;
-        return src->bits;
+    if (src.bitCount == 8) {
+        stride = src.pitch;
+        return src.bits;
     }
-    if (src->bitCount != 1 && src->bitCount != 4) return nullptr;
-    own = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(src->width), static_cast<uint64_t>(src->height)));
+    if (src.bitCount != 1 && src.bitCount != 4) return nullptr;
+    const int32_t w = src.width, h = src.height;
+    own = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h)));
     if (!own) {
         failed = true;
         return nullptr;
     }
-    stride = static_cast<size_t>(src->width);
-    for (int32_t y = 0; y < src->height; ++y)
-        for (int32_t x = 0; x < src->width; ++x)
-            own[static_cast<size_t>(y) * stride + x] = static_cast<uint8_t>(GetPixelIndex(src, x, y));
+    stride = static_cast<size_t>(w);
+    for (int32_t y = 0; y < h; ++y)
+        for (int32_t x = 0; x < w; ++x)
+            own[static_cast<size_t>(y) * stride + x] = static_cast<uint8_t>(GetPixelIndex(src.record, x, y));
     return own.get();
 }
 
@@ -72,18 +73,20 @@ int32_t getpos(const int32_t *values, int32_t count, int32_t value) {
 int32_t Best_Color(Image *img, int32_t size) {
     if (img == nullptr || img->bits == nullptr || size > kMaxBestColorSize || img->bitCount != 8 || !rows_inside(img))
         return 0;
-    const int32_t w = img->width, h = img->height;
-    if (w <= 0 || h <= 0) return 1;
+    // Without pixel rows there is nothing to rank.
+    const std::optional<View> v = view_of(img);
+    if (!v) return 1;
+    const int32_t w = v->width, h = v->height;
     if (size < 2) {
         // One value or none: the third place of the cleared list is 0.
         for (int32_t y = 0; y < h; ++y)
-            std::memset(row_ptr(img, y), 0, static_cast<size_t>(w));
+            std::memset(v->row(y), 0, static_cast<size_t>(w));
         return 1;
     }
     // Third largest of every window, gathered offset by offset over whole
     // padded rows: each row keeps its three largest values so far.
     const size_t pw = static_cast<size_t>(w) + size - 1;
-    Buffer<uint8_t> pad = padded_plane(img->bits, img->pitch, w, h, window_lo(size), size);
+    Buffer<uint8_t> pad = padded_plane(v->bits, v->pitch, w, h, window_lo(size), size);
     Buffer<uint8_t> rows = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(w), 3));
     if (!pad || !rows) return 0;
     uint8_t *first = rows.get(), *second = first + w, *third = second + w;
@@ -99,7 +102,7 @@ int32_t Best_Color(Image *img, int32_t size) {
                     first[x] = std::max(first[x], v);
                 }
             }
-        std::memcpy(row_ptr(img, y), third, static_cast<size_t>(w));
+        std::memcpy(v->row(y), third, static_cast<size_t>(w));
     }
     return 1;
 }
@@ -112,8 +115,8 @@ void MoreLight(const Image *src, int32_t size, Image **dst) {
     }
     const ReadView view(src);
     if (!view.ok()) return;
-    const Image *in = view.get();
-    const int32_t w = src->width, h = src->height;
+    const View &in = view.view();
+    const int32_t w = in.width, h = in.height;
     Buffer<uint8_t> own;
     size_t stride = 0;
     bool failed = false;
@@ -145,10 +148,10 @@ void MoreLight(const Image *src, int32_t size, Image **dst) {
     }
     // The result is prepared only once the lift map stands, so a call short
     // of working memory leaves the slot as it was.
-    Image *out = prepare_slot(src, dst);
-    if (!has_pixels(out)) return;
-    with_formats(in, out, [&](auto fs, auto fd) {
-        lift_pixels<decltype(fs), decltype(fd)>(in, out, lift.get(), static_cast<size_t>(w), kLiftWeight, kLiftWeight,
+    const std::optional<View> out = view_of(prepare_slot(src, dst));
+    if (!out) return;
+    with_formats(in, *out, [&](auto fs, auto fd) {
+        lift_pixels<decltype(fs), decltype(fd)>(in, *out, lift.get(), static_cast<size_t>(w), kLiftWeight, kLiftWeight,
                                                 kLiftWeight);
     });
 }

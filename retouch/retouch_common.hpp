@@ -76,12 +76,14 @@ inline uint32_t lift_channel(uint32_t c, uint32_t d, double weight) {
 // Writes every pixel of src to dst, raising blue, green and red of the pixels
 // whose amount byte d is non-zero by wb d, wg d and wr d; alpha kept.
 template <class FS, class FD>
-void lift_pixels(const Image *src, Image *dst, const uint8_t *amount, size_t stride, double wb, double wg, double wr) {
-    for (int32_t y = 0; y < src->height; ++y) {
+void lift_pixels(const View &src, const View &dst, const uint8_t *amount, size_t stride, double wb, double wg,
+                 double wr) {
+    const int32_t w = src.width, h = src.height;
+    for (int32_t y = 0; y < h; ++y) {
         const typename FS::CRow in = FS::crow(src, y);
         const typename FD::Row out = FD::row(dst, y);
         const uint8_t *a = amount + static_cast<size_t>(y) * stride;
-        for (int32_t x = 0; x < src->width; ++x) {
+        for (int32_t x = 0; x < w; ++x) {
             uint32_t c = FS::load(in, x);
             if (a[x] != 0)
                 c = pack(lift_channel(blue_of(c), a[x], wb), lift_channel(green_of(c), a[x], wg),

@@ -15,11 +15,12 @@ namespace {
 constexpr int32_t kMinRun = 20;
 constexpr int32_t kErodeHalf = 5;
 
-template <class F> void colour_rule(const Image *src, Image *mask) {
-    for (int32_t y = 0; y < src->height; ++y) {
+template <class F> void colour_rule(const View &src, const View &mask) {
+    const int32_t w = src.width, h = src.height;
+    for (int32_t y = 0; y < h; ++y) {
         const typename F::CRow in = F::crow(src, y);
-        uint8_t *m = row_ptr(mask, y);
-        for (int32_t x = 0; x < src->width; ++x) {
+        uint8_t *m = mask.row(y);
+        for (int32_t x = 0; x < w; ++x) {
             const uint32_t c = F::load(in, x);
             const uint32_t b = blue_of(c), g = green_of(c), r = red_of(c);
             m[x] = r >= g && r >= b && r > 49 ? static_cast<uint8_t>(g) : 0;
@@ -29,10 +30,10 @@ template <class F> void colour_rule(const Image *src, Image *mask) {
 
 // Runs shorter than kMinRun end at a zero byte or at the last column; the
 // last column itself is never counted.
-void remove_short_runs(Image *mask) {
-    const int32_t w = mask->width;
-    for (int32_t y = 0; y < mask->height; ++y) {
-        uint8_t *m = row_ptr(mask, y);
+void remove_short_runs(const View &mask) {
+    const int32_t w = mask.width, h = mask.height;
+    for (int32_t y = 0; y < h; ++y) {
+        uint8_t *m = mask.row(y);
         int32_t run = 0;
         for (int32_t x = 0; x < w; ++x) {
             if (m[x] != 0 && x < w - 1) {
@@ -54,8 +55,8 @@ void remove_short_runs(Image *mask) {
 // the rows below, at and right of x in row y, and in the border band (outside
 // the visited rectangle) in row y to the left and in the rows above. These
 // counts come from a summed-area table of the original zeros.
-bool erode(Image *mask) {
-    const int32_t w = mask->width, h = mask->height;
+bool erode(const View &mask) {
+    const int32_t w = mask.width, h = mask.height;
     const int32_t x0 = kErodeHalf, x1 = w - kErodeHalf - 1, y0 = kErodeHalf, y1 = h - kErodeHalf - 1;
     if (x1 <= x0 || y1 <= y0) return true;
     const size_t sw = static_cast<size_t>(w) + 1;
@@ -65,7 +66,7 @@ bool erode(Image *mask) {
     for (size_t i = 0; i < sw; ++i)
         s[i] = 0;
     for (int32_t y = 0; y < h; ++y) {
-        const uint8_t *m = row_ptr(mask, y);
+        const uint8_t *m = mask.row(y);
         uint32_t *prev = s + static_cast<size_t>(y) * sw, *cur = prev + sw;
         uint32_t run = 0;
         cur[0] = 0;
@@ -82,7 +83,7 @@ bool erode(Image *mask) {
     };
     auto clip = [](int32_t v, int32_t lo, int32_t hi) { return v < lo ? lo : (v > hi ? hi : v); };
     for (int32_t y = y0; y < y1; ++y) {
-        uint8_t *m = row_ptr(mask, y);
+        uint8_t *m = mask.row(y);
         const int32_t above = y - kErodeHalf;
         const int32_t aboveInner = clip(above, y0, y); // rows [aboveInner, y) are visited rows
         for (int32_t x = x0; x < x1; ++x) {
@@ -99,10 +100,11 @@ bool erode(Image *mask) {
     return true;
 }
 
-void clear_marks(Image *mask) {
-    for (int32_t y = 1; y < mask->height - 1; ++y) {
-        uint8_t *m = row_ptr(mask, y);
-        for (int32_t x = 1; x < mask->width - 1; ++x)
+void clear_marks(const View &mask) {
+    const int32_t w = mask.width, h = mask.height;
+    for (int32_t y = 1; y < h - 1; ++y) {
+        uint8_t *m = mask.row(y);
+        for (int32_t x = 1; x < w - 1; ++x)
             if (m[x] == 1) m[x] = 0;
     }
 }
@@ -115,11 +117,14 @@ int32_t CreateFaceMaskImg(const Image *src, Image **mask) {
     if (src == nullptr || src->bits == nullptr || mask == nullptr || !rows_inside(src)) return 0;
     free_Image(mask, 0);
     ImagePtr m = make_image(src->width, src->height, 8);
-    if (!m) return 0;
-    with_format(src->bitCount, [&](auto f) { colour_rule<decltype(f)>(src, m.get()); });
-    remove_short_runs(m.get());
-    if (!erode(m.get())) return 0;
-    clear_marks(m.get());
+    // A source with a block and the sizes of a mask that could be made has
+    // pixels.
+    const std::optional<View> in = view_of(src), out = view_of(m.get());
+    if (!in || !out) return 0;
+    with_format(in->bitCount, [&](auto f) { colour_rule<decltype(f)>(*in, *out); });
+    remove_short_runs(*out);
+    if (!erode(*out)) return 0;
+    clear_marks(*out);
     *mask = m.release();
     return 1;
 }

@@ -28,16 +28,16 @@ constexpr double kSpotBlue = 0.8, kSpotGreen = 0.8, kSpotRed = 0.7;
 // minus the centre, where at least kMinBrighter values exceed a non-zero
 // centre. Rows are gathered offset by offset on an edge-padded copy, so the
 // inner loops run over whole rows of bytes.
-bool spot_map(const Image *mask, uint8_t *spots) {
+bool spot_map(const View &mask, uint8_t *spots) {
     constexpr int32_t side = 2 * kSpotHalf + 1;
-    const int32_t w = mask->width, h = mask->height;
+    const int32_t w = mask.width, h = mask.height;
     const size_t pw = static_cast<size_t>(w) + side - 1;
-    Buffer<uint8_t> pad = padded_plane(mask->bits, mask->pitch, w, h, -kSpotHalf, side);
+    Buffer<uint8_t> pad = padded_plane(mask.bits, mask.pitch, w, h, -kSpotHalf, side);
     Buffer<uint8_t> rows = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(w), 3));
     if (!pad || !rows) return false;
     uint8_t *first = rows.get(), *second = first + w, *above = second + w;
     for (int32_t y = 0; y < h; ++y) {
-        const uint8_t *centre = row_ptr(mask, y);
+        const uint8_t *centre = mask.row(y);
         std::memset(rows.get(), 0, static_cast<size_t>(w) * 3);
         for (int32_t dy = 0; dy < side; ++dy)
             for (int32_t dx = 0; dx < side; ++dx) {
@@ -67,22 +67,25 @@ int32_t alg_Img_smooth_1(const Image *src, Image **dst) {
     const int32_t w = src->width, h = src->height;
     Buffer<uint8_t> spots = alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h)));
     if (!spots) return 0;
-    if (!has_pixels(out)) return 1;
+    const std::optional<View> to = view_of(out);
+    if (!to) return 1;
     // A source without pixels has no mask: no spots, and it reads as 0. A
     // mask that cannot be made otherwise fails the call like the spot map:
     // left unchecked, it would read as no skin and pass the source off as
     // smoothed.
-    const ReadView in(src);
-    if (!in.ok()) return 0;
-    if (src->bits != nullptr) {
+    const ReadView view(src);
+    if (!view.ok()) return 0;
+    if (view_of(src)) {
         Image *mask = nullptr;
-        const bool ok = CreateFaceMaskImg(src, &mask) && spot_map(mask, spots.get());
+        const std::optional<View> m = CreateFaceMaskImg(src, &mask) ? view_of(mask) : std::nullopt;
+        const bool ok = m && spot_map(*m, spots.get());
         free_Image(&mask, 0);
         if (!ok) return 0;
     }
-    with_formats(in.get(), out, [&](auto fs, auto fd) {
-        lift_pixels<decltype(fs), decltype(fd)>(in.get(), out, spots.get(), static_cast<size_t>(w), kSpotBlue,
-                                                kSpotGreen, kSpotRed);
+    const View &in = view.view();
+    with_formats(in, *to, [&](auto fs, auto fd) {
+        lift_pixels<decltype(fs), decltype(fd)>(in, *to, spots.get(), static_cast<size_t>(w), kSpotBlue, kSpotGreen,
+                                                kSpotRed);
     });
     return 1;
 }
@@ -104,9 +107,10 @@ int32_t alg_Img_Skin(const Image *src, Image **dst, int32_t lighten) {
     // left in the slot, also a prepared image it could not write.
     alg_Img_smooth_1(src, dst);
     Image *out = *dst;
-    if (!has_pixels(out)) return 1;
+    const std::optional<View> v = view_of(out);
+    if (!v) return 1;
     const int32_t lightUps = lighten != 0 ? 2 : 1;
-    if (out->bitCount == 8 || out->bitCount == 24 || out->bitCount == 32) {
+    if (v->bitCount == 8 || v->bitCount == 24 || v->bitCount == 32) {
         // Byte channels store every intermediate value exactly, so the
         // brightening passes and the tone curve fold into one table.
         uint8_t table[256];
@@ -116,18 +120,18 @@ int32_t alg_Img_Skin(const Image *src, Image **dst, int32_t lighten) {
                 v = ZANTOMOPI[v];
             table[i] = tone[v];
         }
-        map_channels(out, out, {table, table, table});
+        map_channels(*v, *v, {table, table, table});
         return 1;
     }
     for (int32_t k = 0; k < lightUps; ++k)
         LightUP(out);
-    map_channels(out, out, {tone, tone, tone});
+    map_channels(*v, *v, {tone, tone, tone});
     return 1;
 }
 
 int32_t LightUP(Image *img) {
     if (img == nullptr || !rows_inside(img)) return 0;
-    if (has_pixels(img)) map_channels(img, img, {ZANTOMOPI, ZANTOMOPI, ZANTOMOPI});
+    if (const std::optional<View> v = view_of(img)) map_channels(*v, *v, {ZANTOMOPI, ZANTOMOPI, ZANTOMOPI});
     return 1;
 }
 

@@ -40,11 +40,11 @@ Curves make_curves(int32_t amount) {
 // taps: offsets (from -size) of the non-zero kernel weights, in order;
 // colours and dark: room for a row padded by size on both sides.
 template <class FS, class FD>
-void blur_rows(const Image *src, Image *out, int32_t size, const int32_t *taps, int32_t ntaps, const Curves &cv,
+void blur_rows(const View &src, const View &out, int32_t size, const int32_t *taps, int32_t ntaps, const Curves &cv,
                uint32_t *colours, uint8_t *dark) {
-    const int32_t w = src->width;
+    const int32_t w = src.width, h = src.height;
     const size_t padded = static_cast<size_t>(w) + 2 * static_cast<size_t>(size);
-    for (int32_t y = 0; y < src->height; ++y) {
+    for (int32_t y = 0; y < h; ++y) {
         const typename FS::CRow in = FS::crow(src, y);
         for (size_t i = 0; i < padded; ++i) {
             const int64_t x = static_cast<int64_t>(i) - size;
@@ -84,15 +84,16 @@ void thresholdBlur(int32_t, int32_t, int32_t size, int32_t amount, const Image *
     Buffer<uint32_t> colours = alloc_buffer<uint32_t>(padded);
     Buffer<uint8_t> dark = alloc_buffer<uint8_t>(padded);
     if (!view.ok() || !colours || !dark) return;
-    Image *out = prepare_slot(src, dst);
-    if (!has_pixels(out)) return;
+    const std::optional<View> out = view_of(prepare_slot(src, dst));
+    if (!out) return;
     int32_t taps[21], ntaps = 0;
     for (int32_t k = 0; k <= 2 * size; ++k)
         if (matrixX[size - 1][k] != 0.0f) taps[ntaps++] = k;
     const Curves cv = make_curves(amount);
     if (ntaps == 0) return;
-    with_formats(view.get(), out, [&](auto fs, auto fd) {
-        blur_rows<decltype(fs), decltype(fd)>(view.get(), out, size, taps, ntaps, cv, colours.get(), dark.get());
+    const View &in = view.view();
+    with_formats(in, *out, [&](auto fs, auto fd) {
+        blur_rows<decltype(fs), decltype(fd)>(in, *out, size, taps, ntaps, cv, colours.get(), dark.get());
     });
 }
 

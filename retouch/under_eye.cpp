@@ -43,9 +43,9 @@ struct Crescent {
     }
 };
 
-template <class F> void lighten_crescent(Image *img, const Crescent &k, int64_t cy) {
-    const int64_t y0 = std::max<int64_t>(cy - 3 * k.u, 0), y1 = std::min<int64_t>(cy, img->height - 1);
-    const int64_t x0 = std::max<int64_t>(k.cx - 2 * k.u, 0), x1 = std::min<int64_t>(k.cx + 2 * k.u, img->width - 1);
+template <class F> void lighten_crescent(const View &img, const Crescent &k, int64_t cy) {
+    const int64_t y0 = std::max<int64_t>(cy - 3 * k.u, 0), y1 = std::min<int64_t>(cy, img.height - 1);
+    const int64_t x0 = std::max<int64_t>(k.cx - 2 * k.u, 0), x1 = std::min<int64_t>(k.cx + 2 * k.u, img.width - 1);
     for (int64_t y = y1; y >= y0; --y) {
         const typename F::CRow in = F::crow(img, static_cast<int32_t>(y));
         const typename F::Row out = F::row(img, static_cast<int32_t>(y));
@@ -63,7 +63,7 @@ template <class F> void lighten_crescent(Image *img, const Crescent &k, int64_t 
 
 // Raises blue, green and red of every pixel by level, capped at 255 (a
 // negative level keeps the low byte).
-void brighten(Image *img, int32_t level) {
+void brighten(const View &img, int32_t level) {
     uint8_t table[256];
     for (int32_t i = 0; i < 256; ++i) {
         const int64_t v = static_cast<int64_t>(i) + level;
@@ -81,9 +81,10 @@ bool brushable(const Image *img) {
 // A new brightened copy of the picture tagged with level, or null.
 Image *brightened_copy(const Image *img, int32_t level) {
     ImagePtr copy = make_image(img->width, img->height, static_cast<int32_t>(img->bitCount));
-    if (!copy) return nullptr;
+    const std::optional<View> v = view_of(copy.get());
+    if (!v) return nullptr;
     PX_Img_Copy(copy.get(), img);
-    brighten(copy.get(), level);
+    brighten(*v, level);
     copy->tag = static_cast<uint32_t>(level);
     return copy.release();
 }
@@ -93,17 +94,18 @@ Image *brightened_copy(const Image *img, int32_t level) {
 extern "C" {
 
 void alg_Img_quheiyanquan_ellipse(Image *img, int32_t cx, int32_t cy, int32_t strength) {
-    if (!has_pixels(img)) return;
+    const std::optional<View> v = view_of(img);
+    if (!v) return;
     const int64_t s = clamp_to(strength, 0, 10);
-    const int64_t u = std::max<int64_t>(img->width / 24, 4);
+    const int64_t u = std::max<int64_t>(v->width / 24, 4);
     Crescent k{cx, u, static_cast<int64_t>(cy) - u, static_cast<int64_t>(cy) + u, 0, s / 10};
     const int64_t refRow = k.yA - u - u / 2;
-    const int32_t rx = static_cast<int32_t>(std::clamp<int64_t>(cx, 0, img->width - 1));
-    const int32_t ry = static_cast<int32_t>(std::clamp<int64_t>(refRow, 0, img->height - 1));
-    with_format(img->bitCount, [&](auto fmt) {
+    const int32_t rx = static_cast<int32_t>(std::clamp<int64_t>(cx, 0, v->width - 1));
+    const int32_t ry = static_cast<int32_t>(std::clamp<int64_t>(refRow, 0, v->height - 1));
+    with_format(v->bitCount, [&](auto fmt) {
         using F = decltype(fmt);
-        k.yr = luminance(F::load(F::crow(img, ry), rx));
-        lighten_crescent<F>(img, k, cy);
+        k.yr = luminance(F::load(F::crow(*v, ry), rx));
+        lighten_crescent<F>(*v, k, cy);
     });
 }
 
@@ -116,7 +118,7 @@ int32_t alg_QuHeiYanQuan(Image *img, int32_t cx, int32_t cy, int32_t r, int32_t 
         copy = *cache;
         if (refresh != 0) {
             PX_Img_Copy(copy, img);
-            if (has_pixels(copy)) brighten(copy, level);
+            if (const std::optional<View> v = view_of(copy)) brighten(*v, level);
         }
     } else {
         if (cache != nullptr) free_Image(cache, 0);

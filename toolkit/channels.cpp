@@ -13,10 +13,13 @@ int32_t PXImage_BlueEnhancement(PXImage *img) {
     if (img == nullptr || img->data == nullptr || !px_rows_inside(img)) return 0;
     if (img->bitcount == 8 || img->bitcount == 16) return 1;
     if (img->bitcount != 24) return 0;
-    // An image without pixel rows has no byte to invert: n is 0.
-    const size_t n = px_held(img);
-    for (size_t i = 0; i < n; ++i)
-        img->data[i] = static_cast<uint8_t>(255 - img->data[i]);
+    // An image without pixel rows has no byte to invert.
+    if (const std::optional<View> v = view_of(img)) {
+        uint8_t *d = v->bits;
+        const size_t n = v->block_bytes();
+        for (size_t i = 0; i < n; ++i)
+            d[i] = static_cast<uint8_t>(255 - d[i]);
+    }
     return 1;
 }
 
@@ -28,12 +31,11 @@ int32_t PXImage_GreenChannel(PXImage *img) {
     // for a count of 0 or below (0). With both sizes negative it would, no
     // pixel is visited, and copying the unwritten scratch back is left out
     // (1, image unchanged).
-    if (!px_usable(img)) {
-        return buffer_size_ok(block_size(img->width, img->height, size)) ? 1 : 0;
-    }
+    const std::optional<View> v = view_of(img);
+    if (!v) return buffer_size_ok(block_size(img->width, img->height, size)) ? 1 : 0;
     const auto bpp = static_cast<size_t>(size);
-    const size_t pixels = px_block(img) / bpp;
-    uint8_t *p = img->data;
+    const size_t pixels = v->block_bytes() / bpp;
+    uint8_t *p = v->bits;
     for (size_t i = 0; i < pixels; ++i, p += bpp)
         p[0] = p[2] = p[1];
     return 1;

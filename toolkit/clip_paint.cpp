@@ -111,23 +111,26 @@ extern "C" {
 
 PXImage *PXImage_Effect_Clip(const PXImage *photo, const PXImage *frame) {
     if (photo == nullptr || !px_rows_inside(photo) || (photo->bitcount != 8 && photo->bitcount != 24)) return nullptr;
-    if (!px_usable(frame) || frame->bitcount != 24 || frame->width < kWindowLeft + kWindowCols ||
-        frame->height < kWindowTop + kWindowRows)
+    const std::optional<View> fv = view_of(frame);
+    if (!fv || fv->bitCount != 24 || fv->width < kWindowLeft + kWindowCols || fv->height < kWindowTop + kWindowRows)
         return nullptr;
-    PXImage *out = px_new(frame->width, frame->height, 24);
-    if (out == nullptr) return nullptr;
-    std::memcpy(out->data, frame->data, px_block(frame));
-    const int32_t pb = px_bytes(photo->bitcount);
+    PXImage *out = px_new(fv->width, fv->height, 24);
+    const std::optional<View> ov = view_of(out);
+    if (!ov) return nullptr;
+    std::memcpy(ov->bits, fv->bits, fv->block_bytes());
     // A photo without data or pixel rows has no pixel to show: the frame stays.
-    const size_t photoPixels = px_held(photo) / static_cast<size_t>(pb);
-    for (int32_t r = 0; r < kWindowRows && photoPixels != 0; ++r) {
-        uint8_t *row = out->data + (static_cast<size_t>(kWindowTop + r) * frame->width + kWindowLeft) * 3;
-        const size_t photoRow = static_cast<size_t>(r) * static_cast<size_t>(photo->width);
+    const std::optional<View> pv = view_of(photo);
+    if (!pv) return out;
+    const int32_t pb = px_bytes(photo->bitcount);
+    const size_t photoPixels = pv->block_bytes() / static_cast<size_t>(pb);
+    for (int32_t r = 0; r < kWindowRows; ++r) {
+        uint8_t *row = ov->row(kWindowTop + r) + static_cast<size_t>(kWindowLeft) * 3;
+        const size_t photoRow = static_cast<size_t>(r) * static_cast<size_t>(pv->width);
         for (int32_t c = 0; c < kWindowCols; ++c) {
             uint8_t *px = row + static_cast<size_t>(c) * 3;
             const size_t p = photoRow + static_cast<size_t>(c);
             if (px[2] >= kHoleLevel || p >= photoPixels) continue;
-            const uint8_t *from = photo->data + p * pb;
+            const uint8_t *from = pv->bits + p * pb;
             if (pb == 1) {
                 px[0] = px[1] = px[2] = from[0];
             } else {
@@ -141,19 +144,20 @@ PXImage *PXImage_Effect_Clip(const PXImage *photo, const PXImage *frame) {
 }
 
 int32_t PXImage_Effect_Paint(PXImage *img) {
-    if (!px_usable(img)) return 0;
-    if (img->bitcount == 8) {
-        gray_stretch(img->data, img->width, img->height);
+    const std::optional<View> v = view_of(img);
+    if (!v) return 0;
+    if (v->bitCount == 8) {
+        gray_stretch(v->bits, v->width, v->height);
         return 0;
     }
-    if (img->bitcount != 24) return 0;
-    const size_t pixels = static_cast<size_t>(img->width) * static_cast<size_t>(img->height);
+    if (v->bitCount != 24) return 0;
+    const size_t pixels = static_cast<size_t>(v->width) * static_cast<size_t>(v->height);
     Buffer<uint8_t> green = alloc_buffer<uint8_t>(pixels);
     if (!green) return 0;
-    uint8_t *d = img->data;
+    uint8_t *d = v->bits;
     for (size_t i = 0; i < pixels; ++i)
         green[i] = d[3 * i + 1];
-    gray_stretch(green.get(), img->width, img->height);
+    gray_stretch(green.get(), v->width, v->height);
     for (size_t i = 0; i < pixels; ++i) {
         const int32_t g = green[i];
         d[3 * i] = static_cast<uint8_t>(g == 0 ? 0 : g - 1);

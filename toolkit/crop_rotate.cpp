@@ -28,23 +28,27 @@ constexpr int64_t hold(int64_t v, int64_t n) { return v < 0 ? 0 : (v >= n ? n - 
 
 constexpr int32_t kTile = 32;
 
-// Quarter turn of a w x h picture into rows of `outWidth` pixels, result rows
-// i0 .. i1 - 1 and columns j0 .. j1 - 1. With `clockwise` false result pixel
-// (i, j) is source (j, w - 1 - i); with true it is source (h - 1 - j, i).
+// Quarter turn of a w x h picture into the rows of dst (as many as the
+// source has columns), result rows i0 .. i1 - 1 and columns j0 .. j1 - 1.
+// With `clockwise` false result pixel (i, j) is source (j, w - 1 - i); with
+// true it is source (h - 1 - j, i).
 template <int32_t B>
-void quarter_turn_pixels(const uint8_t *src, int32_t w, int32_t h, uint8_t *dst, int32_t outWidth, bool clockwise,
-                         int32_t i0, int32_t i1, int32_t j0, int32_t j1) {
-    const size_t srcRow = static_cast<size_t>(w) * B, dstRow = static_cast<size_t>(outWidth) * B;
+void quarter_turn_pixels(const View &src, const View &dst, bool clockwise, int32_t i0, int32_t i1, int32_t j0,
+                         int32_t j1) {
+    // Local copies: the byte copies below cannot then change the views, so
+    // their fields stay in registers.
+    const View in = src, out = dst;
+    const int32_t w = in.width, h = in.height;
     for (int32_t ib = i0; ib < i1; ib += kTile) {
         const int32_t iEnd = std::min(i1, ib + kTile);
         for (int32_t jb = j0; jb < j1; jb += kTile) {
             const int32_t jEnd = std::min(j1, jb + kTile);
             for (int32_t i = ib; i < iEnd; ++i) {
-                uint8_t *out = dst + static_cast<size_t>(i) * dstRow;
+                uint8_t *row = out.row(i);
                 for (int32_t j = jb; j < jEnd; ++j) {
                     const int32_t sy = clockwise ? h - 1 - j : j;
                     const int32_t sx = clockwise ? i : w - 1 - i;
-                    std::memcpy(out + static_cast<size_t>(j) * B, src + sy * srcRow + static_cast<size_t>(sx) * B, B);
+                    std::memcpy(row + static_cast<size_t>(j) * B, in.row(sy) + static_cast<size_t>(sx) * B, B);
                 }
             }
         }
@@ -75,8 +79,10 @@ inline void transpose8(uint64_t (&r)[8]) {
 // words, transposed, written as eight result rows. Returns how many result
 // rows (a multiple of 8) and columns were done; the rest is left to the
 // pixel loop.
-template <bool Clockwise>
-void quarter_turn_blocks(const uint8_t *src, int32_t w, int32_t h, uint8_t *dst, int32_t outWidth) {
+template <bool Clockwise> void quarter_turn_blocks(const View &src, const View &dst) {
+    // Local copies, as in quarter_turn_pixels.
+    const View in = src, out = dst;
+    const int32_t w = in.width, h = in.height;
     const int32_t w8 = w / 8 * 8, h8 = h / 8 * 8;
     for (int32_t ib = 0; ib < w8; ib += kTile)
         for (int32_t jb = 0; jb < h8; jb += kTile)
@@ -86,55 +92,55 @@ void quarter_turn_blocks(const uint8_t *src, int32_t w, int32_t h, uint8_t *dst,
                     for (int b = 0; b < 8; ++b) {
                         const int32_t sy = Clockwise ? h - 1 - j0 - b : j0 + b;
                         const int32_t sx = Clockwise ? i0 : w - 8 - i0;
-                        std::memcpy(&r[b], src + static_cast<size_t>(sy) * w + sx, 8);
+                        std::memcpy(&r[b], in.row(sy) + sx, 8);
                     }
                     transpose8(r);
                     for (int a = 0; a < 8; ++a)
-                        std::memcpy(dst + static_cast<size_t>(i0 + a) * outWidth + j0, &r[Clockwise ? a : 7 - a], 8);
+                        std::memcpy(out.row(i0 + a) + j0, &r[Clockwise ? a : 7 - a], 8);
                 }
 }
 
-template <int32_t B>
-void quarter_turn(const uint8_t *src, int32_t w, int32_t h, uint8_t *dst, int32_t outWidth, bool clockwise) {
+// The turn of src into dst, whose rows of dst.width pixels are at least as
+// wide as src is high; the columns right of that are cleared.
+template <int32_t B> void quarter_turn(const View &src, const View &dst, bool clockwise) {
+    const int32_t w = src.width, h = src.height;
     if constexpr (B == 1 && std::endian::native == std::endian::little) {
         if (clockwise)
-            quarter_turn_blocks<true>(src, w, h, dst, outWidth);
+            quarter_turn_blocks<true>(src, dst);
         else
-            quarter_turn_blocks<false>(src, w, h, dst, outWidth);
+            quarter_turn_blocks<false>(src, dst);
         // Result columns h8.. of every row and rows w8.. of the first h8 columns.
         const int32_t w8 = w / 8 * 8, h8 = h / 8 * 8;
-        quarter_turn_pixels<1>(src, w, h, dst, outWidth, clockwise, 0, w, h8, h);
-        quarter_turn_pixels<1>(src, w, h, dst, outWidth, clockwise, w8, w, 0, h8);
+        quarter_turn_pixels<1>(src, dst, clockwise, 0, w, h8, h);
+        quarter_turn_pixels<1>(src, dst, clockwise, w8, w, 0, h8);
     } else {
-        quarter_turn_pixels<B>(src, w, h, dst, outWidth, clockwise, 0, w, 0, h);
+        quarter_turn_pixels<B>(src, dst, clockwise, 0, w, 0, h);
     }
-    if (outWidth > h)
+    if (dst.width > h)
         for (int32_t i = 0; i < w; ++i)
-            std::memset(dst + i * static_cast<size_t>(outWidth) * B + static_cast<size_t>(h) * B, 0,
-                        static_cast<size_t>(outWidth - h) * B);
+            std::memset(dst.row(i) + static_cast<size_t>(h) * B, 0, static_cast<size_t>(dst.width - h) * B);
 }
 
 PXImage *rotate_quarter(const PXImage *src, bool clockwise) {
     if (!turn_input_ok(src)) return nullptr;
-    const int32_t w = src->width, h = src->height;
-    const int64_t outWidth = floor8(int64_t{h} + 7);
-    PXImage *out = px_new(outWidth, w, src->bitcount);
-    // Both sizes negative: no rows to turn, the block stays cleared.
-    if (out == nullptr || w < 0) return out;
-    const auto ow = static_cast<int32_t>(outWidth);
-    switch (src->bitcount) {
-    case 8: quarter_turn<1>(src->data, w, h, out->data, ow, clockwise); break;
-    case 16: quarter_turn<2>(src->data, w, h, out->data, ow, clockwise); break;
-    default: quarter_turn<3>(src->data, w, h, out->data, ow, clockwise); break;
+    PXImage *out = px_new(floor8(int64_t{src->height} + 7), src->width, src->bitcount);
+    // None made, or both sizes negative: no rows to turn, the block stays
+    // cleared. A result with rows has them because the source has.
+    const std::optional<View> to = view_of(out), from = view_of(src);
+    if (!to || !from) return out;
+    switch (from->bitCount) {
+    case 8: quarter_turn<1>(*from, *to, clockwise); break;
+    case 16: quarter_turn<2>(*from, *to, clockwise); break;
+    default: quarter_turn<3>(*from, *to, clockwise); break;
     }
     return out;
 }
 
-template <int32_t B> void half_turn(const uint8_t *src, int32_t w, int32_t h, uint8_t *dst) {
-    const size_t row = static_cast<size_t>(w) * B;
+template <int32_t B> void half_turn(const View &src, const View &dst) {
+    const int32_t w = src.width, h = src.height;
     for (int32_t i = 0; i < h; ++i) {
-        const uint8_t *in = src + static_cast<size_t>(h - 1 - i) * row;
-        uint8_t *out = dst + static_cast<size_t>(i) * row;
+        const uint8_t *in = src.row(h - 1 - i);
+        uint8_t *out = dst.row(i);
         for (int32_t j = 0; j < w; ++j)
             std::memcpy(out + static_cast<size_t>(j) * B, in + static_cast<size_t>(w - 1 - j) * B, B);
     }
@@ -159,21 +165,23 @@ PXImage *PXImage_Crop(const PXImage *src, const PXRect *rect) {
     // An empty width or a height of 0 or below asks for no block (data null)
     // and copies nothing.
     PXImage *out = px_record(W, H, src->bitcount, bytes);
-    if (out == nullptr || bytes <= 0) return out;
+    const std::optional<View> to = view_of(out);
+    if (!to) return out;
     // Each row copy is W pixels from column L of the packed block; past the
     // row end it continues on the next source row. Bytes outside the block
     // read as 0: past its end, and all of them for a source without data or
     // pixel rows (whose held rows can lie before the block).
-    const size_t block = px_held(src), rowBytes = static_cast<size_t>(W) * bpp;
+    const std::optional<View> from = view_of(src);
+    const size_t block = from ? from->block_bytes() : 0, rowBytes = to->pitch;
     for (int64_t r = B; r <= T; ++r) {
-        uint8_t *to = out->data + static_cast<size_t>(r - B) * rowBytes;
+        uint8_t *row = to->row(static_cast<int32_t>(r - B));
         size_t n = 0;
         if (block != 0) {
-            const size_t from = static_cast<size_t>(r * w + L) * bpp;
-            n = std::min(rowBytes, block - from);
-            std::memcpy(to, src->data + from, n);
+            const size_t start = static_cast<size_t>(r * w + L) * bpp;
+            n = std::min(rowBytes, block - start);
+            std::memcpy(row, from->bits + start, n);
         }
-        std::memset(to + n, 0, rowBytes - n);
+        std::memset(row + n, 0, rowBytes - n);
     }
     return out;
 }
@@ -185,12 +193,14 @@ PXImage *PXImage_Rotate270(const PXImage *src) { return rotate_quarter(src, true
 PXImage *PXImage_Rotate180(const PXImage *src) {
     if (!turn_input_ok(src)) return nullptr;
     PXImage *out = px_new(src->width, src->height, src->bitcount);
-    // Both sizes negative: no rows to turn, the block stays cleared.
-    if (out == nullptr || src->width < 0) return out;
-    switch (src->bitcount) {
-    case 8: half_turn<1>(src->data, src->width, src->height, out->data); break;
-    case 16: half_turn<2>(src->data, src->width, src->height, out->data); break;
-    default: half_turn<3>(src->data, src->width, src->height, out->data); break;
+    // None made, or both sizes negative: no rows to turn, the block stays
+    // cleared. A result with rows has them because the source has.
+    const std::optional<View> to = view_of(out), from = view_of(src);
+    if (!to || !from) return out;
+    switch (from->bitCount) {
+    case 8: half_turn<1>(*from, *to); break;
+    case 16: half_turn<2>(*from, *to); break;
+    default: half_turn<3>(*from, *to); break;
     }
     return out;
 }

@@ -37,14 +37,12 @@ bool mask_usable(const Image *mask) { return mask == nullptr || (mask->bitCount 
 
 // Maps the first `bpp * width` bytes of every row through m (bytes of one pixel
 // through m[0], m[1], ... in turn); with a mask, only the pixels of the
-// top-left area common to both records whose mask byte is non-zero. Images
-// and masks without samples leave nothing to map.
-template <int Bpp> void apply(Image *img, const Map *m, const Image *mask) {
-    if (!has_pixels(img) || (mask != nullptr && !has_pixels(mask))) return;
-    const int32_t w = mask ? std::min(mask->width, img->width) : img->width;
-    const int32_t h = mask ? std::min(mask->height, img->height) : img->height;
+// top-left area common to both views whose mask byte is non-zero.
+template <int Bpp> void apply(const View &img, const Map *m, const View *mask) {
+    const int32_t w = mask ? std::min(mask->width, img.width) : img.width;
+    const int32_t h = mask ? std::min(mask->height, img.height) : img.height;
     for (int32_t y = 0; y < h; ++y) {
-        uint8_t *row = row_ptr(img, y);
+        uint8_t *row = img.row(y);
         if (mask == nullptr) {
             const uint8_t *tables[Bpp];
             for (int k = 0; k < Bpp; ++k)
@@ -52,7 +50,7 @@ template <int Bpp> void apply(Image *img, const Map *m, const Image *mask) {
             map_bytes(row, row, static_cast<size_t>(w), Bpp, tables);
             continue;
         }
-        const uint8_t *sel = row_ptr(mask, y);
+        const uint8_t *sel = mask->row(y);
         for (int32_t x = 0; x < w; ++x)
             if (sel[x] != 0)
                 for (int k = 0; k < Bpp; ++k)
@@ -60,7 +58,7 @@ template <int Bpp> void apply(Image *img, const Map *m, const Image *mask) {
     }
 }
 
-void apply_plane(Image *img, const Map &m) { apply<1>(img, &m, nullptr); }
+void apply_plane(const View &img, const Map &m) { apply<1>(img, &m, nullptr); }
 
 // Levels outside 0..255 and the neutral 128 are refused.
 bool level_usable(const Image *img, int32_t level) {
@@ -106,6 +104,9 @@ extern "C" {
 
 int32_t ColorFilter(Image *img, uint32_t colour, const Image *mask) {
     if (!target_ok(img, 8) || !mask_usable(mask)) return 0;
+    // Images and masks without samples leave nothing to map.
+    const std::optional<View> v = view_of(img), sel = view_of(mask);
+    if (!v || (mask != nullptr && !sel)) return 1;
     const float lumf = static_cast<float>(arg_red(colour)) * 0.2992f + static_cast<float>(arg_green(colour)) * 0.5868f +
                        static_cast<float>(arg_blue(colour)) * 0.114f;
     int32_t lum = static_cast<int32_t>(lumf);
@@ -115,39 +116,46 @@ int32_t ColorFilter(Image *img, uint32_t colour, const Image *mask) {
     Map m;
     for (int32_t v = 0; v < 256; ++v)
         m[v] = clamp_u8(v + delta);
-    apply<1>(img, &m, mask);
+    apply<1>(*v, &m, sel ? &*sel : nullptr);
     return 1;
 }
 
 int32_t ColorFilter24(Image *img, uint32_t colour, const Image *mask) {
     if (!target_ok(img, 24) || !mask_usable(mask)) return 0;
+    // Images and masks without samples leave nothing to map.
+    const std::optional<View> v = view_of(img), sel = view_of(mask);
+    if (!v || (mask != nullptr && !sel)) return 1;
     const uint32_t target[3] = {static_cast<uint32_t>(arg_blue(colour)), static_cast<uint32_t>(arg_green(colour)),
                                 static_cast<uint32_t>(arg_red(colour))};
     Map m[3];
     for (int k = 0; k < 3; ++k)
         for (uint32_t v = 0; v < 256; ++v)
             m[k][v] = static_cast<uint8_t>((210 * v + 45 * target[k]) / 255);
-    apply<3>(img, m, mask);
+    apply<3>(*v, m, sel ? &*sel : nullptr);
     return 1;
 }
 
 int32_t ColorFilter1(Image *img, int32_t level) {
     if (!level_usable(img, level)) return 0;
+    const std::optional<View> v = view_of(img);
+    if (!v) return 1; // no samples to map
     Map table;
     arc_curve(level, table);
     if ((level & 128) == 0) invert_curve(table);
-    apply_plane(img, table);
+    apply_plane(*v, table);
     return 1;
 }
 
 int32_t ColorFilter_zanto(Image *img, int32_t level) {
     if (!level_usable(img, level)) return 0;
+    const std::optional<View> v = view_of(img);
+    if (!v) return 1; // no samples to map
     const int32_t d = std::abs(level - 128);
     const uint8_t *curve = (level & 128) != 0 ? ZANTOFILTER : ZANTOFILTERBK;
     Map table;
     for (int32_t i = 0; i < 256; ++i)
         table[i] = curve_blend<127>(i, curve[i], d);
-    apply_plane(img, table);
+    apply_plane(*v, table);
     return 1;
 }
 

@@ -13,16 +13,16 @@ namespace {
 // Deliberately lopsided: the bottom-middle entry is 1.
 const int32_t kEdge[9] = {1, 0, -1, 2, 0, -2, 1, 1, -1};
 
-template <class F> bool edge_filter(PXImage *img) {
-    Window<F> win(img, 3);
+template <class F> bool edge_filter(const View &v) {
+    Window<F> win(v, 3);
     const size_t n = win.samples();
     Buffer<int32_t> acc = alloc_buffer<int32_t>(n);
     if (!win.ok() || !acc) return false;
     const typename F::T *rows[3];
-    for (int32_t y = 0; y < img->height; ++y) {
+    for (int32_t y = 0; y < v.height; ++y) {
         win.rows_for(y, rows);
         convolve_row(rows, kEdge, 3, F::kChannels, n, acc.get());
-        store_row<F>(img, y, acc.get(), n, [](int32_t v) { return v >> 2; });
+        store_row<F>(v, y, acc.get(), n, [](int32_t s) { return s >> 2; });
     }
     return true;
 }
@@ -36,9 +36,10 @@ extern "C" {
 
 int32_t PXImage_EdgeDetection(PXImage *img) {
     if (!filter_input_ok(img)) return 0;
-    if (!px_usable(img)) return filter_without_rows(img);
+    const std::optional<View> v = view_of(img);
+    if (!v) return filter_without_rows(img);
     bool ok = true;
-    if (!with_packed_format(img->bitcount, [&](auto f) { ok = edge_filter<decltype(f)>(img); })) return 1;
+    if (!with_packed_format(img->bitcount, [&](auto f) { ok = edge_filter<decltype(f)>(*v); })) return 1;
     return ok ? 1 : 0;
 }
 
@@ -49,16 +50,15 @@ int32_t PXImage_GrayToBinarization(PXImage *img) {
     // Without pixel rows: the grey plane of width x height bytes gets no
     // block for a count of 0 or below (0). With both sizes negative it does,
     // and no sample is read or mapped (1).
-    if (!px_usable(img)) {
-        return buffer_size_ok(block_size(img->width, img->height, 1)) ? 1 : 0;
-    }
-    const size_t pixels = static_cast<size_t>(img->width) * static_cast<size_t>(img->height);
-    uint8_t *d = img->data;
+    const std::optional<View> v = view_of(img);
+    if (!v) return buffer_size_ok(block_size(img->width, img->height, 1)) ? 1 : 0;
+    const size_t pixels = static_cast<size_t>(v->width) * static_cast<size_t>(v->height);
+    uint8_t *d = v->bits;
     Buffer<uint8_t> plane = alloc_buffer<uint8_t>(pixels);
     if (!plane) return 0;
     for (size_t i = 0; i < pixels; ++i)
         plane[i] = bits == 8 ? d[i] : (bits == 24 ? d[3 * i + 1] : static_cast<uint8_t>(word_gray(load16(d + 2 * i))));
-    const auto t = static_cast<uint32_t>(ProbabilityDensityValue(plane.get(), img->width, img->height) & 0xFF);
+    const auto t = static_cast<uint32_t>(ProbabilityDensityValue(plane.get(), v->width, v->height) & 0xFF);
     if (bits == 8) {
         for (size_t i = 0; i < pixels; ++i)
             d[i] = d[i] > t ? 255 : 0;

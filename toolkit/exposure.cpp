@@ -68,11 +68,12 @@ struct FixedCurve {
     }
 };
 
-int32_t expose_gray(PXImage *img, bool fixedCurve) {
-    const size_t n = px_block(img);
+int32_t expose_gray(const View &v, bool fixedCurve) {
+    const size_t n = v.block_bytes();
+    uint8_t *d = v.bits;
     uint32_t hist[256] = {};
     for (size_t i = 0; i < n; ++i)
-        ++hist[img->data[i]];
+        ++hist[d[i]];
     const Percentiles p = percentiles(hist, 256, n, 255);
     if (p.low >= kBrightLow) return 0;
     uint8_t stretched[256];
@@ -83,14 +84,14 @@ int32_t expose_gray(PXImage *img, bool fixedCurve) {
     } else {
         stretch_table(stretched, p);
     }
-    map_bytes(img->data, img->data, n, 1, &table);
+    map_bytes(d, d, n, 1, &table);
     return 1;
 }
 
-int32_t expose_colour(PXImage *img) {
-    const size_t pixels = static_cast<size_t>(img->width) * static_cast<size_t>(img->height);
+int32_t expose_colour(const View &v) {
+    const size_t pixels = static_cast<size_t>(v.width) * static_cast<size_t>(v.height);
     uint32_t hist[3][256] = {};
-    uint8_t *d = img->data;
+    uint8_t *d = v.bits;
     for (size_t i = 0; i < pixels; ++i) {
         ++hist[0][d[3 * i]];
         ++hist[1][d[3 * i + 1]];
@@ -112,12 +113,12 @@ int32_t expose_colour(PXImage *img) {
 
 // 16-bit path: 16-bit counters that wrap, percentiles over all 65,536 levels
 // kept in their low 8 bits, and a word table whose entries from 256 on are 0.
-int32_t expose_words(PXImage *img) {
-    const size_t pixels = static_cast<size_t>(img->width) * static_cast<size_t>(img->height);
+int32_t expose_words(const View &v) {
+    const size_t pixels = static_cast<size_t>(v.width) * static_cast<size_t>(v.height);
     Buffer<uint16_t> hist = alloc_zeroed<uint16_t>(65536);
     Buffer<uint16_t> table = alloc_zeroed<uint16_t>(65536);
     if (!hist || !table) return 0;
-    uint8_t *d = img->data;
+    uint8_t *d = v.bits;
     for (size_t i = 0; i < pixels; ++i)
         ++hist[load16(d + 2 * i)];
     Percentiles p = percentiles(hist.get(), 65536, pixels, 255);
@@ -136,11 +137,12 @@ int32_t auto_exposure(PXImage *img, bool fixedCurve) {
     // Without pixel rows the histograms are empty: no running share exceeds
     // the thresholds, so low = 0 (below the bright limit) and there is
     // nothing to map.
-    if (!px_usable(img)) return 1;
-    switch (img->bitcount) {
-    case 8: return expose_gray(img, fixedCurve);
-    case 16: return expose_words(img);
-    case 24: return expose_colour(img);
+    const std::optional<View> v = view_of(img);
+    if (!v) return 1;
+    switch (v->bitCount) {
+    case 8: return expose_gray(*v, fixedCurve);
+    case 16: return expose_words(*v);
+    case 24: return expose_colour(*v);
     default: return 0;
     }
 }

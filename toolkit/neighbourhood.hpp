@@ -44,20 +44,20 @@ template <class F> class Window {
     using T = typename F::T;
     static constexpr int32_t C = F::kChannels;
 
-    Window(const PXImage *img, int32_t size)
-        : img_(img), size_(size), half_(size / 2),
-          padded_((static_cast<size_t>(img->width) + 2 * static_cast<size_t>(half_)) * C),
+    Window(const View &v, int32_t size)
+        : v_(v), size_(size), half_(size / 2),
+          padded_((static_cast<size_t>(v.width) + 2 * static_cast<size_t>(half_)) * C),
           ring_(alloc_buffer<T>(checked_size(padded_, static_cast<uint64_t>(size)))) {}
 
     bool ok() const { return static_cast<bool>(ring_); }
     // Samples per output row (width x channels).
-    size_t samples() const { return static_cast<size_t>(img_->width) * C; }
+    size_t samples() const { return static_cast<size_t>(v_.width) * C; }
 
     // Fills rows[0 .. size - 1] with the padded rows y - half .. y + half
     // (clamped). Rows must be asked for in increasing order of y; the source
     // rows from y + half on must still hold their original content.
     void rows_for(int32_t y, const T **rows) {
-        const int32_t h = img_->height;
+        const int32_t h = v_.height;
         const int32_t need = y + half_ < h ? y + half_ : h - 1;
         while (built_ < need)
             build(++built_);
@@ -73,10 +73,10 @@ template <class F> class Window {
 
     void build(int32_t r) {
         T *out = slot(r);
-        const int32_t w = img_->width;
-        const uint8_t *block = img_->data;
+        const int32_t w = v_.width;
         if constexpr (C == 3) {
-            const size_t rowStart = static_cast<size_t>(r) * w * 3, end = px_block(img_);
+            const uint8_t *block = v_.bits;
+            const size_t rowStart = static_cast<size_t>(r) * v_.pitch, end = v_.block_bytes();
             const int64_t last = int64_t{w} * 3 - 1;
             for (int32_t p = -half_; p < w + half_; ++p) {
                 int64_t idx = int64_t{p} * 3;
@@ -87,38 +87,37 @@ template <class F> class Window {
                 }
             }
         } else {
-            const size_t rowStart = static_cast<size_t>(r) * w;
+            const uint8_t *row = v_.row(r);
             for (int32_t p = -half_; p < w + half_; ++p) {
                 const int32_t x = p < 0 ? 0 : (p >= w ? w - 1 : p);
                 if constexpr (sizeof(T) == 1)
-                    out[p + half_] = block[rowStart + x];
+                    out[p + half_] = row[x];
                 else
-                    out[p + half_] = static_cast<T>(load16(block + 2 * (rowStart + x)));
+                    out[p + half_] = static_cast<T>(load16(row + 2 * static_cast<size_t>(x)));
             }
         }
     }
 
-    const PXImage *img_;
+    View v_;
     int32_t size_, half_;
     size_t padded_;
     Buffer<T> ring_;
     int32_t built_ = -1;
 };
 
-// Writes a row of sums into image row y, each passed through `fix` and
+// Writes a row of sums into row y of the view, each passed through `fix` and
 // clamped to the format's range.
-template <class F, class Fix> void store_row(PXImage *img, int32_t y, const int32_t *acc, size_t n, Fix fix) {
+template <class F, class Fix> void store_row(const View &v, int32_t y, const int32_t *acc, size_t n, Fix fix) {
+    uint8_t *out = v.row(y);
     if constexpr (sizeof(typename F::T) == 1) {
-        uint8_t *out = img->data + static_cast<size_t>(y) * n;
         for (size_t i = 0; i < n; ++i) {
-            const int32_t v = fix(acc[i]);
-            out[i] = static_cast<uint8_t>(v < 0 ? 0 : (v > F::kMax ? F::kMax : v));
+            const int32_t x = fix(acc[i]);
+            out[i] = static_cast<uint8_t>(x < 0 ? 0 : (x > F::kMax ? F::kMax : x));
         }
     } else {
-        uint8_t *out = img->data + static_cast<size_t>(y) * n * 2;
         for (size_t i = 0; i < n; ++i) {
-            const int32_t v = fix(acc[i]);
-            store16(out + 2 * i, static_cast<uint32_t>(v < 0 ? 0 : (v > F::kMax ? F::kMax : v)));
+            const int32_t x = fix(acc[i]);
+            store16(out + 2 * i, static_cast<uint32_t>(x < 0 ? 0 : (x > F::kMax ? F::kMax : x)));
         }
     }
 }

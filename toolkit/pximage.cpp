@@ -19,17 +19,19 @@ int32_t PXImage_IsSameImage(const PXImage *a, const PXImage *b) {
     if (a == nullptr || b == nullptr || a->width != b->width || a->height != b->height) return 0;
     if (a->data == nullptr || b->data == nullptr || a->bitcount != b->bitcount) return 0;
     if (a->bitcount != 8 && a->bitcount != 24 && a->bitcount != 32) return 0;
-    // Both records have the same sizes and bit count, so checking one covers both.
+    // Both records have the same sizes and bit count, so checking one covers
+    // both, and either both have views or neither.
     if (!px_rows_inside(a)) return 0;
     // Without pixel rows the sum is over no bytes: 0, and the result is 1
     // exactly when the byte count N (signed, from the sizes) is not negative.
     // A count beyond 32 bits is refused.
-    if (!px_usable(a)) {
+    const std::optional<View> va = view_of(a), vb = view_of(b);
+    if (!va || !vb) {
         const int64_t count = block_size(a->width, a->height, px_bytes(a->bitcount));
         return count != kNoSize && count >= 0 ? 1 : 0;
     }
-    const size_t n = px_block(a);
-    const uint8_t *p = a->data, *q = b->data;
+    const size_t n = va->block_bytes();
+    const uint8_t *p = va->bits, *q = vb->bits;
     // The sum wraps modulo 2^32 by design; chunks keep the inner sum in 32
     // bits for vectorisation without changing the wrapped total.
     uint32_t sum = 0;

@@ -11,6 +11,7 @@
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
+#include "core/internal/view.hpp"
 
 namespace pxfx::packed {
 
@@ -33,6 +34,15 @@ inline bool px_usable(const PXImage *im) {
     const int32_t bpp = px_bytes(im->bitcount);
     return checked_size(static_cast<uint64_t>(im->width), static_cast<uint64_t>(im->height),
                         static_cast<uint64_t>(bpp > 0 ? bpp : 1)) != 0;
+}
+
+// The view of a usable record (px_usable), else nothing: rows of width pixels
+// packed one after the other, pitch = width x bytes per pixel (0 for a bit
+// count the toolkit does not store, whose pixels no kernel reads).
+inline std::optional<View> view_of(const PXImage *im) {
+    if (!px_usable(im)) return std::nullopt;
+    const size_t pitch = static_cast<size_t>(im->width) * static_cast<size_t>(px_bytes(im->bitcount));
+    return View{im->data, pitch, im->width, im->height, static_cast<uint32_t>(im->bitcount), nullptr};
 }
 
 // True when loops over the record stay inside its block: it has no data or

@@ -207,31 +207,33 @@ PXImage *PXImage_Resize(const PXImage *src, int32_t newWidth, int32_t newHeight)
     // Both new sizes negative: the block exists but the loops are empty. A
     // source without data or pixel rows gives the interpolation nothing to
     // read. Either way no result pixel is computed; the block is cleared.
-    if (newWidth < 0 || !px_usable(src)) {
+    const std::optional<View> to = view_of(out), from = view_of(src);
+    if (!to || !from) {
         std::memset(out->data, 0, static_cast<size_t>(bytes));
         return out;
     }
-    const int32_t w = src->width, h = src->height;
+    const int32_t w = from->width, h = from->height;
     const float ry = static_cast<float>(h) / static_cast<float>(newHeight);
     const float rx = static_cast<float>(w) / static_cast<float>(newWidth);
     bool ok = true;
-    if (src->bitcount == 8) {
-        ok = interpolate_plane(src->data, w, h, 1, out->data, newWidth, newHeight, 1, ry, rx);
-    } else if (src->bitcount == 24) {
-        ok = interpolate_any<3>(src->data, w, h, 3, out->data, newWidth, newHeight, 3, ry, rx);
+    if (from->bitCount == 8) {
+        ok = interpolate_plane(from->bits, w, h, 1, to->bits, newWidth, newHeight, 1, ry, rx);
+    } else if (from->bitCount == 24) {
+        ok = interpolate_any<3>(from->bits, w, h, 3, to->bits, newWidth, newHeight, 3, ry, rx);
     } else {
         // A 16-bit source is read as three-byte pixels; the bytes that this
         // stride puts past the end of its block read as 0.
         const size_t n = static_cast<size_t>(w) * static_cast<size_t>(h);
-        const size_t have = px_block(src);
+        const size_t have = from->block_bytes();
+        const uint8_t *block = from->bits;
         Buffer<uint8_t> plane = alloc_buffer<uint8_t>(n);
         ok = static_cast<bool>(plane);
         for (int32_t c = 0; c < 3 && ok; ++c) {
             for (size_t p = 0; p < n; ++p) {
                 const size_t k = p * 3 + static_cast<size_t>(c);
-                plane[p] = k < have ? src->data[k] : 0;
+                plane[p] = k < have ? block[k] : 0;
             }
-            ok = interpolate_plane(plane.get(), w, h, 1, out->data + c, newWidth, newHeight, 3, ry, rx);
+            ok = interpolate_plane(plane.get(), w, h, 1, to->bits + c, newWidth, newHeight, 3, ry, rx);
         }
     }
     if (!ok) {

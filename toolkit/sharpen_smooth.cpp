@@ -28,15 +28,15 @@ constexpr int32_t kSharpen7FirstRow = 49;
 // Sharpening with the 3 x 3 or 5 x 5 kernel from row 0, or with the 7 x 7
 // kernel (49 at the centre, -1 elsewhere, summed as 50 centre - window sum)
 // from row 49; rows left without a result keep their content.
-template <class F> bool sharpen(PXImage *img, int32_t size) {
-    Window<F> win(img, size);
+template <class F> bool sharpen(const View &v, int32_t size) {
+    Window<F> win(v, size);
     const size_t n = win.samples();
     Buffer<int32_t> acc = alloc_buffer<int32_t>(n);
     Buffer<int32_t> cols = alloc_buffer<int32_t>(n + static_cast<size_t>(size - 1) * F::kChannels);
     if (!win.ok() || !acc || !cols) return false;
     const typename F::T *rows[7];
     const int32_t first = size == 7 ? kSharpen7FirstRow : 0;
-    for (int32_t y = first; y < img->height; ++y) {
+    for (int32_t y = first; y < v.height; ++y) {
         win.rows_for(y, rows);
         if (size == 7) {
             box_row(rows, 7, F::kChannels, n, cols.get(), acc.get());
@@ -46,23 +46,23 @@ template <class F> bool sharpen(PXImage *img, int32_t size) {
         } else {
             convolve_row(rows, size == 3 ? kSharpen3 : kSharpen5, size, F::kChannels, n, acc.get());
         }
-        store_row<F>(img, y - first, acc.get(), n, [](int32_t v) { return v; });
+        store_row<F>(v, y - first, acc.get(), n, [](int32_t s) { return s; });
     }
     return true;
 }
 
-template <class F> bool mean_smooth(PXImage *img, int32_t size) {
-    Window<F> win(img, size);
+template <class F> bool mean_smooth(const View &v, int32_t size) {
+    Window<F> win(v, size);
     const size_t n = win.samples();
     Buffer<int32_t> acc = alloc_buffer<int32_t>(n);
     Buffer<int32_t> cols = alloc_buffer<int32_t>(n + static_cast<size_t>(size - 1) * F::kChannels);
     if (!win.ok() || !acc || !cols) return false;
     const typename F::T *rows[7];
     const auto area = static_cast<uint32_t>(size * size);
-    for (int32_t y = 0; y < img->height; ++y) {
+    for (int32_t y = 0; y < v.height; ++y) {
         win.rows_for(y, rows);
         box_row(rows, size, F::kChannels, n, cols.get(), acc.get());
-        store_row<F>(img, y, acc.get(), n,
+        store_row<F>(v, y, acc.get(), n,
                      [area](int32_t v) { return static_cast<int32_t>(static_cast<uint32_t>(v) / area); });
     }
     return true;
@@ -213,23 +213,23 @@ void median_row_words(const uint16_t *const *rows, int32_t size, size_t width, i
     }
 }
 
-template <class F> bool median_smooth(PXImage *img, int32_t size) {
-    Window<F> win(img, size);
+template <class F> bool median_smooth(const View &v, int32_t size) {
+    Window<F> win(v, size);
     const size_t n = win.samples();
     Buffer<int32_t> acc = alloc_buffer<int32_t>(n);
     if (!win.ok() || !acc) return false;
     const typename F::T *rows[7];
     const MedianRow median5 = pick_median5();
-    for (int32_t y = 0; y < img->height; ++y) {
+    for (int32_t y = 0; y < v.height; ++y) {
         win.rows_for(y, rows);
         if constexpr (sizeof(typename F::T) == 1) {
             if (size == 5)
                 median5(rows, F::kChannels, n, acc.get());
             else
-                median_row_bytes<F>(rows, size, static_cast<size_t>(img->width), acc.get());
+                median_row_bytes<F>(rows, size, static_cast<size_t>(v.width), acc.get());
         } else
-            median_row_words(rows, size, static_cast<size_t>(img->width), acc.get());
-        store_row<F>(img, y, acc.get(), n, [](int32_t v) { return v; });
+            median_row_words(rows, size, static_cast<size_t>(v.width), acc.get());
+        store_row<F>(v, y, acc.get(), n, [](int32_t s) { return s; });
     }
     return true;
 }
@@ -241,22 +241,24 @@ extern "C" {
 int32_t PXImage_Sharpen(PXImage *img, int32_t strength) {
     if (!filter_input_ok(img) || strength == 0) return 0;
     if (strength > 100) return 1;
-    if (!px_usable(img)) return filter_without_rows(img);
+    const std::optional<View> v = view_of(img);
+    if (!v) return filter_without_rows(img);
     const int32_t size = strength < 40 ? 3 : (strength < 80 ? 5 : 7);
     bool ok = true;
-    if (!with_packed_format(img->bitcount, [&](auto f) { ok = sharpen<decltype(f)>(img, size); })) return 1;
+    if (!with_packed_format(img->bitcount, [&](auto f) { ok = sharpen<decltype(f)>(*v, size); })) return 1;
     return ok ? 1 : 0;
 }
 
 int32_t PXImage_Smooth(PXImage *img, int32_t strength) {
     if (!filter_input_ok(img) || strength == 0) return 0;
-    if (!px_usable(img)) return filter_without_rows(img);
+    const std::optional<View> v = view_of(img);
+    if (!v) return filter_without_rows(img);
     const bool median = strength >= 60;
     const int32_t size = strength < 20 ? 3 : (strength < 40 ? 5 : (strength < 60 ? 7 : (strength < 80 ? 5 : 7)));
     bool ok = true;
     if (!with_packed_format(img->bitcount, [&](auto f) {
             using F = decltype(f);
-            ok = median ? median_smooth<F>(img, size) : mean_smooth<F>(img, size);
+            ok = median ? median_smooth<F>(*v, size) : mean_smooth<F>(*v, size);
         }))
         return 1;
     return ok ? 1 : 0;

@@ -46,16 +46,16 @@ void balance_table(uint8_t *table, int32_t ref, bool scale) {
     }
 }
 
-int32_t balance_colour(PXImage *img, const PXPoint *pt) {
-    const int64_t w = img->width, h = img->height;
+int32_t balance_colour(const View &v, const PXPoint *pt) {
+    const int64_t w = v.width, h = v.height;
     const size_t pixels = static_cast<size_t>(w * h);
-    uint8_t *d = img->data;
+    uint8_t *d = v.bits;
     Buffer<uint8_t> plane = alloc_buffer<uint8_t>(pixels);
     if (!plane) return 0;
     uint8_t table[3][256];
     for (int32_t b = 0; b < 3; ++b) {
-        const int32_t ref = reference(pt->x, pt->y, img->width, img->height,
-                                      [&](int64_t r, int64_t c) { return d[(r * w + c) * 3 + b]; });
+        const int32_t ref =
+            reference(pt->x, pt->y, v.width, v.height, [&](int64_t r, int64_t c) { return d[(r * w + c) * 3 + b]; });
         for (size_t i = 0; i < pixels; ++i)
             plane[i] = d[3 * i + b];
         const int32_t threshold =
@@ -69,10 +69,10 @@ int32_t balance_colour(PXImage *img, const PXPoint *pt) {
 
 // 8-bit images take their reference with the 24-bit green addressing
 // (row * width + column * 3 + 1); bytes that lands beyond the block read as 0.
-int32_t balance_gray(PXImage *img, const PXPoint *pt) {
-    const int64_t w = img->width, h = img->height, n = w * h;
-    uint8_t *d = img->data;
-    const int32_t ref = reference(pt->x, pt->y, img->width, img->height, [&](int64_t r, int64_t c) {
+int32_t balance_gray(const View &v, const PXPoint *pt) {
+    const int64_t w = v.width, h = v.height, n = w * h;
+    uint8_t *d = v.bits;
+    const int32_t ref = reference(pt->x, pt->y, v.width, v.height, [&](int64_t r, int64_t c) {
         const int64_t k = r * w + c * 3 + 1;
         return k < n ? d[k] : 0;
     });
@@ -131,10 +131,9 @@ int32_t PXImage_AutoWhiteBalance(PXImage *img, const PXPoint *pt) {
     // Without pixel rows: the scratch plane of width x height bytes gets no
     // block for a count of 0 or below (0). With both sizes negative it would,
     // and then no sample is mapped (1).
-    if (!px_usable(img)) {
-        return buffer_size_ok(block_size(img->width, img->height, 1)) ? 1 : 0;
-    }
-    return img->bitcount == 24 ? balance_colour(img, pt) : balance_gray(img, pt);
+    const std::optional<View> v = view_of(img);
+    if (!v) return buffer_size_ok(block_size(img->width, img->height, 1)) ? 1 : 0;
+    return v->bitCount == 24 ? balance_colour(*v, pt) : balance_gray(*v, pt);
 }
 
 } // extern "C"

@@ -42,19 +42,18 @@ template <class S, int32_t C> void widen_row(const uint8_t *in, int32_t w, uint3
     }
 }
 
-template <class S, int32_t C> bool zoom_in(const PXImage *src, PXImage *dst) {
-    const int32_t w = src->width, h = src->height;
+template <class S, int32_t C> bool zoom_in(const View &src, const View &dst) {
+    const int32_t w = src.width, h = src.height;
     const size_t n = static_cast<size_t>(2 * static_cast<int64_t>(w)) * C;
     Buffer<uint32_t> rows = alloc_buffer<uint32_t>(2 * n);
     if (!rows) return false;
     uint32_t *top = rows.get(), *bottom = top + n;
-    const size_t srcRow = static_cast<size_t>(w) * C;
-    widen_row<S, C>(src->data, w, top);
+    widen_row<S, C>(src.row(0), w, top);
     for (int32_t a = 0; a < h; ++a) {
         const int32_t b = a + 1 < h ? a + 1 : a;
-        widen_row<S, C>(src->data + static_cast<size_t>(b) * srcRow * sizeof(typename S::T), w, bottom);
-        uint8_t *even = dst->data + static_cast<size_t>(2 * a) * n * sizeof(typename S::T);
-        uint8_t *odd = even + n * sizeof(typename S::T);
+        widen_row<S, C>(src.row(b), w, bottom);
+        uint8_t *even = dst.row(2 * a);
+        uint8_t *odd = dst.row(2 * a + 1);
         for (size_t i = 0; i < n; ++i) {
             S::put(even, i, top[i]);
             S::put(odd, i, (top[i] + bottom[i] + 1) >> 1);
@@ -64,13 +63,12 @@ template <class S, int32_t C> bool zoom_in(const PXImage *src, PXImage *dst) {
     return true;
 }
 
-template <int32_t B> void zoom_out(const PXImage *src, PXImage *dst) {
-    const int32_t w = src->width;
-    const size_t srcRow = static_cast<size_t>(w) * B, dstRow = static_cast<size_t>(dst->width) * B;
-    for (int32_t y = 0; y < dst->height; ++y) {
-        const uint8_t *in = src->data + static_cast<size_t>(2 * y) * srcRow;
-        uint8_t *out = dst->data + static_cast<size_t>(y) * dstRow;
-        for (int32_t x = 0; x < dst->width; ++x) {
+template <int32_t B> void zoom_out(const View &src, const View &dst) {
+    const int32_t w = src.width, dw = dst.width;
+    for (int32_t y = 0; y < dst.height; ++y) {
+        const uint8_t *in = src.row(2 * y);
+        uint8_t *out = dst.row(y);
+        for (int32_t x = 0; x < dw; ++x) {
             const int64_t sx = std::min<int64_t>(2 * int64_t{x}, w - 1);
             std::memcpy(out + static_cast<size_t>(x) * B, in + static_cast<size_t>(sx) * B, B);
         }
@@ -79,18 +77,19 @@ template <int32_t B> void zoom_out(const PXImage *src, PXImage *dst) {
 
 bool zoom_bits(const PXImage *src) { return src->bitcount == 8 || src->bitcount == 16 || src->bitcount == 24; }
 
-// Rectangle zoom: byte b of the source (a usable record), gathered from row
-// `startRow`, column x on, w' bytes a row for as many rows as the source has,
-// in a plane that the interpolation reads as source width x source height.
-// Positions outside the source block, and plane bytes the gather does not
-// reach (all of them for w' below 1), read as 0.
-void gather_plane(const PXImage *src, int64_t startRow, int64_t x, int64_t gatherWidth, int32_t b, uint8_t *plane) {
-    const int64_t sw = src->width, sh = src->height, pixels = sw * sh;
+// Rectangle zoom: byte b of the source, gathered from row `startRow`, column
+// x on, w' bytes a row for as many rows as the source has, in a plane that
+// the interpolation reads as source width x source height. Positions outside
+// the source block, and plane bytes the gather does not reach (all of them
+// for w' below 1), read as 0.
+void gather_plane(const View &src, int64_t startRow, int64_t x, int64_t gatherWidth, int32_t b, uint8_t *plane) {
+    const int64_t sw = src.width, sh = src.height, pixels = sw * sh;
+    const uint8_t *block = src.bits;
     const int64_t size = sw * sh, filled = gatherWidth > 0 ? std::min(size, gatherWidth * sh) : 0;
     for (int64_t i = 0; i < filled; ++i) {
         const int64_t r = i / gatherWidth, k = i % gatherWidth;
         const int64_t p = (startRow + r) * sw + x + k;
-        plane[i] = p >= 0 && p < pixels ? src->data[p * 4 + b] : 0;
+        plane[i] = p >= 0 && p < pixels ? block[p * 4 + b] : 0;
     }
     std::memset(plane + filled, 0, static_cast<size_t>(size - filled));
 }
@@ -101,18 +100,18 @@ void gather_plane(const PXImage *src, int64_t startRow, int64_t x, int64_t gathe
 bool zoom_planes(const PXImage *src, int64_t startRow, int64_t x, int64_t gatherWidth, int32_t rw, int32_t rh,
                  uint8_t *out) {
     const size_t outSize = static_cast<size_t>(rw) * static_cast<size_t>(rh);
-    if (!px_usable(src)) {
+    const std::optional<View> v = view_of(src);
+    if (!v) {
         std::memset(out, 0, outSize * 4);
         return true;
     }
-    Buffer<uint8_t> plane = alloc_buffer<uint8_t>(px_block(src) / 4);
+    Buffer<uint8_t> plane = alloc_buffer<uint8_t>(v->block_bytes() / 4);
     if (!plane) return false;
-    const float ry = static_cast<float>(src->height) / static_cast<float>(rh);
-    const float rx = static_cast<float>(src->width) / static_cast<float>(rw);
+    const float ry = static_cast<float>(v->height) / static_cast<float>(rh);
+    const float rx = static_cast<float>(v->width) / static_cast<float>(rw);
     for (int32_t b = 0; b < 4; ++b) {
-        gather_plane(src, startRow, x, gatherWidth, b, plane.get());
-        if (!interpolate_plane(plane.get(), src->width, src->height, 1, out + outSize * b, rw, rh, 1, ry, rx))
-            return false;
+        gather_plane(*v, startRow, x, gatherWidth, b, plane.get());
+        if (!interpolate_plane(plane.get(), v->width, v->height, 1, out + outSize * b, rw, rh, 1, ry, rx)) return false;
     }
     return true;
 }
@@ -124,13 +123,15 @@ extern "C" {
 PXImage *PXImage_ZoomIn(const PXImage *src) {
     if (src == nullptr || src->data == nullptr || !zoom_bits(src) || !px_rows_inside(src)) return nullptr;
     PXImage *out = px_new(2 * int64_t{src->width}, 2 * int64_t{src->height}, src->bitcount);
-    // Both sizes negative: no rows to fill, the block stays cleared.
-    if (out == nullptr || src->width < 0) return out;
+    // None made, or both sizes negative: no rows to fill, the block stays
+    // cleared. A result with rows has them because the source has.
+    const std::optional<View> to = view_of(out), from = view_of(src);
+    if (!to || !from) return out;
     bool ok;
-    switch (src->bitcount) {
-    case 8: ok = zoom_in<ByteSamples, 1>(src, out); break;
-    case 16: ok = zoom_in<WordSamples, 1>(src, out); break;
-    default: ok = zoom_in<ByteSamples, 3>(src, out); break;
+    switch (from->bitCount) {
+    case 8: ok = zoom_in<ByteSamples, 1>(*from, *to); break;
+    case 16: ok = zoom_in<WordSamples, 1>(*from, *to); break;
+    default: ok = zoom_in<ByteSamples, 3>(*from, *to); break;
     }
     if (!ok) {
         PXImage_Free(out);
@@ -142,17 +143,21 @@ PXImage *PXImage_ZoomIn(const PXImage *src) {
 PXImage *PXImage_ZoomOut(const PXImage *src) {
     if (src == nullptr || !zoom_bits(src) || !px_rows_inside(src)) return nullptr;
     PXImage *out = px_new(floor8(src->width / 2 + 7), src->height / 2, src->bitcount);
-    // Both result sizes negative: no rows to fill, the block stays cleared.
-    if (out == nullptr || out->width < 0) return out;
+    // None made, or both result sizes negative: no rows to fill, the block
+    // stays cleared.
+    const std::optional<View> to = view_of(out);
+    if (!to) return out;
     // A source without data has no pixels to take: the result is cleared.
-    if (src->data == nullptr) {
-        std::memset(out->data, 0, px_block(out));
+    // One with data has rows, as the result has.
+    const std::optional<View> from = view_of(src);
+    if (!from) {
+        std::memset(to->bits, 0, to->block_bytes());
         return out;
     }
-    switch (src->bitcount) {
-    case 8: zoom_out<1>(src, out); break;
-    case 16: zoom_out<2>(src, out); break;
-    default: zoom_out<3>(src, out); break;
+    switch (from->bitCount) {
+    case 8: zoom_out<1>(*from, *to); break;
+    case 16: zoom_out<2>(*from, *to); break;
+    default: zoom_out<3>(*from, *to); break;
     }
     return out;
 }
@@ -172,8 +177,8 @@ int32_t PXImage_ROI_Zoom(const PXImage *src, PXImage *dst, const PXRect *rect, d
     // Both rectangle sizes negative: the interpolation and the writes have
     // empty loops. A target without data or pixel rows takes no writes.
     // Either way nothing gathered would be seen.
-    const size_t target = px_held(dst);
-    if (rectWidth < 0 || target == 0) return 1;
+    const std::optional<View> to = view_of(dst);
+    if (rectWidth < 0 || !to) return 1;
     const int64_t startRow = trunc_sat<int32_t>(static_cast<double>(y) / scale + 0.5);
     // All four planes are interpolated before the target is written, so a
     // failure leaves it unchanged. Plane b of the gather reads source byte b
@@ -185,13 +190,14 @@ int32_t PXImage_ROI_Zoom(const PXImage *src, PXImage *dst, const PXRect *rect, d
     if (!out || !zoom_planes(src, startRow, x, gatherWidth, rw, rh, out.get())) return 0;
     // Rows of the target run on into the next row past the row end, as in
     // the packed block; pixels past the block end are not written.
-    const int64_t dw = dst->width, dstPixels = static_cast<int64_t>(target / 4);
+    const int64_t dw = to->width, dstPixels = static_cast<int64_t>(to->block_bytes() / 4);
+    uint8_t *block = to->bits;
     for (int32_t b = 0; b < 4; ++b)
         for (int64_t r = 0; r < rh; ++r)
             for (int64_t c = 0; c < rw; ++c) {
                 const int64_t p = (y + r) * dw + x + c;
                 if (p >= dstPixels) break;
-                dst->data[p * 4 + b] = out[outSize * b + static_cast<size_t>(r * rw + c)];
+                block[p * 4 + b] = out[outSize * b + static_cast<size_t>(r * rw + c)];
             }
     return 1;
 }

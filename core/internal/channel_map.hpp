@@ -45,22 +45,22 @@ struct WordFieldMap {
     }
 };
 
-template <class F, class Pick> void map_channel_rows(const Image *src, Image *dst, Pick &pick) {
-    const int32_t w = src->width;
+template <class F, class Pick> void map_channel_rows(const View &src, const View &dst, Pick &pick) {
+    const int32_t w = src.width;
     if constexpr (F::kBitCount == 8 || F::kBitCount == 24 || F::kBitCount == 32) {
         constexpr int channels = static_cast<int>(F::kBitCount / 8);
-        for (int32_t y = 0; y < src->height; ++y) {
+        for (int32_t y = 0; y < src.height; ++y) {
             const ChannelMap &m = *pick(y);
             const uint8_t *tables[4] = {channels == 1 ? m.g : m.b, m.g, m.r, kIdentityMap};
-            map_bytes(row_ptr(src, y), row_ptr(dst, y), static_cast<size_t>(w), channels, tables);
+            map_bytes(src.row(y), dst.row(y), static_cast<size_t>(w), channels, tables);
         }
     } else if constexpr (F::kBitCount == 16) {
         const ChannelMap *built = pick(0);
         WordFieldMap f(*built);
-        for (int32_t y = 0; y < src->height; ++y) {
+        for (int32_t y = 0; y < src.height; ++y) {
             if (const ChannelMap *m = pick(y); m != built) f = WordFieldMap(*(built = m));
-            const uint8_t *in = row_ptr(src, y);
-            uint8_t *out = row_ptr(dst, y);
+            const uint8_t *in = src.row(y);
+            uint8_t *out = dst.row(y);
             for (int32_t x = 0; x < w; ++x) {
                 const uint32_t v = in[2 * x] | static_cast<uint32_t>(in[2 * x + 1]) << 8;
                 const uint32_t o = f.b[v >> 11] | f.g[(v >> 5) & 63] | f.r[v & 31];
@@ -69,7 +69,7 @@ template <class F, class Pick> void map_channel_rows(const Image *src, Image *ds
             }
         }
     } else {
-        for (int32_t y = 0; y < src->height; ++y) {
+        for (int32_t y = 0; y < src.height; ++y) {
             const ChannelMap &m = *pick(y);
             const typename F::CRow in = F::crow(src, y);
             const typename F::Row out = F::row(dst, y);
@@ -84,13 +84,13 @@ template <class F, class Pick> void map_channel_rows(const Image *src, Image *ds
 } // namespace detail
 
 // Maps every row y of src through the tables *pick(y) into row y of dst,
-// which is src itself or a record of the same size.
-template <class Pick> void map_channel_rows(const Image *src, Image *dst, Pick pick) {
+// which is src itself or a view of the same size.
+template <class Pick> void map_channel_rows(const View &src, const View &dst, Pick pick) {
     with_formats(src, dst, [&](auto f, auto) { detail::map_channel_rows<decltype(f)>(src, dst, pick); });
 }
 
 // Every pixel of src through the same tables into dst (as above).
-inline void map_channels(const Image *src, Image *dst, const ChannelMap &m) {
+inline void map_channels(const View &src, const View &dst, const ChannelMap &m) {
     map_channel_rows(src, dst, [&](int32_t) { return &m; });
 }
 

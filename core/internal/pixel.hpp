@@ -4,7 +4,7 @@
 //
 // Each format offers
 //   CRow / Row            row handles for reading / writing
-//   crow(im, y), row(im, y)
+//   crow(view, y), row(view, y)
 //   load(crow, x)         packed colour exactly as GetPixelColor returns it
 //   store(row, x, c)      exactly as SetPixelColor stores it
 // `x` and `y` must lie inside the picture; clamping is the caller's loop
@@ -23,6 +23,7 @@
 
 #include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
+#include "core/internal/view.hpp"
 
 namespace pxfx {
 
@@ -38,16 +39,13 @@ constexpr uint32_t alpha_of(uint32_t c) { return c >> 24; }
 // weight on red and the large one on blue.
 constexpr uint32_t drawing_gray(uint32_t c) { return (117 * red_of(c) + 601 * green_of(c) + 306 * blue_of(c)) >> 10; }
 
-inline const uint8_t *row_ptr(const Image *im, int32_t y) { return im->bits + static_cast<size_t>(y) * im->pitch; }
-inline uint8_t *row_ptr(Image *im, int32_t y) { return im->bits + static_cast<size_t>(y) * im->pitch; }
-
 struct Gray8 {
     static constexpr uint32_t kBitCount = 8;
     static constexpr bool kDirect = true;
     using CRow = const uint8_t *;
     using Row = uint8_t *;
-    static CRow crow(const Image *im, int32_t y) { return row_ptr(im, y); }
-    static Row row(Image *im, int32_t y) { return row_ptr(im, y); }
+    static CRow crow(const View &v, int32_t y) { return v.row(y); }
+    static Row row(const View &v, int32_t y) { return v.row(y); }
     static uint32_t load(CRow r, int32_t x) {
         const uint32_t i = r[x];
         return i | i << 8 | i << 16 | kOpaque;
@@ -63,8 +61,8 @@ struct Word16 {
     static constexpr bool kDirect = true;
     using CRow = const uint8_t *;
     using Row = uint8_t *;
-    static CRow crow(const Image *im, int32_t y) { return row_ptr(im, y); }
-    static Row row(Image *im, int32_t y) { return row_ptr(im, y); }
+    static CRow crow(const View &v, int32_t y) { return v.row(y); }
+    static Row row(const View &v, int32_t y) { return v.row(y); }
     static uint32_t load(CRow r, int32_t x) {
         const uint32_t w = r[2 * x] | static_cast<uint32_t>(r[2 * x + 1]) << 8;
         return pack((w >> 11) * 8, ((w >> 5) & 63) * 4, (w & 31) * 8, 0);
@@ -81,8 +79,8 @@ struct Bgr24 {
     static constexpr bool kDirect = true;
     using CRow = const uint8_t *;
     using Row = uint8_t *;
-    static CRow crow(const Image *im, int32_t y) { return row_ptr(im, y); }
-    static Row row(Image *im, int32_t y) { return row_ptr(im, y); }
+    static CRow crow(const View &v, int32_t y) { return v.row(y); }
+    static Row row(const View &v, int32_t y) { return v.row(y); }
     static uint32_t load(CRow r, int32_t x) {
         const uint8_t *p = r + 3 * x;
         return pack(p[0], p[1], p[2], 255);
@@ -100,8 +98,8 @@ struct Bgra32 {
     static constexpr bool kDirect = true;
     using CRow = const uint8_t *;
     using Row = uint8_t *;
-    static CRow crow(const Image *im, int32_t y) { return row_ptr(im, y); }
-    static Row row(Image *im, int32_t y) { return row_ptr(im, y); }
+    static CRow crow(const View &v, int32_t y) { return v.row(y); }
+    static Row row(const View &v, int32_t y) { return v.row(y); }
     static uint32_t load(CRow r, int32_t x) {
         const uint8_t *p = r + 4 * x;
         return pack(p[0], p[1], p[2], p[3]);
@@ -128,8 +126,8 @@ struct AnyFormat {
         Image *im;
         int32_t y;
     };
-    static CRow crow(const Image *im, int32_t y) { return {im, y}; }
-    static Row row(Image *im, int32_t y) { return {im, y}; }
+    static CRow crow(const View &v, int32_t y) { return {v.record, y}; }
+    static Row row(const View &v, int32_t y) { return {v.record, y}; }
     static uint32_t load(CRow r, int32_t x) { return GetPixelColor(r.im, x, r.y); }
     static void store(Row r, int32_t x, uint32_t c) { SetPixelColor(r.im, x, r.y, c); }
 };
@@ -149,18 +147,18 @@ template <class Fn> decltype(auto) with_format(uint32_t bitCount, Fn &&fn) {
 // Records of one bit count share their direct format; records that differ (a
 // 1- or 4-bit source whose result was made with 8 bits, say) both go through
 // the accessors, which convert.
-template <class Fn> void with_formats(const Image *src, const Image *dst, Fn &&fn) {
-    if (src->bitCount == dst->bitCount)
-        with_format(src->bitCount, [&](auto f) { fn(f, f); });
+template <class Fn> void with_formats(const View &src, const View &dst, Fn &&fn) {
+    if (src.bitCount == dst.bitCount)
+        with_format(src.bitCount, [&](auto f) { fn(f, f); });
     else
         fn(AnyFormat{}, AnyFormat{});
 }
 
 // Writes fn(colour) of every pixel of src to the same place of dst (src
 // itself, or a record of the same size); both records have format F.
-template <class F, class Fn> void map_pixels(const Image *src, Image *dst, Fn fn) {
-    const int32_t w = src->width;
-    for (int32_t y = 0; y < src->height; ++y) {
+template <class F, class Fn> void map_pixels(const View &src, const View &dst, Fn fn) {
+    const int32_t w = src.width;
+    for (int32_t y = 0; y < src.height; ++y) {
         const typename F::CRow in = F::crow(src, y);
         const typename F::Row out = F::row(dst, y);
         for (int32_t x = 0; x < w; ++x)
@@ -168,33 +166,34 @@ template <class F, class Fn> void map_pixels(const Image *src, Image *dst, Fn fn
     }
 }
 
-// The pixels a kernel reads from a record that may have no pixel block. The
-// pixel readers read such a record as 0; for the byte formats (8, 16, 24 and
-// 32 bits) the view stands in a record of the same size and bit count whose
-// rows all lie on one zeroed row (pitch 0), so row loops read those zeros
-// too. Any other record is used as it is. ok() is false when the zeroed row
-// cannot be had.
+// The pixels a kernel reads from a record that may have no pixel block, for
+// a record whose rows its block can hold (rows_inside). The pixel readers
+// read a record without pixels as 0; for the byte formats (8, 16, 24 and 32
+// bits) the view's rows all lie on one zeroed row (pitch 0), so row loops
+// read those zeros too; other formats read through the accessors, which give
+// 0. A record with pixels is viewed as it is. ok() is false when the zeroed
+// row cannot be had.
 class ReadView {
   public:
-    explicit ReadView(const Image *im) : im_(im) {
+    explicit ReadView(const Image *im)
+        : view_{im->bits, im->pitch, im->width, im->height, im->bitCount, const_cast<Image *>(im)} {
         const uint32_t bc = im->bitCount;
         if (im->bits != nullptr || im->width <= 0 || im->height <= 0 || (bc != 8 && bc != 16 && bc != 24 && bc != 32))
             return;
         zeros_ = alloc_zeroed<uint8_t>(static_cast<size_t>(min_row_bytes(bc, im->width)));
-        stand_in_ = *im;
-        stand_in_.bits = zeros_.get();
-        stand_in_.pitch = 0;
-        im_ = &stand_in_;
+        view_.bits = zeros_.get();
+        view_.pitch = 0;
+        ok_ = zeros_ != nullptr;
     }
     ReadView(const ReadView &) = delete;
     ReadView &operator=(const ReadView &) = delete;
-    bool ok() const { return im_ != &stand_in_ || zeros_ != nullptr; }
-    const Image *get() const { return im_; }
+    bool ok() const { return ok_; }
+    const View &view() const { return view_; }
 
   private:
-    const Image *im_;
-    Image stand_in_{};
+    View view_;
     Buffer<uint8_t> zeros_;
+    bool ok_ = true;
 };
 
 // ---- Packed rows ----------------------------------------------------------

@@ -13,6 +13,7 @@
 #include <pxfx/core.h>
 
 #include "core/internal/memory.hpp"
+#include "core/internal/view.hpp"
 
 namespace pxfx {
 
@@ -36,6 +37,17 @@ Image *prepare_slot(const Image *src, Image **dst);
 // (has_pixels): a reused image without pixels or an empty size gives success
 // with nothing drawn.
 Image *acquire_result(const Image *src, Image **dst);
+
+// acquire_result with the pixel work: fn(source view, result view) when the
+// result has pixels (the source then has pixels of the same size and bit
+// count). 0 when the call is refused, else 1: a result without pixels has
+// nothing drawn into it.
+template <class Fn> uint32_t draw_result(const Image *src, Image **dst, Fn &&fn) {
+    Image *out = acquire_result(src, dst);
+    if (out == nullptr) return 0;
+    if (const std::optional<View> to = view_of(out)) fn(*view_of(src), *to);
+    return 1;
+}
 
 // ---- Hand over a new record ----------------------------------------------
 

@@ -35,11 +35,11 @@ TEST(ChannelMap, MatchesThePerPixelDefinition) {
                                   pxfx::pack(m.b[pxfx::blue_of(c)], m.g[pxfx::green_of(c)], m.r[pxfx::red_of(c)],
                                              pxfx::alpha_of(c)));
                 }
-            pxfx::map_channel_rows(src.get(), got.get(), pick);
+            pxfx::map_channel_rows(*pxfx::view_of(src.get()), *pxfx::view_of(got.get()), pick);
             EXPECT_EQ(pxtest::diff(got.get(), want.get()), "") << bits << " to " << outBits << " bits";
             if (outBits != bits) continue;
             const Owned inPlace = pxtest::clone(src.get());
-            pxfx::map_channel_rows(inPlace.get(), inPlace.get(), pick);
+            pxfx::map_channel_rows(*pxfx::view_of(inPlace.get()), *pxfx::view_of(inPlace.get()), pick);
             EXPECT_EQ(pxtest::diff(inPlace.get(), want.get()), "") << bits << " bits in place";
         }
 }

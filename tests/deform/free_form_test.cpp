@@ -42,7 +42,7 @@ TEST(FreeForm, HoleFillingReachAndOrder) {
     for (int x = 0; x < 13; ++x)
         SetPixelColor(row.get(), x, 0, x == 0 ? in[0] : x == 4 ? in[1] : x == 12 ? in[2] : 0x44000000);
     std::vector<uint8_t> m = {2, 0, 0, 0, 2, 0, 0, 0, 0, 0, 0, 0, 2};
-    pxfx::fill_warp_holes(row.get(), m.data());
+    pxfx::fill_warp_holes(*pxfx::view_of(row.get()), m.data());
     for (int x = 1; x < 4; ++x)
         EXPECT_EQ(GetPixelColor(row.get(), x, 0), want[x - 1]) << x;
     EXPECT_EQ(GetPixelColor(row.get(), 5, 0), 0x44000000u);
@@ -50,7 +50,7 @@ TEST(FreeForm, HoleFillingReachAndOrder) {
     // A column, 1/3 of the way from 0 to 90, then halfway (a tie: the upper alpha).
     Owned col = make(1, 4, 32);
     SetPixelColor(col.get(), 0, 0, 0x01000000), SetPixelColor(col.get(), 0, 3, 0x025A5A5A);
-    pxfx::fill_warp_holes(col.get(), std::vector<uint8_t>{2, 0, 0, 2}.data());
+    pxfx::fill_warp_holes(*pxfx::view_of(col.get()), std::vector<uint8_t>{2, 0, 0, 2}.data());
     EXPECT_EQ(GetPixelColor(col.get(), 0, 1), 0x011E1E1Eu);
     EXPECT_EQ(GetPixelColor(col.get(), 0, 2), 0x013C3C3Cu);
     // Four corners (the row below is empty, so d = 2) win over the row pair,
@@ -61,7 +61,7 @@ TEST(FreeForm, HoleFillingReachAndOrder) {
     for (int i = 0; i < 4; ++i)
         SetPixelColor(sq.get(), cx[i], cy[i] + (i > 1), 0x01000000u * (i + 1) + 0x0A0A0A * (i + 1) + (i == 3));
     std::vector<uint8_t> all = {2, 2, 2, 2, 0, 2, 0, 0, 0, 2, 0, 2};
-    pxfx::fill_warp_holes(sq.get(), all.data());
+    pxfx::fill_warp_holes(*pxfx::view_of(sq.get()), all.data());
     EXPECT_EQ(GetPixelColor(sq.get(), 1, 1), 0x01161616u); // a = 1/2, b = 1/3: 22.33 and 22.17
 }
 

@@ -52,7 +52,7 @@ TEST(Straighten, FollowsTheStripBoundariesAndReadsClamped) {
     Owned im = tilted(200, 100);
     std::vector<int32_t> l(700);
     for (int32_t shift : {0, 12}) {
-        pxfx::lines::detect_boundary(im.get(), l.data());
+        pxfx::lines::detect_boundary(*pxfx::view_of(im.get()), l.data());
         for (int32_t c = 0; c < 200; ++c)
             ASSERT_EQ(l[c], 38 + shift + (c - 65) / 8) << c;
         im->bits[31 * im->pitch + 65] = 230;
@@ -61,8 +61,8 @@ TEST(Straighten, FollowsTheStripBoundariesAndReadsClamped) {
     const int32_t cases[][4] = {{200, 100, 8, 30}, {700, 60, 200, 20}, {200, 150, 2, -10}};
     for (auto [w, h, run, top] : cases) {
         Owned im = tilted(w, h, run, top), got = make(w, h, 8), want = make(w, h, 8);
-        pxfx::lines::detect_boundary(im.get(), l.data());
-        pxfx::lines::straighten(im.get(), l.data(), got.get());
+        pxfx::lines::detect_boundary(*pxfx::view_of(im.get()), l.data());
+        pxfx::lines::straighten(*pxfx::view_of(im.get()), l.data(), *pxfx::view_of(got.get()));
         for (int32_t r = 0; r < std::min(h - l[0], h - l[w - 1]); ++r)
             for (int32_t c = 0; c < w; ++c)
                 SetPixelIndex(want.get(), c, r, GetPixelIndex(im.get(), c, l[c] + r));

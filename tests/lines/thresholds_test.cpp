@@ -31,7 +31,7 @@ TEST(BandThreshold, EachBandOfThirtySevenRowsHasItsOwnLevel) {
             im->bits[y * im->pitch + x] = y < 37 ? (x < 10 ? 30 : 220) : y < 74 ? 128 + (x == 3) : (x < 5 ? 0 : 250);
             want->bits[y * want->pitch + x] = (y < 37 ? x < 10 : y < 74 || x < 5) ? 1 : 255;
         }
-    pxfx::lines::band_threshold(im.get(), out.get());
+    pxfx::lines::band_threshold(*pxfx::view_of(im.get()), *pxfx::view_of(out.get()));
     EXPECT_EQ(diff(out.get(), want.get()), "");
 
     // Dots are judged on the row as it was, across the 64-pixel chunks.
@@ -41,7 +41,7 @@ TEST(BandThreshold, EachBandOfThirtySevenRowsHasItsOwnLevel) {
         dots->bits[x] = one(x) ? 1 : 255;
         kept->bits[x] = one(x) && !(x > 0 && x < 69 && !one(x - 1) && !one(x + 1)) ? 1 : 255;
     }
-    pxfx::lines::remove_isolated_dots(dots.get());
+    pxfx::lines::remove_isolated_dots(*pxfx::view_of(dots.get()));
     EXPECT_EQ(diff(dots.get(), kept.get()), "");
 }
 
