@@ -64,6 +64,12 @@ template <class R> struct Contract {
     // them (functions without a result return 1: done, nothing to do).
     std::vector<Accepted> accepts;
     int64_t done = 1;
+    // Functions filling a caller's slot: for sources of an empty size (zero
+    // width, INT_MIN width, negative height, both negative) holding a
+    // matching record in the slot, the result digit and what became of the
+    // record: kept (k), cleared over the block it claims (z), given the
+    // source's block (c) or released (r). Null: no such slot.
+    const char *empty_sources = nullptr;
     // The same function called another way (for example in place, with a
     // null slot), held to the same promises.
     std::function<int64_t(Call<R> &)> also;

@@ -17,9 +17,13 @@ using C = Call<Image>;
 Contract<Image> no_slot(std::vector<int32_t> formats, std::function<int64_t(C &)> call) {
     return {.formats = std::move(formats), .call = std::move(call), .slot = false};
 }
-// A failed working allocation of the kernel filter leaves the prepared result in the slot.
+// A failed working allocation of the kernel filter leaves the prepared result
+// in the slot; sources of an empty size draw nothing into a matching one.
 Contract<Image> kernel_effect(int32_t (*fn)(const Image *, Image **)) {
-    return {.formats = kAnyBits, .call = [fn](C &c) { return fn(c.a, c.slot); }, .keeps_result_on_failure = true};
+    return {.formats = kAnyBits,
+            .call = [fn](C &c) { return fn(c.a, c.slot); },
+            .keeps_result_on_failure = true,
+            .empty_sources = "1k 1k 1k 1k"};
 }
 // The plane shifts: nothing to visit in a plane of no rows.
 Contract<Image> plane_shift(int32_t (*fn)(Image *, int32_t)) {
@@ -144,7 +148,9 @@ void add_color(std::vector<Operation> &t) {
                  Contract<Image>{.formats = kAnyBits,
                                  .call = [](C &c) { return PX_IMG_Smooth(c.a, c.slot, c.p); },
                                  .slot = false,
-                                 .typical = 50}});
+                                 .typical = 50,
+                                 // The source is copied into the slot before smoothing.
+                                 .empty_sources = "1c 1c 1k 1k"}});
     t.push_back({"box-filter",
                  PXOP_FN(Filter_fast),
                  "Filters",

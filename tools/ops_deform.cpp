@@ -24,8 +24,12 @@ std::vector<int16_t> flat_wave_map(const Image *im) {
     return std::vector<int16_t>(fits ? (static_cast<size_t>(im->width) + 3) / 4 * 4 * im->height : 16 * 16);
 }
 
-// Warps into a slot from one picture of any bit count.
-Contract<Image> slot_warp(std::function<int64_t(C &)> call) { return {.formats = kAnyBits, .call = std::move(call)}; }
+// Warps into a slot from one picture of any bit count. Sources of an empty
+// size have nothing to map: a matching slot is kept (1) unless `empty` says
+// otherwise.
+Contract<Image> slot_warp(std::function<int64_t(C &)> call, const char *empty = "1k 1k 1k 1k") {
+    return {.formats = kAnyBits, .call = std::move(call), .empty_sources = empty};
+}
 // Functions writing one picture into another of the same size; a source
 // without pixels reads as 0 instead of being refused.
 Contract<Image> two(std::function<int64_t(C &)> call, int64_t failure = 0) {
@@ -112,7 +116,9 @@ void add_deform(std::vector<Operation> &t) {
                  {{"amplitude", true, 0, 20, 10, "largest displacement in pixels"}},
                  kAllFormats,
                  [](const Image *in, const Args &a) { return effect(Wave_Transform, in, a.i(0)); },
-                 slot_warp([](C &c) { return Wave_Transform(c.a, c.slot, c.p); })});
+                 // Its map of height x stride x 2 bytes comes first.
+                 // The wave's map of height x stride x 2 bytes: only two negative sizes give one.
+                 slot_warp([](C &c) { return Wave_Transform(c.a, c.slot, c.p); }, "0k 0k 0k 1k")});
     t.push_back({"warp",
                  PXOP_FN(DeformationImage),
                  "Deformations",
@@ -125,7 +131,9 @@ void add_deform(std::vector<Operation> &t) {
                  warp,
                  Contract<Image>{.formats = kAnyBits,
                                  .call = [](C &c) { return DeformationImage(c.a, kHostilePairs, 4, c.slot); },
-                                 .keeps_result_on_failure = true}});
+                                 .keeps_result_on_failure = true,
+                                 // The black background laid over the block the record claims.
+                                 .empty_sources = "1z 1z 1k 1k"}});
     t.push_back(contract_row(PXOP_FN(DeformationFunc), "Deformations",
                              two([](C &c) -> int64_t { return DeformationFunc(c.a, c.b, kHostilePairs, 4); })));
     t.push_back(contract_row(PXOP_FN(render_wave), "Deformations",

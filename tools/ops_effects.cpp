@@ -12,11 +12,19 @@ using C = Call<Image>;
 
 // Effects read through the pixel readers, so any bit count works; `keeps`
 // marks those whose failed working allocation leaves the prepared result.
-Contract<Image> slot_effect(std::function<int64_t(C &)> call, bool keeps = false, int32_t typical = 3) {
-    return {.formats = kAnyBits, .call = std::move(call), .keeps_result_on_failure = keeps, .typical = typical};
+// On sources of an empty size most draw nothing into a matching slot (1);
+// `empty` names the others.
+constexpr const char *kNothingDrawn = "1k 1k 1k 1k";
+Contract<Image> slot_effect(std::function<int64_t(C &)> call, const char *empty = kNothingDrawn, bool keeps = false,
+                            int32_t typical = 3) {
+    return {.formats = kAnyBits,
+            .call = std::move(call),
+            .keeps_result_on_failure = keeps,
+            .typical = typical,
+            .empty_sources = empty};
 }
-Contract<Image> slot_effect(uint32_t (*fn)(Image *, Image **), bool keeps = false) {
-    return slot_effect([fn](C &c) { return int64_t(fn(c.a, c.slot)); }, keeps);
+Contract<Image> slot_effect(uint32_t (*fn)(Image *, Image **), const char *empty = kNothingDrawn, bool keeps = false) {
+    return slot_effect([fn](C &c) { return int64_t(fn(c.a, c.slot)); }, empty, keeps);
 }
 
 } // namespace
@@ -45,7 +53,7 @@ void add_effects(std::vector<Operation> &t) {
                  {},
                  kAllFormats,
                  [](const Image *in, const Args &) { return effect(PX_IMG_Photocopy, in); },
-                 slot_effect(PX_IMG_Photocopy)});
+                 slot_effect(PX_IMG_Photocopy, "1k 0r 1k 1k")});
     t.push_back({"sketch",
                  PXOP_FN(PX_IMG_Sketch),
                  "Drawing",
@@ -53,7 +61,7 @@ void add_effects(std::vector<Operation> &t) {
                  {},
                  kAllFormats,
                  [](const Image *in, const Args &) { return effect(PX_IMG_Sketch, in); },
-                 slot_effect(PX_IMG_Sketch, true)});
+                 slot_effect(PX_IMG_Sketch, "0k 0k 0k 1k", true)});
     t.push_back({"sketch-soft",
                  PXOP_FN(PX_IMG_Sketch_1),
                  "Drawing",
@@ -61,7 +69,7 @@ void add_effects(std::vector<Operation> &t) {
                  {},
                  kAllFormats,
                  [](const Image *in, const Args &) { return effect(PX_IMG_Sketch_1, in); },
-                 slot_effect(PX_IMG_Sketch_1, true)});
+                 slot_effect(PX_IMG_Sketch_1, "0k 0k 0k 1k", true)});
     t.push_back({"negative",
                  PXOP_FN(PX_IMG_Negative),
                  "Colour tones",
@@ -149,7 +157,7 @@ void add_effects(std::vector<Operation> &t) {
                  {},
                  kAllFormats,
                  [](const Image *in, const Args &) { return effect(PX_IMG_Lambency, in); },
-                 slot_effect(PX_IMG_Lambency)});
+                 slot_effect(PX_IMG_Lambency, "0k 0k 0k 0k")});
     t.push_back({"mosaic",
                  PXOP_FN(PX_IMG_Mosaic),
                  "Textures",
@@ -157,7 +165,7 @@ void add_effects(std::vector<Operation> &t) {
                  {{"size", true, 1, 256, 12, "block side in pixels"}},
                  kAllFormats,
                  [](const Image *in, const Args &a) { return effect(PX_IMG_Mosaic, in, a.i(0)); },
-                 slot_effect([](C &c) { return PX_IMG_Mosaic(c.a, c.slot, c.p); })});
+                 slot_effect([](C &c) { return PX_IMG_Mosaic(c.a, c.slot, c.p); }, "0k 0k 1k 0k")});
     t.push_back({"watercolour",
                  PXOP_FN(PX_IMG_Aquarelle),
                  "Textures",
@@ -173,7 +181,7 @@ void add_effects(std::vector<Operation> &t) {
                  {{"radius", true, 0, 16, 3, "window radius"}},
                  kAllFormats,
                  [](const Image *in, const Args &a) { return effect(imOil, in, a.i(0)); },
-                 slot_effect([](C &c) { return imOil(c.a, c.slot, c.p); }, true, 1)});
+                 slot_effect([](C &c) { return imOil(c.a, c.slot, c.p); }, "0k 0k 0k 0k", true, 1)});
     t.push_back({"oil-poster",
                  PXOP_FN(imOil_1),
                  "Textures",
@@ -184,7 +192,8 @@ void add_effects(std::vector<Operation> &t) {
                  Contract<Image>{.formats = {24, 32},
                                  .call = [](C &c) { return imOil_1(c.a, c.slot); },
                                  .empty_slot = true,
-                                 .falls_back_on_failure = true}});
+                                 .falls_back_on_failure = true,
+                                 .empty_sources = "0k 0k 0k 0k"}});
     t.push_back({"compress-levels",
                  PXOP_FN(ColorCompress),
                  "Textures",
@@ -212,7 +221,7 @@ void add_effects(std::vector<Operation> &t) {
                  },
                  slot_effect([](C &c) { return PX_IMG_Alter(c.a, c.slot, c.p, ~c.p, c.p, c.p); })});
     t.push_back(contract_row(PXOP_FN(PX_ProcessImage), "Drawing",
-                             slot_effect([](C &c) { return PX_ProcessImage(c.a, c.slot, c.p); }, true)));
+                             slot_effect([](C &c) { return PX_ProcessImage(c.a, c.slot, c.p); }, "0k 0k 0k 1k", true)));
 }
 
 } // namespace pxop

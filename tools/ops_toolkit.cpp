@@ -56,8 +56,12 @@ const std::vector<Param> kRectParams = {{"left", false, 0, 100, 15, "percent of 
 using P = Call<PXImage>;
 
 const std::vector<int32_t> kGeometry = {8, 16, 24};
-// Every bit count, the broken records made at 0 bits: the filters leave those alone.
-const std::vector<int32_t> kEveryBits = {0, 1, 4, 8, 12, 16, 24, 32, 48};
+// Every bit count, the broken records made at 8 bits. The filters need a
+// scratch picture of width x height pixels, which empty sizes and one
+// negative size do not get (refused); with both sizes negative nothing is
+// computed (1).
+const std::vector<int32_t> kEveryBits = {8, 0, 1, 4, 12, 16, 24, 32, 48};
+const std::vector<Accepted> kFilterSizes = {"negative sizes"};
 // Records without pixel rows (and, where named, without data).
 const std::vector<Accepted> kRowless = kEmptySizes;
 const std::vector<Accepted> kPixelless = {"null pixels", "zero width", "negative height", "INT_MIN width",
@@ -283,7 +287,7 @@ void add_toolkit(std::vector<Operation> &t) {
                  [](const Image *in, const Args &a) {
                      return packed_in_place(in, [&](PXImage *p) { return PXImage_Sharpen(p, a.i(0)) == 1; });
                  },
-                 changed<PXImage>(kEveryBits, PXImage_Sharpen, kRowless)});
+                 changed<PXImage>(kEveryBits, PXImage_Sharpen, kFilterSizes)});
     t.push_back({"px-smooth",
                  PXOP_FN(PXImage_Smooth),
                  "Toolkit filters",
@@ -293,7 +297,7 @@ void add_toolkit(std::vector<Operation> &t) {
                  [](const Image *in, const Args &a) {
                      return packed_in_place(in, [&](PXImage *p) { return PXImage_Smooth(p, a.i(0)) == 1; });
                  },
-                 changed<PXImage>(kEveryBits, PXImage_Smooth, kRowless)});
+                 changed<PXImage>(kEveryBits, PXImage_Smooth, kFilterSizes)});
     t.push_back({"edges",
                  PXOP_FN(PXImage_EdgeDetection),
                  "Toolkit filters",
@@ -304,7 +308,7 @@ void add_toolkit(std::vector<Operation> &t) {
                      return packed_in_place(in, [](PXImage *p) { return PXImage_EdgeDetection(p) == 1; });
                  },
                  changed<PXImage>(
-                     kEveryBits, [](PXImage *a, int32_t) { return PXImage_EdgeDetection(a); }, kRowless)});
+                     kEveryBits, [](PXImage *a, int32_t) { return PXImage_EdgeDetection(a); }, kFilterSizes)});
     t.push_back({"binarize",
                  PXOP_FN(PXImage_GrayToBinarization),
                  "Toolkit filters",

@@ -140,7 +140,7 @@ TEST(Filter, MatchesAccessorVersionAliasingAndRefusals) {
 // mask selects by its bytes (see masked_out). The kernel is read only where a
 // pixel is filtered.
 TEST(Filter, DegenerateSourcesMasksAndKernels) {
-    std::vector<uint8_t> bytes(28 * 7), other(28 * 7, 0x5A);
+    std::vector<uint8_t> bytes(28 * 7);
     for (size_t i = 0; i < bytes.size(); ++i)
         bytes[i] = uint8_t(i % 3);
     Image emptyW{0, 7, 24, bytes.data(), 28, 0}, emptyH{9, -7, 24, bytes.data(), 28, 0};
@@ -173,11 +173,9 @@ TEST(Filter, DegenerateSourcesMasksAndKernels) {
                   Filter(src.get(), nullptr, 3, 1, 0, nullptr, make(6, 5, 16).get(), 0),
               2);
     EXPECT_EQ(Filter(src.get(), nullptr, 3, 1, 0, nullptr, dst.get(), 0), 0);
-    // The kernel effects reuse a matching record of the empty size: nothing drawn.
-    Image same{0, 7, 24, other.data(), 28, 0}, *slot = &same, *none0 = nullptr;
-    EXPECT_EQ(PX_IMG_Blur(&emptyW, &slot) + PX_IMG_Emboss1(&emptyW, &slot), 2);
-    EXPECT_TRUE(slot == &same && std::all_of(other.begin(), other.end(), [](uint8_t v) { return v == 0x5A; }));
-    EXPECT_EQ(PX_IMG_Sharpen(&emptyW, &none0), 0); // no image of that size can be made
+    // A kernel effect makes no new result of the empty size.
+    Image *none0 = nullptr;
+    EXPECT_EQ(PX_IMG_Sharpen(&emptyW, &none0), 0);
     EXPECT_EQ(none0, nullptr);
 }
 

@@ -4,7 +4,6 @@
 #include <cstdio>
 #include <cstring>
 #include <fstream>
-#include <iterator>
 #include <vector>
 
 #include <sys/stat.h>
@@ -18,11 +17,6 @@ namespace {
 
 const std::string dir = ::testing::TempDir();
 std::string path(const char *name) { return dir + "pxfx_files_" + name; }
-
-std::vector<uint8_t> read(const std::string &p) {
-    std::ifstream in(p, std::ios::binary);
-    return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
-}
 
 uint32_t le32(const std::vector<uint8_t> &v, size_t at) {
     return v[at] | v[at + 1] << 8 | v[at + 2] << 16 | uint32_t(v[at + 3]) << 24;
@@ -61,7 +55,7 @@ TEST(Files, SaveBmpWritesHeadersPaletteAndRowsAsStored) {
     for (int32_t bc : kBitCounts) {
         Owned im = random_image(3, 2, bc, uint32_t(bc));
         ASSERT_EQ(saveBmp(path("a.bmp").c_str(), im.get()), 1);
-        const std::vector<uint8_t> v = read(path("a.bmp"));
+        const std::vector<uint8_t> v = file_bytes(path("a.bmp"));
         const uint32_t data = im->pitch * 2, off = bc == 8 ? 1078 : 54;
         ASSERT_EQ(v.size(), off + data) << bc;
         EXPECT_EQ(v[0] | v[1] << 8, 'B' | 'M' << 8);
@@ -80,15 +74,15 @@ TEST(Files, SaveBmpWritesHeadersPaletteAndRowsAsStored) {
     EXPECT_EQ(saveBmp(path("h.bmp").c_str(), &hollow) + saveBmp(path("h.bmp").c_str(), nullptr) +
                   saveBmp(path("h.bmp").c_str(), &upsideDown),
               0);
-    EXPECT_TRUE(read(path("h.bmp")).empty());
+    EXPECT_TRUE(file_bytes(path("h.bmp")).empty());
     // No rows, or rows of no pixels: the headers and the pitch x height bytes claimed.
     Image noRows = *im, noColumns = *im;
     noRows.height = 0;
     noColumns.width = 0;
     ASSERT_EQ(saveBmp(path("h.bmp").c_str(), &noRows), 1);
-    EXPECT_EQ(read(path("h.bmp")).size(), 54u);
+    EXPECT_EQ(file_bytes(path("h.bmp")).size(), 54u);
     ASSERT_EQ(saveBmp(path("h.bmp").c_str(), &noColumns), 1);
-    EXPECT_EQ(read(path("h.bmp")).size(), 54u + 16);
+    EXPECT_EQ(file_bytes(path("h.bmp")).size(), 54u + 16);
     std::remove(path("h.bmp").c_str());
     EXPECT_EQ(saveBmp(path("none/x.bmp").c_str(), im.get()), 0);
     EXPECT_EQ(saveBmp(dir.c_str(), im.get()), 0);                               // a directory

@@ -1,13 +1,12 @@
 // Free-form warp: weighted centres, hole filling on hand-made masks, and
-// warps whose result is known: one pair, no pair, identity and translation;
-// every deformation on sources of an empty size.
+// warps whose result is known: one pair, no pair, identity and translation.
 #include <gtest/gtest.h>
 
 #include <cmath>
 #include <vector>
 
 #include "deform/free_form.hpp"
-#include "support/slot_rule.hpp"
+#include "support/test_images.hpp"
 
 using namespace pxtest;
 
@@ -96,18 +95,4 @@ TEST(FreeForm, OnePairIdentityTranslationAndIgnoredPairs) {
         for (int i = 0; i < 4; ++i)
             pairs[i].dstX += 3, pairs[i].dstY += 2;
     }
-}
-
-// Sources of an empty size (see expect_slot_rule): nothing to map. The polar
-// transforms return 1; the wave first needs its map of height x stride x 2
-// bytes, which only two negative sizes give; the warp lays its background
-// (black: no source pixel can be read) over the block the record claims.
-TEST(FreeForm, EmptySourcesAndReusedSlotsInEveryDeformation) {
-    const DeformationPair pair[] = {{1, 1, 2, 2}};
-    const SlotRuleCase cases[] = {
-        {"punch", Punch_Transform, "1k 1k 1k 1k"},
-        {"wave", bind_slot(Wave_Transform, 5), "0k 0k 0k 1k"},
-        {"warp", [&](Image *s, Image **d) { return uint32_t(DeformationImage(s, pair, 1, d)); }, "1z 1z 1k 1k"}};
-    for (const auto &c : cases)
-        expect_slot_rule(c);
 }

@@ -24,6 +24,7 @@
 #include <vector>
 
 #include "support/alloc_failures.hpp"
+#include "support/slot_rule.hpp"
 #include "support/test_images.hpp"
 #include "tools/contract.hpp"
 
@@ -323,9 +324,19 @@ template <class R> void check_contract(const std::string &name, const Contract<R
     expect_accepted_outcomes(name, c);
     expect_extremes_survive(name, c);
     expect_allocation_failures_handled(name, c);
+    if constexpr (std::is_same_v<R, Image>) {
+        if (c.empty_sources) {
+            auto call = [&c](Image *s, Image **d) {
+                Call<Image> k{s};
+                k.slot = d, k.p = c.typical;
+                return uint32_t(c.call(k));
+            };
+            expect_slot_rule({name.c_str(), call, c.empty_sources, !c.empty_slot});
+        }
+    }
     if (c.also) {
         Contract<R> other = c;
-        other.call = c.also, other.also = nullptr, other.slot = false;
+        other.call = c.also, other.also = nullptr, other.slot = false, other.empty_sources = nullptr;
         check_contract(name + " (other call)", other);
     }
 }

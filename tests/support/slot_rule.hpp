@@ -1,5 +1,7 @@
-// The reuse-the-slot rule on sources of an empty size, for every function
-// that fills a caller's slot through it (effects, deformations).
+// The reuse-the-slot rule on sources of an empty size. The registry's
+// contracts state it for the typical call of each function (checked with
+// the contract); family tests run it on calls whose parameter takes another
+// branch.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -22,11 +24,7 @@ template <class Fn, class... Args> SlotCall bind_slot(Fn fn, Args... args) {
 struct SlotRuleCase {
     const char *name;
     SlotCall call;
-    // Per source shape (zero width, INT_MIN width, negative height, both
-    // negative): the result digit, then what became of the matching record in
-    // the slot: kept (k), cleared over the block it claims (z), given the
-    // source's block (c) or released (r).
-    const char *want;
+    const char *want;      // as pxop::Contract::empty_sources
     bool readsSlot = true; // false: it overwrites the slot without looking at it
 };
 

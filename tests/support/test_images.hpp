@@ -5,9 +5,12 @@
 #include <pxfx/pxfx.h>
 
 #include <cstdint>
+#include <fstream>
+#include <iterator>
 #include <memory>
 #include <random>
 #include <string>
+#include <vector>
 
 namespace pxtest {
 
@@ -31,6 +34,12 @@ Owned clone(const Image *src);
 // Empty string when the two images have the same size, bit count and pixel
 // bytes (padding ignored); otherwise a description of the first difference.
 std::string diff(const Image *a, const Image *b);
+
+// The bytes of a file (none when it cannot be read).
+inline std::vector<uint8_t> file_bytes(const std::string &path) {
+    std::ifstream in(path, std::ios::binary);
+    return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+}
 
 // A picture from tests/data (a 24-bit BMP as saveBmp writes it), or null.
 Owned load_fixture(const std::string &name);

@@ -5,7 +5,6 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
-#include <iterator>
 #include <string>
 
 #include "image_io.hpp"
@@ -102,10 +101,10 @@ TEST_F(Cli, ErrorsExitNonZeroAndLeaveNoOutput) {
     // Cut files of each format fail the same way, leaving no output.
     fs::create_directory(p("cut"));
     for (const char *name : {"orientation-3.jpg", "rle4.bmp", "alpha.webp", "coffee.heic", "rgb16.png"}) {
-        std::ifstream in(fs::path(PXFX_TEST_DATA_DIR) / "pictures" / name, std::ios::binary);
-        const std::string whole{std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+        const auto whole = pxtest::file_bytes(fs::path(PXFX_TEST_DATA_DIR) / "pictures" / name);
         const fs::path cut = dir / "cut" / name;
-        std::ofstream(cut, std::ios::binary) << whole.substr(0, whole.size() * 2 / 3);
+        std::ofstream(cut, std::ios::binary)
+            .write(reinterpret_cast<const char *>(whole.data()), std::streamsize(whole.size() * 2 / 3));
         EXPECT_EQ(run("apply negative " + cut.string() + " " + out), 1) << name;
     }
     EXPECT_EQ(run("frobnicate"), 2);

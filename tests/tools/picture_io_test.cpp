@@ -10,7 +10,6 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
-#include <iterator>
 #include <string>
 #include <vector>
 
@@ -47,11 +46,6 @@ int max_difference(const Image *a, const Image *b) {
                 most = std::max(most, std::abs(int((ca >> s) & 255) - int((cb >> s) & 255)));
         }
     return most;
-}
-
-std::vector<uint8_t> bytes_of(const fs::path &file) {
-    std::ifstream in(file, std::ios::binary);
-    return {std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
 }
 
 // Make and orientation entries of an EXIF block ("" and 0 when absent).
@@ -207,7 +201,7 @@ TEST_F(PictureFiles, TransparencyIsFlattenedOntoTheBackgroundInJpeg) {
 TEST_F(PictureFiles, BrokenAndOversizedFilesFailWithAMessage) {
     for (const char *name :
          {"upright.png", "orientation-3.jpg", "palette8.bmp", "rle8.bmp", "alpha.webp", "coffee.heic"}) {
-        const std::vector<uint8_t> whole = bytes_of(kPictures / name);
+        const std::vector<uint8_t> whole = file_bytes(kPictures / name);
         for (size_t keep : {whole.size() / 2, whole.size() * 9 / 10}) {
             const fs::path cut = dir / (std::string("cut-") + name);
             std::ofstream(cut, std::ios::binary).write(reinterpret_cast<const char *>(whole.data()), long(keep));
