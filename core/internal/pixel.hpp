@@ -39,13 +39,17 @@ constexpr uint32_t alpha_of(uint32_t c) { return c >> 24; }
 // weight on red and the large one on blue.
 constexpr uint32_t drawing_gray(uint32_t c) { return (117 * red_of(c) + 601 * green_of(c) + 306 * blue_of(c)) >> 10; }
 
-struct Gray8 {
-    static constexpr uint32_t kBitCount = 8;
+// The byte formats: rows are byte pointers into the view's block.
+struct DirectRows {
     static constexpr bool kDirect = true;
     using CRow = const uint8_t *;
     using Row = uint8_t *;
     static CRow crow(const View &v, int32_t y) { return v.row(y); }
     static Row row(const View &v, int32_t y) { return v.row(y); }
+};
+
+struct Gray8 : DirectRows {
+    static constexpr uint32_t kBitCount = 8;
     static uint32_t load(CRow r, int32_t x) {
         const uint32_t i = r[x];
         return i | i << 8 | i << 16 | kOpaque;
@@ -56,13 +60,8 @@ struct Gray8 {
 
 // 16-bit words hold blue in the high bits and red in the low bits; channels
 // read back with zero low bits and alpha 0.
-struct Word16 {
+struct Word16 : DirectRows {
     static constexpr uint32_t kBitCount = 16;
-    static constexpr bool kDirect = true;
-    using CRow = const uint8_t *;
-    using Row = uint8_t *;
-    static CRow crow(const View &v, int32_t y) { return v.row(y); }
-    static Row row(const View &v, int32_t y) { return v.row(y); }
     static uint32_t load(CRow r, int32_t x) {
         const uint32_t w = r[2 * x] | static_cast<uint32_t>(r[2 * x + 1]) << 8;
         return pack((w >> 11) * 8, ((w >> 5) & 63) * 4, (w & 31) * 8, 0);
@@ -74,13 +73,8 @@ struct Word16 {
     }
 };
 
-struct Bgr24 {
+struct Bgr24 : DirectRows {
     static constexpr uint32_t kBitCount = 24;
-    static constexpr bool kDirect = true;
-    using CRow = const uint8_t *;
-    using Row = uint8_t *;
-    static CRow crow(const View &v, int32_t y) { return v.row(y); }
-    static Row row(const View &v, int32_t y) { return v.row(y); }
     static uint32_t load(CRow r, int32_t x) {
         const uint8_t *p = r + 3 * x;
         return pack(p[0], p[1], p[2], 255);
@@ -93,13 +87,8 @@ struct Bgr24 {
     }
 };
 
-struct Bgra32 {
+struct Bgra32 : DirectRows {
     static constexpr uint32_t kBitCount = 32;
-    static constexpr bool kDirect = true;
-    using CRow = const uint8_t *;
-    using Row = uint8_t *;
-    static CRow crow(const View &v, int32_t y) { return v.row(y); }
-    static Row row(const View &v, int32_t y) { return v.row(y); }
     static uint32_t load(CRow r, int32_t x) {
         const uint8_t *p = r + 4 * x;
         return pack(p[0], p[1], p[2], p[3]);
