@@ -1,6 +1,8 @@
 #include "operations.hpp"
 
 #include <algorithm>
+#include <cmath>
+#include <cstdio>
 
 #include "operation_groups.hpp"
 #include "operation_kit.hpp"
@@ -67,6 +69,22 @@ Args default_args(const Operation &op) {
     return a;
 }
 
+std::string number_text(double v, bool integer) {
+    char buf[64];
+    std::snprintf(buf, sizeof buf, integer ? "%.0f" : "%g", v);
+    return buf;
+}
+
+std::string value_error(const Param &p, double v, std::string_view text) {
+    const std::string name(p.name), quoted(text);
+    if (v != v) return name + ": not a number: " + quoted;
+    if (p.integer && std::trunc(v) != v) return name + ": not a whole number: " + quoted;
+    if (v < p.lo || v > p.hi)
+        return name + ": " + quoted + " is outside " + number_text(p.lo, p.integer) + ".." +
+               number_text(p.hi, p.integer);
+    return {};
+}
+
 Image *convert_to(const Image *in, uint32_t bitCount) {
     Image *out = malloc_Image(in->width, in->height, static_cast<int32_t>(bitCount));
     if (out == nullptr) return nullptr;
@@ -86,6 +104,23 @@ Image *convert_for(const Operation &op, const Image *in) {
     if (op.formats & kBgra32) return convert_to(in, 32);
     if (op.formats & kGray8) return convert_to(in, 8);
     return convert_to(in, 16);
+}
+
+Image *apply(const Operation &op, const Image *in, const Args &args, std::string *error) {
+    Image *result = nullptr;
+    if (op.formats & format_of(in->bitCount)) {
+        result = op.run(in, args);
+    } else {
+        Image *ready = convert_for(op, in);
+        if (ready == nullptr) {
+            *error = kOutOfMemory;
+            return nullptr;
+        }
+        result = op.run(ready, args);
+        free_Image(&ready, 0);
+    }
+    if (result == nullptr) *error = std::string(op.name) + " failed on this picture";
+    return result;
 }
 
 namespace kit {

@@ -46,6 +46,14 @@ inline int32_t saturate(double v) {
     return static_cast<int32_t>(v);
 }
 
+// A parameter value as the tool prints it: whole numbers without decimals.
+std::string number_text(double v, bool integer);
+
+// Why `v` is no valid value of `p`, or empty when it is one: a number (not
+// NaN), whole for integer parameters, inside lo..hi. `text` is the value as
+// the caller wrote it, quoted in the message.
+std::string value_error(const Param &p, double v, std::string_view text);
+
 // Parameter values in the order of Operation::params.
 struct Args {
     std::vector<double> values;
@@ -94,5 +102,12 @@ Image *convert_for(const Operation &op, const Image *in);
 
 // A new copy of `in` at `bitCount` (8-bit copies hold the luma).
 Image *convert_to(const Image *in, uint32_t bitCount);
+
+// Runs `op` on `in` the way every front end does: on `in` itself when the
+// operation takes its format, else on a copy made by convert_for. Returns the
+// new result, or null with the reason in *error (kOutOfMemory when the copy
+// could not be made).
+inline constexpr std::string_view kOutOfMemory = "out of memory";
+Image *apply(const Operation &op, const Image *in, const Args &args, std::string *error);
 
 } // namespace pxop

@@ -4,6 +4,7 @@
 
 #include <atomic>
 #include <chrono>
+#include <cmath>
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
@@ -52,19 +53,13 @@ std::string describe_formats(uint32_t f) {
     return s + " bits";
 }
 
-std::string number(double v, bool integer) {
-    char buf[64];
-    std::snprintf(buf, sizeof buf, integer ? "%.0f" : "%g", v);
-    return buf;
-}
-
 void print_operation(const pxop::Operation &op) {
     std::printf("  %-22s %s\n", std::string(op.name).c_str(), std::string(op.summary).c_str());
     std::printf("  %-22s %s, takes %s\n", "", std::string(op.function).c_str(), describe_formats(op.formats).c_str());
     for (const pxop::Param &p : op.params)
         std::printf("  %-22s --%s %s..%s (default %s): %s\n", "", std::string(p.name).c_str(),
-                    number(p.lo, p.integer).c_str(), number(p.hi, p.integer).c_str(), number(p.def, p.integer).c_str(),
-                    std::string(p.help).c_str());
+                    pxop::number_text(p.lo, p.integer).c_str(), pxop::number_text(p.hi, p.integer).c_str(),
+                    pxop::number_text(p.def, p.integer).c_str(), std::string(p.help).c_str());
 }
 
 int cmd_list() {
@@ -83,17 +78,10 @@ int cmd_list() {
 bool parse_value(const pxop::Param &p, const std::string &text, double *out, std::string *error) {
     char *end = nullptr;
     const double v = std::strtod(text.c_str(), &end);
-    if (text.empty() || end == nullptr || *end != '\0' || v != v) {
-        *error = "--" + std::string(p.name) + ": not a number: " + text;
-        return false;
-    }
-    if (p.integer && v != static_cast<double>(static_cast<long long>(v))) {
-        *error = "--" + std::string(p.name) + ": not a whole number: " + text;
-        return false;
-    }
-    if (v < p.lo || v > p.hi) {
-        *error = "--" + std::string(p.name) + ": " + text + " is outside " + number(p.lo, p.integer) + ".." +
-                 number(p.hi, p.integer);
+    const bool number = !text.empty() && end != nullptr && *end == '\0';
+    const std::string why = pxop::value_error(p, number ? v : std::nan(""), text);
+    if (!why.empty()) {
+        *error = "--" + why;
         return false;
     }
     *out = v;
@@ -156,16 +144,11 @@ bool process(const Job &job, const std::string &in, const std::string &out, std:
     Image *src = nullptr;
     pxio::Metadata meta;
     if (!pxio::read_picture(in, job.reading, &src, &meta, error)) return false;
-    Image *ready = pxop::convert_for(*job.op, src);
+    std::string why;
+    Image *result = pxop::apply(*job.op, src, job.args, &why);
     free_Image(&src, 0);
-    if (ready == nullptr) {
-        *error = in + ": out of memory";
-        return false;
-    }
-    Image *result = job.op->run(ready, job.args);
-    free_Image(&ready, 0);
     if (result == nullptr) {
-        *error = in + ": " + std::string(job.op->name) + " failed on this picture";
+        *error = in + ": " + why;
         return false;
     }
     const fs::path target(out);
