@@ -3,7 +3,7 @@
 # (python/tests), which compare it with the pxfx tool of build/.
 set -euo pipefail
 cd "$(dirname "$0")/.."
-bash scripts/install-deps.sh python3-pytest python3-pil python3-dask python3-distributed
+bash scripts/install-deps.sh python3-pytest
 bash scripts/install-python.sh build/python-venv
 cd build
 python-venv/bin/python -m pytest -q -p no:cacheprovider ../python/tests

@@ -26,7 +26,7 @@ from . import apply, seed
 __all__ = ["output_name", "process", "run"]
 
 EXTENSIONS = ("png", "jpg", "bmp")
-_JPEG_QUALITY = 92  # the tool's default
+_OPTIONS = {"JPEG": {"quality": 92}, "PNG": {"compress_level": 1}}  # the tool's defaults: fast PNG
 _stream = threading.Lock()
 
 
@@ -52,8 +52,7 @@ def _write(pixels, path, fmt):
         under = Image.new("RGB", im.size, (255, 255, 255))
         under.paste(im, mask=im.getchannel("A"))
         im = under
-    options = {"quality": _JPEG_QUALITY} if fmt == "JPEG" else {}
-    im.save(path, format=fmt, **options)
+    im.save(path, format=fmt, **_OPTIONS.get(fmt, {}))
 
 
 def process(op, src, dst, params):
