@@ -69,12 +69,20 @@ def main(argv=None):
     op = _BY_NAME.get(args.op)
     if op is None:
         parser.error(f"unknown operation {args.op!r} (see pxfx.operations())")
+    if args.workers < 1:
+        parser.error("--workers takes 1 or more")
     try:
         params = _params(op, rest)
     except ValueError as e:
         parser.error(str(e))
-    failures = run(op.name, args.inputs, args.out_dir, params, ext=args.ext, scheduler=args.scheduler,
-                   workers=args.workers)
+    try:
+        failures = run(op.name, args.inputs, args.out_dir, params, ext=args.ext, scheduler=args.scheduler,
+                       workers=args.workers)
+    except ValueError as e:
+        parser.error(str(e))
+    except OSError as e:
+        print(f"python -m pxfx: {e}", file=sys.stderr)
+        return 1
     return 1 if failures else 0
 
 

@@ -68,7 +68,7 @@ def process(op, src, dst, params):
             result = apply(op, pixels, **params)
         _write(result, temp, fmt)
         os.replace(temp, dst)
-    except (OSError, ValueError, MemoryError) as e:
+    except Exception as e:  # any failure of this picture is its report, the batch goes on
         temp.unlink(missing_ok=True)
         return f"{src}: {e}"
     return None
@@ -85,9 +85,10 @@ def run(op, inputs, out_dir, params=None, *, ext="png", scheduler=None, workers=
     """Runs `op` over the picture files `inputs` into `out_dir`: on the Dask
     cluster whose scheduler is at address `scheduler`, or on a local cluster
     of `workers` processes. Prints a progress bar (when `stream` is a
-    terminal) and each failure to `stream` (default sys.stderr); returns the list of failures,
-    (input, message) pairs, empty when every picture was written or was
-    already there."""
+    terminal) and each failure to `stream` (default sys.stderr); returns the
+    failures as (input, message) pairs, none when every picture was written
+    or was already there. ValueError when two inputs would give one output
+    name; OSError when the scheduler cannot be reached."""
     from distributed import Client, LocalCluster, as_completed
 
     params = dict(params or {})
@@ -97,7 +98,11 @@ def run(op, inputs, out_dir, params=None, *, ext="png", scheduler=None, workers=
     out_dir = Path(out_dir)
     out_dir.mkdir(parents=True, exist_ok=True)
     todo = [(str(src), output_name(src, out_dir, op, ext)) for src in inputs]
-    todo = [(src, dst) for src, dst in todo if not dst.exists()]
+    sources = {}
+    for src, dst in todo:
+        if sources.setdefault(dst, src) != src:
+            raise ValueError(f"{sources[dst]} and {src} would both be written as {dst}")
+    todo = [(src, dst) for dst, src in sources.items() if not dst.exists()]
     failures = []
     if not todo:
         return failures
@@ -111,14 +116,14 @@ def run(op, inputs, out_dir, params=None, *, ext="png", scheduler=None, workers=
     try:
         with Client(scheduler) as client:
             futures = {
-                client.submit(process, op, src, str(dst), params, key=f"pxfx-{op}-{dst.name}", pure=False): src
+                client.submit(process, op, src, str(dst), params, pure=False): src
                 for src, dst in todo
             }
             for done, future in enumerate(as_completed(futures), 1):
                 src = futures[future]
                 try:
                     error = future.result()
-                except Exception as e:  # a worker lost on every try, or a task that raised
+                except Exception as e:  # its worker lost on every try
                     error = f"{src}: {type(e).__name__}: {e}"
                 if error is not None:
                     failures.append((src, error))
