@@ -1,5 +1,6 @@
 """Builds libpxfx.so and libpxfx_operations.so with CMake (the repository's
-build directory, or PXFX_BUILD_DIR) and bundles them in the package."""
+build directory, or PXFX_BUILD_DIR, configured without tests and benchmarks
+when it is new) and bundles them in the package."""
 
 import os
 import shutil
@@ -20,7 +21,10 @@ class BuildWithLibraries(build_py):
         build = Path(os.environ.get("PXFX_BUILD_DIR", ROOT / "build")).resolve()
         if not (build / "CMakeCache.txt").is_file():
             generator = ["-G", "Ninja"] if shutil.which("ninja") else []
-            subprocess.check_call(["cmake", "-S", str(ROOT), "-B", str(build), *generator, "-DCMAKE_BUILD_TYPE=Release"])
+            subprocess.check_call(
+                ["cmake", "-S", str(ROOT), "-B", str(build), *generator, "-DCMAKE_BUILD_TYPE=Release",
+                 "-DPXFX_BUILD_TESTS=OFF", "-DPXFX_BUILD_BENCH=OFF"]
+            )
         subprocess.check_call(
             ["cmake", "--build", str(build), "-j", str(os.cpu_count() or 1), "--target", "pxfx", "pxfx_operations_capi"]
         )

@@ -6,7 +6,7 @@
 set -euo pipefail
 cd "$(dirname "$0")/.."
 venv=${1:-.venv}
-bash scripts/install-deps.sh python3-numpy python3-setuptools python3-wheel python3-pip python3-venv \
+bash scripts/install-deps.sh --tool python3-numpy python3-setuptools python3-wheel python3-pip python3-venv \
   python3-pil python3-dask python3-distributed
 /usr/bin/python3 -m venv --system-site-packages "$venv"
 "$venv/bin/pip" install --quiet --no-build-isolation --no-index ./python
