@@ -54,8 +54,9 @@ def _split(argv):
     while i < len(argv):
         a = argv[i]
         if a.startswith("--") and a.split("=")[0] not in _OPTIONS:
-            words += argv[i : i + 2]
-            i += 2
+            taken = a.split("=", 1) if "=" in a else argv[i : i + 2]
+            words += taken
+            i += 1 if "=" in a else 2
         else:
             own.append(a)
             i += 1
