@@ -6,7 +6,6 @@
 #include <initializer_list>
 
 #include "color/colorspace.hpp"
-#include "core/internal/cpu.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
@@ -79,27 +78,6 @@ void combine_rows(Image *out, const PlaneRows &r1, const PlaneRows &r2, const Pl
     }
 }
 
-// Split and Combine rows through a copy compiled for AVX-512 where the
-// processor has it: more of the conversions then run in vectors.
-template <class F, Mode M, bool Alpha>
-PXFX_WIDE void split_rows_wide(const Image *src, Image *p1, Image *p2, Image *p3, Image *pa) {
-    split_rows<F, M, Alpha>(src, p1, p2, p3, pa);
-}
-template <Mode M, int Bpp>
-PXFX_WIDE void combine_rows_wide(Image *out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3,
-                                 const PlaneRows *ra) {
-    combine_rows<M, Bpp>(out, r1, r2, r3, ra);
-}
-
-template <class F, Mode M, bool Alpha> void split_any(const Image *src, Image *p1, Image *p2, Image *p3, Image *pa) {
-    cpu::pick(&split_rows<F, M, Alpha>, &split_rows_wide<F, M, Alpha>)(src, p1, p2, p3, pa);
-}
-
-template <Mode M, int Bpp>
-void combine_any(Image *out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3, const PlaneRows *ra) {
-    cpu::pick(&combine_rows<M, Bpp>, &combine_rows_wide<M, Bpp>)(out, r1, r2, r3, ra);
-}
-
 } // namespace
 
 extern "C" {
@@ -121,9 +99,9 @@ int32_t Split(const Image *src, Image **plane1, Image **plane2, Image **plane3, 
     with_format(src->bitCount, [&](auto f) {
         with_mode(mode, [&](auto m) {
             if (pa)
-                split_any<decltype(f), decltype(m)::value, true>(src, p1.get(), p2.get(), p3.get(), pa.get());
+                split_rows<decltype(f), decltype(m)::value, true>(src, p1.get(), p2.get(), p3.get(), pa.get());
             else
-                split_any<decltype(f), decltype(m)::value, false>(src, p1.get(), p2.get(), p3.get(), nullptr);
+                split_rows<decltype(f), decltype(m)::value, false>(src, p1.get(), p2.get(), p3.get(), nullptr);
         });
     });
     // The old images go only now: a slot may hold the source itself.
@@ -156,9 +134,9 @@ Image *Combine(const Image *plane1, const Image *plane2, const Image *plane3, co
     if (out == nullptr) return nullptr;
     with_mode(mode, [&](auto m) {
         if (alphaPlane != nullptr)
-            combine_any<decltype(m)::value, 4>(out, r1, r2, r3, &ra);
+            combine_rows<decltype(m)::value, 4>(out, r1, r2, r3, &ra);
         else
-            combine_any<decltype(m)::value, 3>(out, r1, r2, r3, nullptr);
+            combine_rows<decltype(m)::value, 3>(out, r1, r2, r3, nullptr);
     });
     return out;
 }
