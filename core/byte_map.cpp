@@ -1,9 +1,9 @@
-// Byte-table maps over interleaved rows, with vector lookups where the
-// machine has them: 128-byte two-register permutes on x86-64 with AVX-512
-// VBMI, four-register table lookups on arm64 (cpu::Wide::kBytePermute, chosen
-// through cpu::pick). Other machines, builds configured with PXFX_SIMD=OFF
-// and runs with the plain code forced use the plain loop.
+// Byte-table maps over interleaved rows: whole vectors through the vector
+// copy of the chosen target (core/byte_map_vector.cpp), where one runs, and
+// the rest in the plain loop.
 #include "core/internal/byte_map.hpp"
+
+#include "core/internal/vector_kernels.hpp"
 
 namespace pxfx {
 
@@ -48,6 +48,11 @@ const uint8_t kIdentityMap[256] = {
 };
 
 void map_bytes(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const uint8_t *const *tables) {
+    if (const vec::MapBytes vector = vec::map_bytes(channels)) {
+        const size_t done = vector(in, out, pixels, tables);
+        const size_t bytes = done * static_cast<size_t>(channels == 1 || channels == 3 ? channels : 4);
+        in += bytes, out += bytes, pixels -= done;
+    }
     switch (channels) {
     case 1: plain<1>(in, out, pixels, tables); break;
     case 3: plain<3>(in, out, pixels, tables); break;
@@ -56,6 +61,11 @@ void map_bytes(const uint8_t *in, uint8_t *out, size_t pixels, int channels, con
 }
 
 void tone_bytes(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const ToneTables &t) {
+    if (const vec::ToneBytes vector = vec::tone_bytes(channels)) {
+        const size_t done = vector(in, out, pixels, t);
+        const size_t bytes = done * static_cast<size_t>(channels == 3 ? 3 : 4);
+        in += bytes, out += bytes, pixels -= done;
+    }
     if (channels == 3)
         plain_tone<3>(in, out, pixels, t);
     else
