@@ -20,9 +20,12 @@ namespace {
 constexpr int64_t k128Bit = HWY_SSSE3 | HWY_SSE4 | HWY_NEON;
 
 // The best target among `allowed` that this build compiled and the processor
-// runs; emulated vectors count as none.
+// runs; emulated vectors count as none. The build's baseline target runs
+// wherever the build does, also where Highway's detection does not see it
+// (NEON on 32-bit ARM builds made for it).
 int64_t best_of(int64_t allowed) {
-    const int64_t usable = hwy::SupportedTargets() & HWY_TARGETS & allowed & ~(HWY_EMU128 | HWY_SCALAR);
+    const int64_t runs = hwy::SupportedTargets() | HWY_STATIC_TARGET;
+    const int64_t usable = runs & HWY_TARGETS & allowed & ~(HWY_EMU128 | HWY_SCALAR);
     return usable & -usable; // lower bits are better targets
 }
 
@@ -45,8 +48,6 @@ std::atomic<Path> &state() {
 } // namespace
 
 Path set_path(Path path) { return state().exchange(path, std::memory_order_relaxed); }
-
-bool force_plain(bool on) { return set_path(on ? Path::kPlain : Path::kBest) == Path::kPlain; }
 
 int64_t target() {
 #ifdef PXFX_PORTABLE_ONLY

@@ -25,10 +25,6 @@ enum class Path : uint8_t {
 // Sets the path of every kernel for the whole process; returns the one before.
 Path set_path(Path path);
 
-// Forces the plain loops (true) or lets kernels run the best target (false);
-// returns whether the plain loops were forced before.
-bool force_plain(bool on);
-
 // The Highway target bit the kernels run now; 0 for the plain loops (also
 // where the path asks for vectors that the processor or the build lacks).
 int64_t target();
