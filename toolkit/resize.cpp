@@ -9,7 +9,6 @@
 #include <cstring>
 
 #include "core/internal/memory.hpp"
-#include "core/internal/vector_kernels.hpp"
 #include "toolkit/pximage_check.hpp"
 #include "toolkit/resize_internal.hpp"
 
@@ -60,10 +59,6 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
                  int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
     Taps cols(static_cast<size_t>(dstWidth));
     if (!cols.ok()) return false;
-    // Vector copies of the blends, where the chosen target has them; each
-    // makes the leading results and the plain loops the rest.
-    const vec::BlendRows vectorRows = vec::blend_rows();
-    const vec::BlendColumns vectorColumns = C == 1 ? vec::blend_columns() : nullptr;
     // With every column weight in 0..1 the row blends stay in 0..255 (no NaN).
     bool weightsInRange = true;
     int32_t used0 = srcWidth - 1, used1 = 0; // the source columns the taps read
@@ -102,11 +97,7 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
                 for (int c = 0; c < C; ++c)
                     f[static_cast<size_t>(p) * C + c] = static_cast<float>(a[static_cast<size_t>(p) * srcStride + c]);
         }
-        const size_t done = vectorColumns != nullptr ? vectorColumns(f, cols.i0.get(), cols.i1.get(), cols.w.get(),
-                                                                     cols.omw.get(), static_cast<size_t>(dstWidth), h)
-                                                     : 0;
-        blend_columns<C>(f, cols.i0.get() + done, cols.i1.get() + done, cols.w.get() + done, cols.omw.get() + done,
-                         dstWidth - static_cast<int32_t>(done), h + done);
+        blend_columns<C>(f, cols.i0.get(), cols.i1.get(), cols.w.get(), cols.omw.get(), dstWidth, h);
         cached[y & 1] = y;
         return static_cast<const float *>(h);
     };
@@ -125,8 +116,7 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
         // every result lies well inside int32, where the saturating
         // conversion to uint32 is a plain one held at 0.
         if (weightsInRange && std::fabs(wy) <= kMaxPlainWeight && dstStride == C) {
-            const size_t done = vectorRows != nullptr ? vectorRows(top, bottom, omwy, wy, n, out) : 0;
-            for (size_t j = done; j < n; ++j) {
+            for (size_t j = 0; j < n; ++j) {
                 const auto v = static_cast<int32_t>(omwy * top[j] + wy * bottom[j]);
                 out[j] = static_cast<uint8_t>(v < 0 ? 0 : v);
             }

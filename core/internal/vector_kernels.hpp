@@ -21,27 +21,15 @@ using Median5Row = void (*)(const uint8_t *const *rows, int32_t channels, size_t
 using MapBytes = size_t (*)(const uint8_t *in, uint8_t *out, size_t pixels, const uint8_t *const *tables);
 using ToneBytes = size_t (*)(const uint8_t *in, uint8_t *out, size_t pixels, const ToneTables &t);
 
-// The bilinear blends of toolkit/resize.cpp over whole vectors, returning
-// how many leading results they made: out[j] = (1 - wy) top[j] + wy
-// bottom[j] as a byte, for blends in 0 .. 255 and |wy| <= 2^20; and
-// h[j] = omw[j] f[i0[j]] + w[j] f[i1[j]] for one sample per pixel.
-using BlendRows = size_t (*)(const float *top, const float *bottom, float omwy, float wy, size_t n, uint8_t *out);
-using BlendColumns = size_t (*)(const float *f, const int32_t *i0, const int32_t *i1, const float *w, const float *omw,
-                                size_t n, float *h);
-
 #ifdef PXFX_PORTABLE_ONLY
 inline Median5Row median5_row() { return nullptr; }
 inline MapBytes map_bytes(int) { return nullptr; }
 inline ToneBytes tone_bytes(int) { return nullptr; }
-inline BlendRows blend_rows() { return nullptr; }
-inline BlendColumns blend_columns() { return nullptr; }
 #else
 Median5Row median5_row();
 // For pixels of `channels` bytes (1, 3 or 4; 3 or 4 for the tone map).
 MapBytes map_bytes(int channels);
 ToneBytes tone_bytes(int channels);
-BlendRows blend_rows();
-BlendColumns blend_columns();
 #endif
 
 } // namespace pxfx::vec
