@@ -65,7 +65,12 @@ HWY_INLINE V lookup(const Table &t, V v) {
 }
 #endif
 
+// On x86 with 16-byte vectors, splitting and joining three or four channels
+// costs what the lookups save: those maps stay with the plain loop there.
+constexpr bool kSplitPays = HWY_TARGET != HWY_SSSE3 && HWY_TARGET != HWY_SSE4;
+
 template <int C> size_t map(const uint8_t *in, uint8_t *out, size_t pixels, const uint8_t *const *tables) {
+    if constexpr (C != 1 && !kSplitPays) return 0;
     const D d;
     const size_t lanes = hn::Lanes(d), whole = pixels / lanes * lanes;
     if constexpr (C == 1) {
