@@ -6,12 +6,19 @@
 #include <benchmark/benchmark.h>
 
 #include "core/internal/alloc_hook.hpp"
+#include "core/internal/cpu.hpp"
 
 #include <cstdint>
 #include <cstring>
 #include <random>
 
 namespace pxbench {
+
+// The vector target the kernels run (PXFX_CPU), in the report's context.
+inline const bool kTargetRecorded = [] {
+    benchmark::AddCustomContext("pxfx_target", pxfx::cpu::target_name());
+    return true;
+}();
 
 inline constexpr int32_t kWidth = 4000;
 inline constexpr int32_t kHeight = 3000;

@@ -8,7 +8,6 @@
 #include <optional>
 
 #include "color/colorspace.hpp"
-#include "core/internal/cpu.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
@@ -91,26 +90,6 @@ void combine_rows(const View &out, const PlaneRows &r1, const PlaneRows &r2, con
     }
 }
 
-// Split and Combine rows through a copy compiled for AVX-512 where the
-// processor has it: more of the conversions then run in vectors.
-template <class F, Mode M, bool Alpha> PXFX_WIDE void split_rows_wide(const View &src, const PlaneViews &p) {
-    split_rows<F, M, Alpha>(src, p);
-}
-template <Mode M, int Bpp>
-PXFX_WIDE void combine_rows_wide(const View &out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3,
-                                 const PlaneRows *ra) {
-    combine_rows<M, Bpp>(out, r1, r2, r3, ra);
-}
-
-template <class F, Mode M, bool Alpha> void split_any(const View &src, const PlaneViews &p) {
-    cpu::pick(&split_rows<F, M, Alpha>, &split_rows_wide<F, M, Alpha>)(src, p);
-}
-
-template <Mode M, int Bpp>
-void combine_any(const View &out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3, const PlaneRows *ra) {
-    cpu::pick(&combine_rows<M, Bpp>, &combine_rows_wide<M, Bpp>)(out, r1, r2, r3, ra);
-}
-
 } // namespace
 
 extern "C" {
@@ -136,9 +115,9 @@ int32_t Split(const Image *src, Image **plane1, Image **plane2, Image **plane3, 
     with_format(from.bitCount, [&](auto f) {
         with_mode(mode, [&](auto m) {
             if (pa)
-                split_any<decltype(f), decltype(m)::value, true>(from, p);
+                split_rows<decltype(f), decltype(m)::value, true>(from, p);
             else
-                split_any<decltype(f), decltype(m)::value, false>(from, p);
+                split_rows<decltype(f), decltype(m)::value, false>(from, p);
         });
     });
     // The old images go only now: a slot may hold the source itself.
@@ -172,9 +151,9 @@ Image *Combine(const Image *plane1, const Image *plane2, const Image *plane3, co
     const View to = *view_of(out);
     with_mode(mode, [&](auto m) {
         if (alphaPlane != nullptr)
-            combine_any<decltype(m)::value, 4>(to, r1, r2, r3, &ra);
+            combine_rows<decltype(m)::value, 4>(to, r1, r2, r3, &ra);
         else
-            combine_any<decltype(m)::value, 3>(to, r1, r2, r3, nullptr);
+            combine_rows<decltype(m)::value, 3>(to, r1, r2, r3, nullptr);
     });
     return out;
 }

@@ -1,55 +1,69 @@
-// Processor features, read once, and the process-wide switch to the plain code.
+// The target the vector kernels run, chosen once from what the processor has
+// (Highway's detection) and the path PXFX_CPU asks for.
 #include "core/internal/cpu.hpp"
 
 #include <atomic>
 #include <cstdlib>
 #include <string_view>
 
+#ifndef PXFX_PORTABLE_ONLY
+#include <hwy/highway.h>
+#include <hwy/targets.h>
+#endif
+
 namespace pxfx::cpu {
 
 namespace {
 
-// The kinds of copies the processor can run.
-uint32_t detect() {
-#if PXFX_X86_DISPATCH
-    __builtin_cpu_init();
-    if (!__builtin_cpu_supports("avx512f") || !__builtin_cpu_supports("avx512bw") ||
-        !__builtin_cpu_supports("avx512dq"))
-        return 0;
-    const uint32_t wide = static_cast<uint32_t>(Wide::kAvx512);
-    return __builtin_cpu_supports("avx512vbmi") ? wide | static_cast<uint32_t>(Wide::kBytePermute) : wide;
-#elif PXFX_ARM_NEON
-    return static_cast<uint32_t>(Wide::kBytePermute);
-#else
-    return 0;
+#ifndef PXFX_PORTABLE_ONLY
+// Targets whose vectors are 16 bytes.
+constexpr int64_t k128Bit = HWY_SSSE3 | HWY_SSE4 | HWY_NEON;
+
+// The best target among `allowed` that this build compiled and the processor
+// runs; emulated vectors count as none. The build's baseline target runs
+// wherever the build does, also where Highway's detection does not see it
+// (NEON on 32-bit ARM builds made for it).
+int64_t best_of(int64_t allowed) {
+    const int64_t runs = hwy::SupportedTargets() | HWY_STATIC_TARGET;
+    const int64_t usable = runs & HWY_TARGETS & allowed & ~(HWY_EMU128 | HWY_SCALAR);
+    return usable & -usable; // lower bits are better targets
+}
+
+// The target of each path, detected once.
+const int64_t *targets() {
+    static const int64_t of[3] = {0, best_of(k128Bit), best_of(~int64_t{0})};
+    return of;
+}
 #endif
-}
 
-uint32_t detected() {
-    static const uint32_t kinds = detect();
-    return kinds;
-}
-
-// The kinds that may run, or kForced alone while the plain code is forced.
-constexpr uint32_t kForced = 1u << 31;
-
-std::atomic<uint32_t> &state() {
-    static std::atomic<uint32_t> kinds{[] {
+std::atomic<Path> &state() {
+    static std::atomic<Path> path{[] {
         const char *env = std::getenv("PXFX_CPU");
-        return env != nullptr && std::string_view(env) == "scalar" ? kForced : detected();
+        const std::string_view v = env != nullptr ? env : "";
+        return v == "scalar" ? Path::kPlain : (v == "128" ? Path::k128 : Path::kBest);
     }()};
-    return kinds;
+    return path;
 }
 
 } // namespace
 
-uint32_t enabled() {
-    const uint32_t kinds = state().load(std::memory_order_relaxed);
-    return (kinds & kForced) != 0 ? 0 : kinds;
+Path set_path(Path path) { return state().exchange(path, std::memory_order_relaxed); }
+
+int64_t target() {
+#ifdef PXFX_PORTABLE_ONLY
+    return 0;
+#else
+    return targets()[static_cast<int>(state().load(std::memory_order_relaxed))];
+#endif
 }
 
-bool force_plain(bool on) {
-    return (state().exchange(on ? kForced : detected(), std::memory_order_relaxed) & kForced) != 0;
+const char *target_name() {
+#ifdef PXFX_PORTABLE_ONLY
+    return "scalar";
+#else
+    const int64_t t = target();
+    return t == 0 ? "scalar" : hwy::TargetName(t);
+#endif
 }
 
 } // namespace pxfx::cpu

@@ -7,6 +7,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
@@ -71,6 +72,16 @@ template <class F> class Window {
   private:
     T *slot(int32_t r) { return ring_.get() + static_cast<size_t>(r % size_) * padded_; }
 
+    // Pixels 0 .. own - 1 of padded row r are a plain copy of the row; the
+    // others go through `clamped`, which gives pixel p's samples.
+    template <class Clamped> void fill(T *out, const uint8_t *row, int32_t own, Clamped clamped) {
+        std::memcpy(out + static_cast<size_t>(half_) * C, row, static_cast<size_t>(own) * C * sizeof(T));
+        for (int32_t p = -half_; p < 0; ++p)
+            clamped(p);
+        for (int32_t p = own; p < v_.width + half_; ++p)
+            clamped(p);
+    }
+
     void build(int32_t r) {
         T *out = slot(r);
         const int32_t w = v_.width;
@@ -78,23 +89,26 @@ template <class F> class Window {
             const uint8_t *block = v_.bits;
             const size_t rowStart = static_cast<size_t>(r) * v_.pitch, end = v_.block_bytes();
             const int64_t last = int64_t{w} * 3 - 1;
-            for (int32_t p = -half_; p < w + half_; ++p) {
+            const int32_t own = rowStart + static_cast<size_t>(w) * 3 <= end ? w : 0;
+            fill(out, block + rowStart, own, [&](int32_t p) {
                 int64_t idx = int64_t{p} * 3;
                 idx = idx < 0 ? 0 : (idx > last ? last : idx);
                 for (int32_t c = 0; c < 3; ++c) {
                     const size_t k = rowStart + static_cast<size_t>(idx) + c;
                     out[static_cast<size_t>(p + half_) * 3 + c] = k < end ? block[k] : 0;
                 }
-            }
+            });
         } else {
             const uint8_t *row = v_.row(r);
-            for (int32_t p = -half_; p < w + half_; ++p) {
+            // 16-bit samples are widened one by one.
+            const int32_t own = sizeof(T) == 1 ? w : 0;
+            fill(out, row, own, [&](int32_t p) {
                 const int32_t x = p < 0 ? 0 : (p >= w ? w - 1 : p);
                 if constexpr (sizeof(T) == 1)
                     out[p + half_] = row[x];
                 else
                     out[p + half_] = static_cast<T>(load16(row + 2 * static_cast<size_t>(x)));
-            }
+            });
         }
     }
 

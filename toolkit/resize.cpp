@@ -8,7 +8,6 @@
 #include <cmath>
 #include <cstring>
 
-#include "core/internal/cpu.hpp"
 #include "core/internal/memory.hpp"
 #include "toolkit/pximage_check.hpp"
 #include "toolkit/resize_internal.hpp"
@@ -131,24 +130,9 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
     return true;
 }
 
-// The same code compiled for AVX-512, whose gathers let the column blends run
-// in vectors; the float operations and their order are the same.
-template <int C>
-PXFX_WIDE bool interpolate_wide(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
-                                int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
-    return interpolate<C>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
-}
-
-template <int C>
-bool interpolate_any(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
-                     int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
-    return cpu::pick(&interpolate<C>, &interpolate_wide<C>)(src, srcWidth, srcHeight, srcStride, dst, dstWidth,
-                                                            dstHeight, dstStride, ry, rx);
-}
-
 bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
                        int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
-    return interpolate_any<1>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
+    return interpolate<1>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
 }
 
 } // namespace pxfx::packed
@@ -219,7 +203,7 @@ PXImage *PXImage_Resize(const PXImage *src, int32_t newWidth, int32_t newHeight)
     if (from->bitCount == 8) {
         ok = interpolate_plane(from->bits, w, h, 1, to->bits, newWidth, newHeight, 1, ry, rx);
     } else if (from->bitCount == 24) {
-        ok = interpolate_any<3>(from->bits, w, h, 3, to->bits, newWidth, newHeight, 3, ry, rx);
+        ok = interpolate<3>(from->bits, w, h, 3, to->bits, newWidth, newHeight, 3, ry, rx);
     } else {
         // A 16-bit source is read as three-byte pixels; the bytes that this
         // stride puts past the end of its block read as 0.

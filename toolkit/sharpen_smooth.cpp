@@ -7,11 +7,12 @@
 #include <cstring>
 #include <utility>
 
-#include "core/internal/cpu.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/rank.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "toolkit/neighbourhood.hpp"
 #include "toolkit/pximage_check.hpp"
+#include "toolkit/select_network.hpp"
 
 using namespace pxfx;
 using namespace pxfx::packed;
@@ -96,56 +97,6 @@ template <class F> void median_row_bytes(const uint8_t *const *rows, int32_t siz
     }
 }
 
-// A compare-exchange network that leaves element K of N values at index
-// `out`: Batcher's odd-even merge sort of the next power of two, with the
-// missing inputs taken as +infinity (comparators against them vanish or only
-// move a value) and the comparators that cannot reach `out` dropped.
-template <int N, int K> struct SelectNetwork {
-    struct Op {
-        uint8_t lo, hi; // lo receives the smaller value, hi the larger
-    };
-    static constexpr int kWires = N <= 32 ? 32 : 64;
-    static constexpr int kInfinite = -1;
-    Op ops[kWires * kWires] = {};
-    int count = 0;
-    int out = 0;
-
-    constexpr SelectNetwork() {
-        int slot[kWires] = {};
-        for (int i = 0; i < kWires; ++i)
-            slot[i] = i < N ? i : kInfinite;
-        Op all[kWires * kWires] = {};
-        int n = 0;
-        for (int p = 1; p < kWires; p <<= 1)
-            for (int k = p; k >= 1; k >>= 1)
-                for (int j = k % p; j + k < kWires; j += 2 * k)
-                    for (int i = 0; i < k && i + j + k < kWires; ++i) {
-                        const int a = i + j, b = i + j + k;
-                        if ((a / (2 * p)) != (b / (2 * p))) continue;
-                        if (slot[b] == kInfinite) continue;
-                        if (slot[a] == kInfinite) {
-                            slot[a] = slot[b];
-                            slot[b] = kInfinite;
-                            continue;
-                        }
-                        all[n++] = {static_cast<uint8_t>(slot[a]), static_cast<uint8_t>(slot[b])};
-                    }
-        out = slot[K];
-        bool needed[N] = {};
-        needed[out] = true;
-        bool keep[kWires * kWires] = {};
-        for (int i = n - 1; i >= 0; --i)
-            if (needed[all[i].lo] || needed[all[i].hi]) {
-                keep[i] = true;
-                needed[all[i].lo] = needed[all[i].hi] = true;
-            }
-        for (int i = 0; i < n; ++i)
-            if (keep[i]) ops[count++] = all[i];
-    }
-};
-
-template <int N, int K> inline constexpr SelectNetwork<N, K> kSelect{};
-
 // One compare-exchange of lanes a and b.
 template <size_t Lanes> inline void compare_exchange(uint8_t (&a)[Lanes], uint8_t (&b)[Lanes]) {
     for (size_t j = 0; j < Lanes; ++j) {
@@ -164,7 +115,7 @@ inline void apply_network(uint8_t (&v)[N][Lanes], std::index_sequence<I...>) {
 // Median of byte samples through the selection network, kLanes samples at a
 // time: value v of lane j is the window sample v (row-major) of sample i0 + j.
 template <int Size, size_t kLanes>
-inline void median_row_network(const uint8_t *const *rows, int32_t channels, size_t n, int32_t *acc) {
+inline void median_row_network(const uint8_t *const *rows, int32_t channels, size_t n, uint8_t *out) {
     constexpr int N = Size * Size, half = Size / 2;
     constexpr const auto &kNet = kSelect<N, N / 2>;
     uint8_t v[N][kLanes];
@@ -182,22 +133,18 @@ inline void median_row_network(const uint8_t *const *rows, int32_t channels, siz
             }
         apply_network<kSelect<N, N / 2>>(v, std::make_index_sequence<kSelect<N, N / 2>.count>{});
         for (size_t j = 0; j < m; ++j)
-            acc[i0 + j] = v[kNet.out][j];
+            out[i0 + j] = v[kNet.out][j];
     }
 }
 
-using MedianRow = void (*)(const uint8_t *const *, int32_t, size_t, int32_t *);
-
-void median5_row(const uint8_t *const *rows, int32_t channels, size_t n, int32_t *acc) {
-    median_row_network<5, 16>(rows, channels, n, acc);
+void median5_row(const uint8_t *const *rows, int32_t channels, size_t n, uint8_t *out) {
+    median_row_network<5, 16>(rows, channels, n, out);
 }
 
-// The same network compiled for 64-byte vectors, for processors that have them.
-PXFX_WIDE void median5_row_wide(const uint8_t *const *rows, int32_t channels, size_t n, int32_t *acc) {
-    median_row_network<5, 64>(rows, channels, n, acc);
+vec::Median5Row pick_median5() {
+    const vec::Median5Row vector = vec::median5_row();
+    return vector != nullptr ? vector : &median5_row;
 }
-
-MedianRow pick_median5() { return cpu::pick(&median5_row, &median5_row_wide); }
 
 // Median of 16-bit samples by selection of element size^2 / 2.
 void median_row_words(const uint16_t *const *rows, int32_t size, size_t width, int32_t *acc) {
@@ -219,14 +166,16 @@ template <class F> bool median_smooth(const View &v, int32_t size) {
     Buffer<int32_t> acc = alloc_buffer<int32_t>(n);
     if (!win.ok() || !acc) return false;
     const typename F::T *rows[7];
-    const MedianRow median5 = pick_median5();
+    const vec::Median5Row median5 = pick_median5();
     for (int32_t y = 0; y < v.height; ++y) {
         win.rows_for(y, rows);
         if constexpr (sizeof(typename F::T) == 1) {
-            if (size == 5)
-                median5(rows, F::kChannels, n, acc.get());
-            else
-                median_row_bytes<F>(rows, size, static_cast<size_t>(v.width), acc.get());
+            if (size == 5) {
+                // Medians of bytes are bytes: they go straight into the row.
+                median5(rows, F::kChannels, n, v.row(y));
+                continue;
+            }
+            median_row_bytes<F>(rows, size, static_cast<size_t>(v.width), acc.get());
         } else
             median_row_words(rows, size, static_cast<size_t>(v.width), acc.get());
         store_row<F>(v, y, acc.get(), n, [](int32_t s) { return s; });

@@ -15,6 +15,7 @@
 #include <unistd.h>
 #include <vector>
 
+#include "core/internal/cpu.hpp"
 #include "gallery.hpp"
 #include "image_io.hpp"
 #include "operations.hpp"
@@ -32,6 +33,7 @@ const char *kUsageText = "usage:\n"
                          "  pxfx apply OPERATION [--PARAM VALUE ...] [PICTURE OPTIONS] IN... -o DIR [-j N]\n"
                          "             [--ext png|jpg|webp|bmp]\n"
                          "  pxfx gallery [PHOTO] -o DIR                 every operation on one photo, as HTML\n"
+                         "  pxfx version                                version and the vector target in use\n"
                          "Pictures are read from PNG, JPEG, BMP, WebP or HEIF, turned upright and converted\n"
                          "to sRGB; the output type follows the extension (PNG, JPEG, WebP or BMP).\n"
                          "Picture options:\n"
@@ -349,6 +351,11 @@ int main(int argc, char **argv) {
         return kOk;
     }
     if (cmd == "list") return cmd_list();
+    if (cmd == "version") {
+        // The target follows PXFX_CPU (scalar, 128 or the best one).
+        std::printf("pxfx %s\nvector target: %s\n", PXFX_VERSION, pxfx::cpu::target_name());
+        return kOk;
+    }
     if (cmd == "apply") return cmd_apply(argc - 2, argv + 2);
     if (cmd == "gallery") return cmd_gallery(argc - 2, argv + 2);
     std::fprintf(stderr, "pxfx: unknown command '%s'\n%s", cmd.c_str(), kUsageText);

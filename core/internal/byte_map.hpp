@@ -1,9 +1,9 @@
 // Byte tables over rows of interleaved channels: byte k of every pixel goes
 // through tables[k]. The per-channel table maps of pictures (map_channels in
 // core/internal/channel_map.hpp) and of packed sample blocks end here, so the
-// one routine that does the lookups can use the widest table-lookup
-// instructions the machine has (chosen through cpu::pick). Every path gives
-// the same bytes as the plain loop.
+// one routine that does the lookups can run them in vectors (the chosen
+// target's copy, core/internal/cpu.hpp). Every path gives the same bytes as
+// the plain loop.
 #pragma once
 
 #include <cstddef>

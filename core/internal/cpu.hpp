@@ -1,64 +1,36 @@
-// The one place where kernels choose between their plain code and a vector
-// copy of it. Detection runs once per process; the environment variable
-// PXFX_CPU=scalar (read once) or force_plain() makes every kernel run its
-// plain code. Both copies of a kernel give the same bytes.
-//
-// Two kinds of copies exist:
-//   Wide::kAvx512       a kernel's own plain C++ compiled again with PXFX_WIDE
-//                       for AVX-512 (x86-64 with GCC or Clang only);
-//   Wide::kBytePermute  the byte-table lookups of core/byte_map.cpp, written
-//                       with AVX-512 VBMI permutes (x86-64) or NEON table
-//                       lookups (arm64).
-// PXFX_X86_DISPATCH and PXFX_ARM_NEON tell code written with intrinsics which
-// copies to compile. Builds configured with PXFX_SIMD=OFF (PXFX_PORTABLE_ONLY)
-// carry neither kind, and cpu::pick then folds to the plain code at compile
-// time, as it does for the AVX-512 copies on ARM.
+// The one place where kernels choose between their plain loops and their
+// vector code. The vector code of a kernel is written once against Highway
+// and compiled for every target of the architecture (SSSE3, SSE4, AVX2 and
+// AVX-512 on x86-64, NEON on ARM); core/internal/simd.hpp picks a kernel's copy
+// for the target chosen here. The choice is made once per process from the
+// processor and the environment variable PXFX_CPU:
+//   PXFX_CPU=scalar   the plain loops;
+//   PXFX_CPU=128      the best target with 16-byte vectors (SSE4 or SSSE3 on
+//                     x86-64, NEON on ARM: what phones run);
+//   unset or other    the best target the processor has.
+// Every path gives the same bytes. Builds configured with PXFX_SIMD=OFF, or
+// without Highway (PXFX_PORTABLE_ONLY), carry the plain loops only.
 #pragma once
 
 #include <cstdint>
 
-#if !defined(PXFX_PORTABLE_ONLY) && defined(__x86_64__) && (defined(__GNUC__) || defined(__clang__))
-#define PXFX_X86_DISPATCH 1
-#define PXFX_ARM_NEON 0
-// A wide copy: the function and everything it calls compiled for AVX-512.
-// The code is the same plain C++, so its results are the same (the build
-// never contracts multiply-add).
-#define PXFX_WIDE __attribute__((target("avx512f,avx512bw,avx512dq"), flatten))
-#elif !defined(PXFX_PORTABLE_ONLY) && defined(__aarch64__)
-#define PXFX_X86_DISPATCH 0
-#define PXFX_ARM_NEON 1
-#define PXFX_WIDE
-#else
-#define PXFX_X86_DISPATCH 0
-#define PXFX_ARM_NEON 0
-#define PXFX_WIDE
-#endif
-
 namespace pxfx::cpu {
 
-enum class Wide : uint32_t {
-    kAvx512 = 1,      // AVX-512 foundation, byte/word and dword/qword
-    kBytePermute = 2, // the above and VBMI; on arm64 NEON, always present
+enum class Path : uint8_t {
+    kPlain, // the plain loops
+    k128,   // the best target with 16-byte vectors
+    kBest,  // the best target the processor has
 };
 
-// Whether this build carries copies of the kind at all.
-constexpr bool built(Wide w) {
-    return w == Wide::kAvx512 ? PXFX_X86_DISPATCH != 0 : (PXFX_X86_DISPATCH != 0 || PXFX_ARM_NEON != 0);
-}
+// Sets the path of every kernel for the whole process; returns the one before.
+Path set_path(Path path);
 
-// The kinds (Wide bits) that may run now: the processor's, or none while the
-// plain code is forced.
-uint32_t enabled();
+// The Highway target bit the kernels run now; 0 for the plain loops (also
+// where the path asks for vectors that the processor or the build lacks).
+int64_t target();
 
-// Forces the plain code in every kernel (true) or lets each run the best copy
-// the processor has (false), for the whole process; returns whether the plain
-// code was forced before. Starts as PXFX_CPU says.
-bool force_plain(bool on);
-
-// The copy of a kernel to run: `wide` when this build has copies of kind
-// `Needs` and they may run now, else `plain`.
-template <Wide Needs = Wide::kAvx512, class Fn> Fn pick(Fn plain, Fn wide) {
-    return built(Needs) && (enabled() & static_cast<uint32_t>(Needs)) != 0 ? wide : plain;
-}
+// The name of target(): "scalar" for the plain loops, else Highway's name
+// ("SSSE3", "SSE4", "AVX2", "AVX3", "NEON").
+const char *target_name();
 
 } // namespace pxfx::cpu

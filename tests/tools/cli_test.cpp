@@ -2,6 +2,7 @@
 // batches, and the error cases (exit status, no output left behind).
 #include <gtest/gtest.h>
 
+#include <cstdio>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
@@ -112,6 +113,14 @@ TEST_F(Cli, ErrorsExitNonZeroAndLeaveNoOutput) {
     EXPECT_EQ(run("--help"), 0);
     EXPECT_EQ(run("apply sketch --help"), 0);
     EXPECT_EQ(run("list"), 0);
+    EXPECT_EQ(run("version"), 0);
+    // The version names the vector target that PXFX_CPU chose.
+    if (FILE *pipe = popen(("PXFX_CPU=scalar " + std::string(PXFX_CLI) + " version").c_str(), "r")) {
+        char text[256] = {};
+        const size_t got = std::fread(text, 1, sizeof text - 1, pipe);
+        pclose(pipe);
+        EXPECT_NE(std::string(text, got).find("vector target: scalar"), std::string::npos) << text;
+    }
     for (const auto &entry : fs::directory_iterator(dir)) {
         const std::string name = entry.path().filename().string();
         EXPECT_TRUE(name == "colour.png" || name == "alpha.png" || name == "colour.bmp" || name == "corrupt.png" ||

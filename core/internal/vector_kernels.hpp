@@ -1,0 +1,35 @@
+// The kernels that have vector code, each as its copy for the chosen target
+// (core/internal/cpu.hpp); null where the plain loops run. Every copy gives
+// the same bytes as the plain loop it stands for.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+#include "core/internal/byte_map.hpp"
+
+namespace pxfx::vec {
+
+// Median of the 5 x 5 window of byte samples: rows[0..4] are the window's
+// padded rows (2 * channels samples readable before and after), out[i] gets
+// the median of sample i for i < n.
+using Median5Row = void (*)(const uint8_t *const *rows, int32_t channels, size_t n, uint8_t *out);
+
+// Byte-table maps of core/internal/byte_map.hpp over whole vectors: they map
+// the first pixels, a multiple of the vector size, and return how many; the
+// caller maps the rest.
+using MapBytes = size_t (*)(const uint8_t *in, uint8_t *out, size_t pixels, const uint8_t *const *tables);
+using ToneBytes = size_t (*)(const uint8_t *in, uint8_t *out, size_t pixels, const ToneTables &t);
+
+#ifdef PXFX_PORTABLE_ONLY
+inline Median5Row median5_row() { return nullptr; }
+inline MapBytes map_bytes(int) { return nullptr; }
+inline ToneBytes tone_bytes(int) { return nullptr; }
+#else
+Median5Row median5_row();
+// For pixels of `channels` bytes (1, 3 or 4; 3 or 4 for the tone map).
+MapBytes map_bytes(int channels);
+ToneBytes tone_bytes(int channels);
+#endif
+
+} // namespace pxfx::vec

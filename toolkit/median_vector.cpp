@@ -1,0 +1,179 @@
+// The 5 x 5 median of byte samples in vectors. The window's five columns are
+// sorted first, once per row for every sample (each column serves five
+// results); then the values of equal rank across the window's columns are
+// sorted. Each value of the resulting 5 x 5 table then has every value above
+// and to the left of it below it, which leaves 6 values certainly below the
+// median, 6 certainly above it, and the median as the middle one of the 13
+// others. The median of 25 values is unique, so the result is the plain
+// network's byte for byte.
+#ifndef PXFX_PORTABLE_ONLY
+
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "toolkit/median_vector.cpp"
+#include <hwy/foreach_target.h> // IWYU pragma: keep
+#include <hwy/highway.h>
+
+#include <algorithm>
+#include <cstring>
+#include <utility>
+
+#include "core/internal/vector_kernels.hpp"
+#include "toolkit/select_network.hpp"
+
+#ifndef PXFX_MEDIAN_VECTOR_NETWORK
+#define PXFX_MEDIAN_VECTOR_NETWORK
+
+namespace pxfx {
+
+namespace {
+
+// The compare-exchanges after the column sort over 25 wires (wire 5 * r + c
+// holds rank r of window column c): the sort of every rank across the
+// columns, then the selection of the middle of the 13 undecided values, with
+// the comparators that cannot reach the result dropped.
+struct Median25Network {
+    struct Op {
+        uint8_t lo, hi;
+    };
+    Op ops[5 * 9 + 64] = {};
+    int count = 0;
+    int out = 0;
+
+    constexpr Median25Network() {
+        constexpr uint8_t kSort5[9][2] = {{0, 1}, {3, 4}, {2, 4}, {2, 3}, {0, 3}, {0, 2}, {1, 4}, {1, 3}, {1, 2}};
+        // (rank, position in the sorted rank) of the undecided values.
+        constexpr uint8_t kOpen[13][2] = {{0, 3}, {0, 4}, {1, 2}, {1, 3}, {1, 4}, {2, 1}, {2, 2},
+                                          {2, 3}, {3, 0}, {3, 1}, {3, 2}, {4, 0}, {4, 1}};
+        Op all[5 * 9 + 64] = {};
+        int n = 0;
+        for (int r = 0; r < 5; ++r)
+            for (const auto &op : kSort5)
+                all[n++] = {static_cast<uint8_t>(5 * r + op[0]), static_cast<uint8_t>(5 * r + op[1])};
+        constexpr const auto &kMid = kSelect<13, 6>;
+        auto wire = [&](int i) { return static_cast<uint8_t>(5 * kOpen[i][0] + kOpen[i][1]); };
+        for (int i = 0; i < kMid.count; ++i)
+            all[n++] = {wire(kMid.ops[i].lo), wire(kMid.ops[i].hi)};
+        out = wire(kMid.out);
+        bool needed[25] = {};
+        needed[out] = true;
+        bool keep[5 * 9 + 64] = {};
+        for (int i = n - 1; i >= 0; --i)
+            if (needed[all[i].lo] || needed[all[i].hi]) {
+                keep[i] = true;
+                needed[all[i].lo] = needed[all[i].hi] = true;
+            }
+        for (int i = 0; i < n; ++i)
+            if (keep[i]) ops[count++] = all[i];
+    }
+};
+
+inline constexpr Median25Network kMedian25{};
+
+// Samples per strip: the sorted columns of a strip stay on the stack, with
+// room for the window's reach (2 columns of at most 4 channels each side) and
+// for whole vectors past the end.
+constexpr size_t kStrip = 2048;
+constexpr size_t kColumn = kStrip + 4 * 4 + HWY_MAX_BYTES;
+
+} // namespace
+
+} // namespace pxfx
+
+#endif // PXFX_MEDIAN_VECTOR_NETWORK
+
+HWY_BEFORE_NAMESPACE();
+namespace pxfx::HWY_NAMESPACE {
+namespace {
+
+namespace hn = hwy::HWY_NAMESPACE;
+using D = hn::ScalableTag<uint8_t>;
+using V = hn::Vec<D>;
+
+HWY_INLINE void compare_exchange(V &a, V &b) {
+    const V lo = hn::Min(a, b);
+    b = hn::Max(a, b);
+    a = lo;
+}
+
+template <size_t... I> HWY_INLINE void sort_rank_and_select(V (&v)[25], std::index_sequence<I...>) {
+    (compare_exchange(v[kMedian25.ops[I].lo], v[kMedian25.ops[I].hi]), ...);
+}
+
+// Sorts the five rows' samples [from, from + count) column by column into
+// cols[0..4] at `to`; count is at most one vector, the rest of the vector is
+// written with what padding gives.
+HWY_INLINE void sort_columns(const uint8_t *const *rows, ptrdiff_t from, size_t count, uint8_t (*cols)[kColumn],
+                             size_t to) {
+    const D d;
+    const size_t lanes = hn::Lanes(d);
+    V v[5];
+    if (count == lanes) {
+        for (int r = 0; r < 5; ++r)
+            v[r] = hn::LoadU(d, rows[r] + from);
+    } else {
+        HWY_ALIGN uint8_t part[HWY_MAX_BYTES] = {};
+        for (int r = 0; r < 5; ++r) {
+            std::memcpy(part, rows[r] + from, count);
+            v[r] = hn::Load(d, part);
+        }
+    }
+    compare_exchange(v[0], v[1]);
+    compare_exchange(v[3], v[4]);
+    compare_exchange(v[2], v[4]);
+    compare_exchange(v[2], v[3]);
+    compare_exchange(v[0], v[3]);
+    compare_exchange(v[0], v[2]);
+    compare_exchange(v[1], v[4]);
+    compare_exchange(v[1], v[3]);
+    compare_exchange(v[1], v[2]);
+    for (int r = 0; r < 5; ++r)
+        hn::StoreU(v[r], d, cols[r] + to);
+}
+
+void median5_row(const uint8_t *const *rows, int32_t channels, size_t n, uint8_t *out) {
+    const D d;
+    const size_t lanes = hn::Lanes(d);
+    const auto C = static_cast<size_t>(channels);
+    // cols[r][t]: rank r of the window column at sample s - 2C + t.
+    HWY_ALIGN uint8_t cols[5][kColumn];
+    HWY_ALIGN uint8_t last[HWY_MAX_BYTES];
+    for (size_t s = 0; s < n; s += kStrip) {
+        const size_t len = std::min(kStrip, n - s), span = len + 4 * C;
+        const ptrdiff_t first = static_cast<ptrdiff_t>(s) - 2 * static_cast<ptrdiff_t>(C);
+        for (size_t t = 0; t < span; t += lanes)
+            sort_columns(rows, first + static_cast<ptrdiff_t>(t), std::min(lanes, span - t), cols, t);
+        for (size_t j = 0; j < len; j += lanes) {
+            V v[25];
+            for (int r = 0; r < 5; ++r)
+                for (size_t c = 0; c < 5; ++c)
+                    v[5 * r + c] = hn::LoadU(d, cols[r] + j + c * C);
+            sort_rank_and_select(v, std::make_index_sequence<kMedian25.count>{});
+            const size_t m = std::min(lanes, len - j);
+            if (m == lanes) {
+                hn::StoreU(v[kMedian25.out], d, out + s + j);
+            } else {
+                hn::Store(v[kMedian25.out], d, last);
+                std::memcpy(out + s + j, last, m);
+            }
+        }
+    }
+}
+
+} // namespace
+} // namespace pxfx::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+#include "core/internal/simd.hpp"
+
+namespace pxfx {
+namespace {
+HWY_EXPORT(median5_row);
+} // namespace
+
+vec::Median5Row vec::median5_row() { return PXFX_VECTOR_COPY(median5_row); }
+
+} // namespace pxfx
+#endif
+
+#endif // PXFX_PORTABLE_ONLY
