@@ -92,16 +92,14 @@ int32_t Best_Color(Image *img, int32_t size) {
     uint8_t *first = rows.get(), *second = first + w, *third = second + w;
     for (int32_t y = 0; y < h; ++y) {
         std::memset(rows.get(), 0, static_cast<size_t>(w) * 3);
-        for (int32_t dy = 0; dy < size; ++dy)
-            for (int32_t dx = 0; dx < size; ++dx) {
-                const uint8_t *p = pad.get() + static_cast<size_t>(y + dy) * pw + dx;
-                for (int32_t x = 0; x < w; ++x) {
-                    const uint8_t v = p[x];
-                    third[x] = std::max(third[x], std::min(second[x], v));
-                    second[x] = std::max(second[x], std::min(first[x], v));
-                    first[x] = std::max(first[x], v);
-                }
+        for_each_window_offset(pad.get(), pw, y, size, [&](const uint8_t *p) {
+            for (int32_t x = 0; x < w; ++x) {
+                const uint8_t v = p[x];
+                third[x] = std::max(third[x], std::min(second[x], v));
+                second[x] = std::max(second[x], std::min(first[x], v));
+                first[x] = std::max(first[x], v);
             }
+        });
         std::memcpy(v->row(y), third, static_cast<size_t>(w));
     }
     return 1;

@@ -36,6 +36,15 @@ inline Buffer<uint8_t> padded_plane(const uint8_t *plane, size_t stride, int32_t
     return pad;
 }
 
+// Calls fn(values) for each of the side x side offsets of the windows of row
+// y of a padded plane (rows of `pw` bytes, from padded_plane): `values` holds
+// the value at that offset of every pixel's window, one per pixel of the row.
+template <class Fn> void for_each_window_offset(const uint8_t *pad, size_t pw, int32_t y, int32_t side, Fn &&fn) {
+    for (int32_t dy = 0; dy < side; ++dy)
+        for (int32_t dx = 0; dx < side; ++dx)
+            fn(pad + static_cast<size_t>(y + dy) * pw + dx);
+}
+
 // Calls fn(x, y, centre, hist) for every pixel of a w x h plane (rows of
 // `stride` bytes), rows from the top, with the histogram of the window of
 // offsets lo..hi in both directions, reads clamped to the plane. Returns false

@@ -39,16 +39,14 @@ bool spot_map(const View &mask, uint8_t *spots) {
     for (int32_t y = 0; y < h; ++y) {
         const uint8_t *centre = mask.row(y);
         std::memset(rows.get(), 0, static_cast<size_t>(w) * 3);
-        for (int32_t dy = 0; dy < side; ++dy)
-            for (int32_t dx = 0; dx < side; ++dx) {
-                const uint8_t *p = pad.get() + static_cast<size_t>(y + dy) * pw + dx;
-                for (int32_t x = 0; x < w; ++x) {
-                    const uint8_t v = p[x];
-                    above[x] = static_cast<uint8_t>(above[x] + (v > centre[x]));
-                    second[x] = std::max(second[x], std::min(first[x], v));
-                    first[x] = std::max(first[x], v);
-                }
+        for_each_window_offset(pad.get(), pw, y, side, [&](const uint8_t *p) {
+            for (int32_t x = 0; x < w; ++x) {
+                const uint8_t v = p[x];
+                above[x] = static_cast<uint8_t>(above[x] + (v > centre[x]));
+                second[x] = std::max(second[x], std::min(first[x], v));
+                first[x] = std::max(first[x], v);
             }
+        });
         uint8_t *out = spots + static_cast<size_t>(y) * w;
         for (int32_t x = 0; x < w; ++x)
             if (centre[x] != 0 && above[x] >= kMinBrighter) out[x] = static_cast<uint8_t>(second[x] - centre[x]);

@@ -32,9 +32,7 @@ namespace {
 // columns, then the selection of the middle of the 13 undecided values, with
 // the comparators that cannot reach the result dropped.
 struct Median25Network {
-    struct Op {
-        uint8_t lo, hi;
-    };
+    using Op = CompareOp;
     Op ops[5 * 9 + 64] = {};
     int count = 0;
     int out = 0;
@@ -54,16 +52,7 @@ struct Median25Network {
         for (int i = 0; i < kMid.count; ++i)
             all[n++] = {wire(kMid.ops[i].lo), wire(kMid.ops[i].hi)};
         out = wire(kMid.out);
-        bool needed[25] = {};
-        needed[out] = true;
-        bool keep[5 * 9 + 64] = {};
-        for (int i = n - 1; i >= 0; --i)
-            if (needed[all[i].lo] || needed[all[i].hi]) {
-                keep[i] = true;
-                needed[all[i].lo] = needed[all[i].hi] = true;
-            }
-        for (int i = 0; i < n; ++i)
-            if (keep[i]) ops[count++] = all[i];
+        count = keep_reaching(all, n, out, ops);
     }
 };
 
