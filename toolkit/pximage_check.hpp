@@ -52,16 +52,6 @@ inline bool px_rows_inside(const PXImage *im) {
     return im->data == nullptr || im->width <= 0 || im->height <= 0 || px_usable(im);
 }
 
-// Bytes of the pixel block of a usable record of a stored bit count.
-inline size_t px_block(const PXImage *im) {
-    return static_cast<size_t>(im->width) * static_cast<size_t>(im->height) *
-           static_cast<size_t>(px_bytes(im->bitcount));
-}
-
-// Bytes of the pixel block of any record: none without data or with a width
-// or height of 0 or below (such a record has no pixel rows).
-inline size_t px_held(const PXImage *im) { return px_usable(im) ? px_block(im) : 0; }
-
 // A new record of width x height pixels (sizes from block_size) with a block
 // of `bytes` bytes. A count of 0 or below gives data null, as PX_malloc gives
 // no block for it. A positive block is left uninitialised. Null when the

@@ -66,9 +66,6 @@ inline bool rows_inside(const Image *im) {
     return im->bits == nullptr || im->width <= 0 || im->height <= 0 || geometry_ok(im);
 }
 
-// True for an 8-bit record with pixels.
-inline bool is_plane(const Image *im) { return has_pixels(im) && im->bitCount == 8; }
-
 // Bytes of the pixel block of a valid record.
 inline size_t block_bytes(const Image *im) { return static_cast<size_t>(im->pitch) * static_cast<size_t>(im->height); }
 
