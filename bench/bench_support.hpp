@@ -5,7 +5,7 @@
 
 #include <benchmark/benchmark.h>
 
-#include "core/internal/alloc_hook.hpp"
+#include "tests/support/allocation_hook.hpp"
 #include "core/internal/cpu.hpp"
 
 #include <cstdint>

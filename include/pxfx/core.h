@@ -16,6 +16,16 @@
  *  - PX_fopen refuses (returns null) names of 256 bytes or more.
  *  - PX_rand draws from the process-wide lrand48 stream; the library never
  *    seeds it (call srand48 to make a run repeatable).
+ *
+ * Threads: the library keeps no changing state of its own (the code path is
+ * chosen once per process), so any function may run on several threads at
+ * once on pictures and slots of their own. The exceptions
+ * are PX_rand and PX_IMG_Aquarelle (the only function that calls it): they
+ * draw from libc's lrand48 stream, which is shared by the whole process and
+ * not safe to draw from on several threads at once. Callers that need them
+ * on several threads either run them one at a time (a lock around each call,
+ * which also keeps a seeded run repeatable) or accept a stream that is no
+ * longer reproducible and, with some C libraries, draws that race.
  */
 #ifndef PXFX_CORE_H
 #define PXFX_CORE_H

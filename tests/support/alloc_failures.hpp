@@ -6,7 +6,7 @@
 
 #include <gtest/gtest.h>
 
-#include "core/internal/alloc_hook.hpp"
+#include "support/allocation_hook.hpp"
 
 namespace pxtest {
 

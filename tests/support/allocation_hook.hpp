@@ -1,6 +1,9 @@
-// Allocation accounting behind PX_malloc, and (in builds configured with
-// PXFX_ALLOCATION_HOOK) failure injection for tests. Internal: not exported
-// from the shared library.
+// Allocation accounting and failure injection for tests and benchmarks. The
+// library keeps no state of its own: these programs are linked with
+// --wrap=PX_malloc (the pxfx_allocation_hook target), so every PX_malloc call
+// of the library passes through the counters here. Failure injection works in
+// builds configured with PXFX_ALLOCATION_HOOK (the sanitizer build), where the
+// tests sweep every allocation of an operation.
 #pragma once
 
 #include <cstdint>
