@@ -14,6 +14,7 @@
 #include <cmath>
 #include <cstddef>
 #include <cstdint>
+#include <cstdio>
 #include <cstdlib>
 #include <cstring>
 #include <limits>
@@ -132,8 +133,28 @@ struct Shape {
     uint32_t bitCount;
 };
 
-// Width and height 1..maxW x 1..maxH, sometimes 0 or negative.
+// The largest picture (in pixels) a target has built from its inputs; it is
+// printed when the fuzzer exits, so that a run shows how far its inputs
+// reached.
+struct Reach {
+    int32_t width = 0, height = 0;
+    ~Reach() {
+        if (width > 0) std::fprintf(stderr, "largest picture: %d x %d\n", width, height);
+    }
+};
+
+inline void note_reach(int32_t width, int32_t height) {
+    static Reach reach;
+    if (width > 0 && height > 0 &&
+        static_cast<int64_t>(width) * height > static_cast<int64_t>(reach.width) * reach.height)
+        reach.width = width, reach.height = height;
+}
+
+// Width and height 1..maxW x 1..maxH; about one in 48 shapes may be five
+// times as large each way (several hundred pixels a side); sometimes 0 or
+// negative.
 inline Shape pick_shape(Input &in, int32_t maxW = 64, int32_t maxH = 64) {
+    if (in.one_in(48)) maxW *= 5, maxH *= 5;
     Shape s{in.range(1, maxW), in.range(1, maxH), pick_bit_count(in)};
     if (in.one_in(32)) s.width = in.one_in(2) ? 0 : -in.range(1, 3);
     if (in.one_in(32)) s.height = in.one_in(2) ? 0 : -in.range(1, 3);
@@ -149,6 +170,7 @@ inline Image *make_image(Input &in, Shape s) {
     im->height = s.height;
     im->bitCount = s.bitCount;
     im->tag = in.one_in(2) ? 0 : in.u32();
+    note_reach(s.width, s.height);
     const int64_t w = s.width > 0 ? s.width : 0;
     const int64_t row = (w * s.bitCount + 7) / 8;
     int64_t pitch = (w * s.bitCount + 31) / 32 * 4;
@@ -234,6 +256,7 @@ inline PXImage *make_pximage(Input &in, Shape s) {
     im->width = s.width;
     im->height = s.height;
     im->bitcount = static_cast<int32_t>(s.bitCount);
+    note_reach(s.width, s.height);
     const size_t bytes = s.width > 0 && s.height > 0
                              ? static_cast<size_t>(s.width) * static_cast<size_t>(s.height) * (s.bitCount / 8)
                              : 0;

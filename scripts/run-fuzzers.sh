@@ -7,7 +7,9 @@
 # Every target runs even when an earlier one fails; the script exits 1 when
 # any target reported a crash, sanitizer error, leak or timeout. Reproducers
 # are written to fuzz/findings/; the corpus grows in build-fuzz/corpus/, seeded
-# from fuzz/corpus/<target>/.
+# from fuzz/corpus/<target>/. Inputs may take any length up to 32 KiB from the
+# start (no length control), so pictures filled from the input's own bytes
+# reach their full size; each target prints the largest picture it built.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
@@ -44,9 +46,10 @@ for name in "${targets[@]}"; do
   log="build-fuzz/fuzz-$name.log"
   status=0
   ASAN_OPTIONS=detect_leaks=1 "build-fuzz/fuzz/pxfx_fuzz_$name" -max_total_time="$per_target" \
-    -max_len=16384 -timeout=20 -rss_limit_mb=2048 -artifact_prefix="fuzz/findings/$name-" \
+    -max_len=32768 -len_control=0 -timeout=20 -rss_limit_mb=2048 -artifact_prefix="fuzz/findings/$name-" \
     -print_final_stats=1 "$corpus" "${seeds[@]}" >"$log" 2>&1 || status=$?
   grep -E '^#[0-9]+[[:space:]]+DONE' "$log" | tail -n 1 || true
+  grep -E '^largest picture:' "$log" | tail -n 1 || true
   if [ "$status" -ne 0 ]; then
     echo "!! $name failed (exit $status); log $log:"
     grep -E 'ERROR|SUMMARY|runtime error|Test unit written' "$log" | head -n 20 || tail -n 20 "$log"
