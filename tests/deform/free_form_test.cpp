@@ -62,6 +62,16 @@ TEST(FreeForm, HoleFillingReachAndOrder) {
     std::vector<uint8_t> all = {2, 2, 2, 2, 0, 2, 0, 0, 0, 2, 0, 2};
     pxfx::fill_warp_holes(*pxfx::view_of(sq.get()), all.data());
     EXPECT_EQ(GetPixelColor(sq.get(), 1, 1), 0x01161616u); // a = 1/2, b = 1/3: 22.33 and 22.17
+    // Blends round half up: corners (red, green, blue) (10, 10, 10), (13, 10,
+    // 11), (10, 10, 10), (12, 11, 11) give the pair 11.5, 10, 10.5 at (1, 0)
+    // and the four corners 11.25, 10.25, 10.5 at (1, 1).
+    Owned half = make(3, 3, 32);
+    const uint32_t corner[] = {0x0A0A0A, 0x0D0A0B, 0x0A0A0A, 0x0C0B0B};
+    for (int i = 0; i < 4; ++i)
+        SetPixelColor(half.get(), cx[i], cy[i], corner[i]);
+    pxfx::fill_warp_holes(*pxfx::view_of(half.get()), std::vector<uint8_t>{2, 0, 2, 0, 0, 0, 2, 0, 2}.data());
+    EXPECT_EQ(GetPixelColor(half.get(), 1, 0), 0x0C0A0Bu);
+    EXPECT_EQ(GetPixelColor(half.get(), 1, 1), 0x0B0A0Bu);
 }
 
 TEST(FreeForm, OnePairIdentityTranslationAndIgnoredPairs) {

@@ -135,6 +135,8 @@ TEST(CombineMinSpace, MergesCloseIntervalsAndDropsShortOnes) {
     EXPECT_EQ(combine({0, 10, 12, 15, 30, 31, 40, 60}, 5), (Ints{0, 15, 40, 60}));
     // minGap 0 means 2; an absorbed interval's end is taken even when smaller.
     EXPECT_EQ(combine({0, 20, 3, 8, 40, 45, 46, 47}, 0), (Ints{0, 8, 40, 47}));
+    // A length or a gap of exactly minGap is not below it: kept, not absorbed.
+    EXPECT_EQ(combine({0, 5, 10, 12, 17, 22, 30, 35, 39, 40}, 5), (Ints{0, 5, 17, 22, 30, 40}));
     Ints kept = {0, 10};
     EXPECT_EQ(CombineMinSpace(kept.data(), -1, 5) + CombineMinSpace(kept.data(), 0, 5), 0);
     EXPECT_EQ(kept, (Ints{0, 10}));

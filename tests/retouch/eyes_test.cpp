@@ -116,6 +116,12 @@ TEST(EyeContrast, StretchesAroundTheBoxMean) {
     alg_Img_EyesMoreContrast_ellipse(pic.get(), 20, 15, 10, 100);
     EXPECT_EQ(GetPixelColor(pic.get(), 20, 15), 0x55666666u);
     EXPECT_EQ(GetPixelColor(pic.get(), 20, 20), 0x55646464u); // last box row left out
+    // Contrast 50 (gain 1.5) around the mean (28200 / 11) / 21 = 122: 141 maps
+    // to 19 * 1.5 + 122 + 0.5 = 151 exactly, and only that rounding half
+    // lifts the centre row (weight 0.2) from 142.8 to 143.
+    Owned half = filled(40, 30, 32, 0x558D8D8D);
+    alg_Img_EyesMoreContrast_ellipse(half.get(), 20, 15, 10, 50);
+    EXPECT_EQ(GetPixelColor(half.get(), 20, 15), 0x558F8F8Fu);
 }
 
 TEST(UnderEye, CrescentCorrection) {

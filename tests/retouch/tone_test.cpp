@@ -137,17 +137,20 @@ TEST(CrossMedian, MatchesSortedCrossInEveryMode) {
 }
 
 TEST(ThresholdBlur, NearBlackTapsBlackenTheirNeighbours) {
-    // Amount 0 keeps identity curves: a green of 5 turns the green of every
-    // pixel within `size` columns of it to 0; blue and red stay.
-    for (int32_t bc : {16, 24, 32}) {
-        Owned src = filled(20, 3, bc, 0xFF808080);
-        SetPixelColor(src.get(), 9, 1, 0xFF800580);
-        Slot dst;
-        thresholdBlur(0, 0, 3, 0, src.get(), &dst);
-        for (int32_t x = 0; x < 20; ++x) {
-            const uint32_t c = GetPixelColor(dst.get(), x, 1), o = GetPixelColor(src.get(), x == 9 ? 8 : x, 1);
-            EXPECT_EQ(ch(c, 8), x >= 6 && x <= 12 ? 0 : ch(o, 8)) << bc << " " << x;
-            EXPECT_EQ(ch(c, 16), ch(o, 16));
+    // Amount 0 keeps identity curves: a green of at most 10 turns the green of
+    // every pixel within `size` columns of it to 0, 11 does not; blue and red
+    // stay. 16 bits hold green in 6 bits, so only 5 is tried there.
+    for (int32_t bc : {16, 24, 32})
+        for (uint32_t g : {5u, 10u, 11u}) {
+            if (bc == 16 && g != 5) continue;
+            Owned src = filled(20, 3, bc, 0xFF808080);
+            SetPixelColor(src.get(), 9, 1, 0xFF800080 | g << 8);
+            Slot dst;
+            thresholdBlur(0, 0, 3, 0, src.get(), &dst);
+            for (int32_t x = 0; x < 20; ++x) {
+                const uint32_t c = GetPixelColor(dst.get(), x, 1), o = GetPixelColor(src.get(), x == 9 ? 8 : x, 1);
+                EXPECT_EQ(ch(c, 8) == 0, g <= 10 && x >= 6 && x <= 12) << bc << " " << g << " " << x;
+                EXPECT_EQ(ch(c, 16), ch(o, 16));
+            }
         }
-    }
 }
