@@ -37,13 +37,34 @@ inline constexpr int64_t kUnpinned = INT64_MIN + 1;
 // pinned here, the contract's `done`), and whether a record without a pixel
 // block gives the result and picture of the same record with an all-zero
 // block, as the pixel readers read a missing block as 0.
+//
+// The result picture is described by its shape: "null", or "WxHxB" (width,
+// height, bit count) and its block: "none" without one, "zeros" or "white"
+// when every byte it claims is 0 or 255, else "pixels"; "kept" for a
+// function working in place means its picture is left as it was.
 struct Accepted {
     std::string what;
     int64_t result = kUnpinned;
     bool reads_as_zeros = true;
+    const char *shape = nullptr; // the result picture (null: not pinned)
     Accepted(const char *kind) : what(kind) {}
     Accepted(std::string kind, int64_t r, bool zeros = true)
         : what(std::move(kind)), result(r), reads_as_zeros(zeros) {}
+};
+inline Accepted shaped(const char *kind, const char *shape) {
+    Accepted a(kind);
+    a.shape = shape;
+    return a;
+}
+
+// A record of another size over a noise block of the first accepted bit
+// count (or over none), called with the typical parameter: what it returns
+// and, where pinned, the shape of the result. A failure result means refused.
+struct Sized {
+    int32_t w, h;
+    bool pixels;
+    int64_t result;
+    const char *shape = nullptr;
 };
 
 // A function "refuses" when it returns its failure result, leaves its result
@@ -64,6 +85,7 @@ template <class R> struct Contract {
     // them (functions without a result return 1: done, nothing to do).
     std::vector<Accepted> accepts;
     int64_t done = 1;
+    std::vector<Sized> sizes; // small and empty sizes at the edges of its windows
     // Functions filling a caller's slot: for sources of an empty size (zero
     // width, INT_MIN width, negative height, both negative) holding a
     // matching record in the slot, the result digit and what became of the
@@ -88,8 +110,10 @@ inline const std::vector<Accepted> kEmptySizes = {"zero width", "negative height
 // The kinds given, accepted in the first picture and in the second.
 inline std::vector<Accepted> in_both(const std::vector<Accepted> &kinds) {
     std::vector<Accepted> v = kinds;
-    for (const Accepted &a : kinds)
-        v.emplace_back("second: " + a.what, a.result, a.reads_as_zeros);
+    for (const Accepted &a : kinds) {
+        v.push_back(a);
+        v.back().what = "second: " + a.what;
+    }
     return v;
 }
 

@@ -10,9 +10,8 @@
 
 namespace rtest {
 
+using pxtest::chan;
 using pxtest::Owned;
-
-inline int ch(uint32_t c, int shift) { return static_cast<int>((c >> shift) & 255); }
 
 // Skin-coloured noise with dark blobs and gaps, so that masks, runs and
 // holes of every length occur.
@@ -35,7 +34,7 @@ inline Owned ref_mask(const Image *src) {
     for (int32_t y = 0; y < h; ++y)
         for (int32_t x = 0; x < w; ++x) {
             const uint32_t c = GetPixelColor(src, x, y);
-            const int b = ch(c, 0), g = ch(c, 8), r = ch(c, 16);
+            const int b = chan(c, 0), g = chan(c, 8), r = chan(c, 16);
             SetPixelIndex(m.get(), x, y, r >= g && r >= b && r > 49 ? g : 0);
         }
     for (int32_t y = 0; y < h; ++y) // skin runs of 1 to 19 go; the last column ends a run
@@ -79,7 +78,7 @@ inline uint32_t lift(uint32_t c, int d, double wb, double wg, double wr) {
         const double r = v + w * d;
         return r > 255.0 ? 255u : static_cast<uint32_t>(r);
     };
-    return one(ch(c, 0), wb) | one(ch(c, 8), wg) << 8 | one(ch(c, 16), wr) << 16 | (c & 0xFF000000u);
+    return one(chan(c, 0), wb) | one(chan(c, 8), wg) << 8 | one(chan(c, 16), wr) << 16 | (c & 0xFF000000u);
 }
 
 inline Owned ref_smooth_1(const Image *src) {
@@ -107,7 +106,7 @@ template <class Fn> void map_pixels(Image *im, Fn fn) {
             const uint32_t c = GetPixelColor(im, x, y);
             uint32_t o = c & 0xFF000000u;
             for (int s : {0, 8, 16})
-                o |= uint32_t(fn(ch(c, s), s)) << s;
+                o |= uint32_t(fn(chan(c, s), s)) << s;
             SetPixelColor(im, x, y, o);
         }
 }

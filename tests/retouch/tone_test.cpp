@@ -28,7 +28,7 @@ Owned ref_auto_levels(const Image *src, int32_t amount) {
     for (int32_t y = 0; y < h; ++y)
         for (int32_t x = 0; x < w; ++x)
             for (int s : {0, 8, 16})
-                ++hist[ch(GetPixelColor(src, x, y), s)];
+                ++hist[chan(GetPixelColor(src, x, y), s)];
     MakeMapping(hist.data(), 0.0005f, 0.0005f);
     const std::vector<int32_t> &m = hist;
     Owned out = make(w, h, static_cast<int32_t>(src->bitCount));
@@ -37,10 +37,11 @@ Owned ref_auto_levels(const Image *src, int32_t amount) {
             const uint32_t c = GetPixelColor(src, x, y);
             uint32_t o = c & 0xFF000000u;
             for (int s : {0, 8, 16}) {
-                const int v = ch(c, s);
-                const int n = (m[ch(GetPixelColor(src, x - 1, y), s)] + m[ch(GetPixelColor(src, x + 1, y), s)] +
-                               m[ch(GetPixelColor(src, x, y - 1), s)] + m[ch(GetPixelColor(src, x, y + 1), s)] + 2) /
-                              4;
+                const int v = chan(c, s);
+                const int n =
+                    (m[chan(GetPixelColor(src, x - 1, y), s)] + m[chan(GetPixelColor(src, x + 1, y), s)] +
+                     m[chan(GetPixelColor(src, x, y - 1), s)] + m[chan(GetPixelColor(src, x, y + 1), s)] + 2) /
+                    4;
                 const int sc = 255 - ((255 - n) * (255 - m[v])) / 255;
                 o |= uint32_t((amount * sc + (100 - amount) * v) / 100) << s;
             }
@@ -146,8 +147,8 @@ TEST(ThresholdBlur, NearBlackTapsBlackenTheirNeighbours) {
         thresholdBlur(0, 0, 3, 0, src.get(), &dst);
         for (int32_t x = 0; x < 20; ++x) {
             const uint32_t c = GetPixelColor(dst.get(), x, 1), o = GetPixelColor(src.get(), x == 9 ? 8 : x, 1);
-            EXPECT_EQ(ch(c, 8), x >= 6 && x <= 12 ? 0 : ch(o, 8)) << bc << " " << x;
-            EXPECT_EQ(ch(c, 16), ch(o, 16));
+            EXPECT_EQ(chan(c, 8), x >= 6 && x <= 12 ? 0 : chan(o, 8)) << bc << " " << x;
+            EXPECT_EQ(chan(c, 16), chan(o, 16));
         }
     }
 }

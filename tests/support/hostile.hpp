@@ -173,8 +173,9 @@ template <class R> struct Runner {
     // What one call gave: its result and the bytes of the picture it made.
     struct Outcome {
         int64_t result;
-        bool made;
         std::vector<uint8_t> picture;
+        std::string shape;
+        bool made() const { return shape != "null"; }
     };
     // Calls the function and releases its result.
     Outcome run(R *a, R *b, int32_t p, bool nullSlot = false) {
@@ -182,7 +183,7 @@ template <class R> struct Runner {
         call.p = p;
         if (nullSlot) call.slot = nullptr;
         const int64_t r = c.call(call);
-        Outcome o{r, call.out != nullptr, picture_bytes(call.out)};
+        Outcome o{r, picture_bytes(call.out), shape_of(call.out)};
         release(call.out);
         return o;
     }
@@ -190,11 +191,11 @@ template <class R> struct Runner {
         std::vector<std::vector<uint8_t>> before;
         for (auto *h : inputs)
             before.push_back(h->snapshot());
-        const auto [r, made, picture] = run(a, b, c.typical, nullSlot);
+        const auto o = run(a, b, c.typical, nullSlot);
         if (c.failure != kNoResult) {
-            EXPECT_EQ(r, c.failure) << name << ": " << why;
+            EXPECT_EQ(o.result, c.failure) << name << ": " << why;
         }
-        EXPECT_FALSE(made) << name << ": " << why;
+        EXPECT_FALSE(o.made()) << name << ": " << why;
         for (size_t i = 0; i < inputs.size(); ++i)
             EXPECT_TRUE(inputs[i]->snapshot() == before[i]) << name << ": " << why << " changed an input";
     }
@@ -270,50 +271,96 @@ template <class R> void expect_allocation_failures_handled(const std::string &na
             const bool same = o.result == full.result && o.picture == full.picture && a->snapshot() == fullA &&
                               b->snapshot() == fullB;
             const bool failed = (c.failure == kNoResult || o.result == c.failure) &&
-                                (c.keeps_result_on_failure || !o.made) && a->snapshot() == sa && b->snapshot() == sb;
+                                (c.keeps_result_on_failure || !o.made()) && a->snapshot() == sa && b->snapshot() == sb;
             EXPECT_TRUE(same || failed) << name << ": short of memory, neither a full run nor a clean failure (result "
-                                        << o.result << ", full run " << full.result << (o.made ? ", a picture" : "")
+                                        << o.result << ", full run " << full.result << (o.made() ? ", a picture" : "")
                                         << (a->snapshot() == sa ? "" : ", first picture changed") << ")";
         });
     }
 }
 
-// Accepted degenerate records in either picture position: the result the
-// contract gives, and for a record without a pixel block, what the same
-// record with an all-zero block gives.
+// Accepted degenerate records in either picture position: the result and
+// shape the contract gives, and for a record without a pixel block, the
+// result, picture and other picture of the same record with an all-zero block.
 template <class R> void expect_accepted_outcomes(const std::string &name, const Contract<R> &c) {
     Runner<R> run{c, name};
     const int32_t fa = c.formats.front(), fb = run.format_b(fa);
     for (const bool second : {false, true}) {
         if (second && c.pictures < 2) break;
-        auto other = good<R>(9, 7, second ? fa : fb, 41);
-        auto call = [&](R *degenerate) {
-            if (!second) return run.run(degenerate, c.pictures > 1 ? &other->record : nullptr, c.typical);
-            return run.run(&other->record, degenerate, c.typical);
+        auto call = [&](R *degenerate, int32_t otherBits, std::vector<uint8_t> *otherAfter = nullptr) {
+            auto other = good<R>(9, 7, otherBits, 41);
+            R *o = c.pictures > 1 ? &other->record : nullptr;
+            const auto out = second ? run.run(o, degenerate, c.typical) : run.run(degenerate, o, c.typical);
+            if (otherAfter) *otherAfter = other->block;
+            return out;
         };
         for (auto &bad : broken<R>(second ? std::vector<int32_t>{fb} : c.formats)) {
             const Accepted *acc = c.accepted(second ? "second: " + bad->what : bad->what);
             if (acc == nullptr) continue;
             const std::string why = name + ": " + acc->what;
-            const auto o = call(&bad->record);
+            const auto before = bad->snapshot();
+            const auto o = call(&bad->record, second ? fa : fb);
             if (c.failure != kNoResult) {
                 EXPECT_EQ(o.result, acc->result != pxop::kUnpinned ? acc->result : c.done) << why;
             }
+            if (acc->shape) {
+                EXPECT_EQ(std::string(acc->shape) == "kept" ? (bad->snapshot() == before ? "kept" : "changed")
+                                                            : o.shape,
+                          acc->shape)
+                    << why;
+            }
         }
-        // Without a pixel block, at every bit count: as with an all-zero block.
+        // Without a pixel block, at every bit count (beside every bit count of
+        // the first picture): as with an all-zero block.
         const Accepted *none = c.accepted(second ? "second: null pixels" : "null pixels");
         if (none == nullptr || !none->reads_as_zeros) continue;
-        for (const int32_t bc : second ? std::vector<int32_t>{fb} : c.formats) {
-            auto zeros = good<R>(9, 7, bc, 0);
-            std::fill(zeros->block.begin(), zeros->block.end(), 0);
-            R hollow = zeros->record;
+        for (const int32_t bc : second ? (c.formats_b.empty() ? c.formats : c.formats_b) : c.formats)
+            for (const int32_t ob : second ? c.formats : std::vector<int32_t>{fb}) {
+                auto zeros = good<R>(9, 7, bc, 0);
+                std::fill(zeros->block.begin(), zeros->block.end(), 0);
+                R hollow = zeros->record;
+                if constexpr (std::is_same_v<R, Image>)
+                    hollow.bits = nullptr;
+                else
+                    hollow.data = nullptr;
+                std::vector<uint8_t> otherH, otherZ;
+                const auto o = call(&hollow, ob, &otherH), z = call(&zeros->record, ob, &otherZ);
+                EXPECT_TRUE(o.result == z.result && o.picture == z.picture && otherH == otherZ)
+                    << name << ": " << none->what << " at " << bc << " bits beside " << ob
+                    << ", not as an all-zero block";
+            }
+    }
+}
+
+// Records of the contract's other sizes: the result, a refusal as such, and
+// the shape of the result picture.
+template <class R> void expect_sizes(const std::string &name, const Contract<R> &c) {
+    Runner<R> run{c, name};
+    const int32_t fa = c.formats.front();
+    auto b = good<R>(9, 7, run.format_b(fa), 52);
+    for (const pxop::Sized &k : c.sizes) {
+        const std::string why = name + ": " + std::to_string(k.w) + "x" + std::to_string(k.h);
+        auto side = [](int32_t n) { return int32_t(std::clamp<int64_t>(std::llabs(n), 1, 64)); };
+        auto held = good<R>(side(k.w), side(k.h), fa, 51); // a block for every pixel the sizes claim
+        held->record.width = k.w, held->record.height = k.h;
+        if (!k.pixels) {
             if constexpr (std::is_same_v<R, Image>)
-                hollow.bits = nullptr;
+                held->record.bits = nullptr;
             else
-                hollow.data = nullptr;
-            const auto o = call(&hollow), z = call(&zeros->record);
-            EXPECT_TRUE(o.result == z.result && o.picture == z.picture)
-                << name << ": " << none->what << " at " << bc << " bits, not as an all-zero block";
+                held->record.data = nullptr;
+        }
+        R *second = c.pictures > 1 ? &b->record : nullptr;
+        if (k.result == c.failure) {
+            run.expect_refused(&held->record, second, false, {held.get(), b.get()}, why);
+            continue;
+        }
+        const auto before = held->snapshot();
+        const auto o = run.run(&held->record, second, c.typical);
+        EXPECT_EQ(o.result, k.result) << why;
+        if (k.shape) {
+            EXPECT_EQ(std::string(k.shape) == "kept" ? (held->snapshot() == before ? "kept" : "changed") : o.shape,
+                      k.shape)
+                << why;
         }
     }
 }
@@ -322,6 +369,7 @@ template <class R> void expect_accepted_outcomes(const std::string &name, const 
 template <class R> void check_contract(const std::string &name, const Contract<R> &c) {
     expect_refusals(name, c);
     expect_accepted_outcomes(name, c);
+    expect_sizes(name, c);
     expect_extremes_survive(name, c);
     expect_allocation_failures_handled(name, c);
     if constexpr (std::is_same_v<R, Image>) {
