@@ -32,7 +32,9 @@ void add_lines(std::vector<Operation> &t) {
                  {},
                  kGray8,
                  [](const Image *in, const Args &) { return effect(RecognizeYUV, in); },
-                 plane([](C &c) { return RecognizeYUV(c.a, c.slot); })});
+                 // Planes smaller than its strips, or without pixels, are refused.
+                 plane([](C &c) { return RecognizeYUV(c.a, c.slot); }, {}, 0,
+                       {{120, 100, true, 0}, {200, 12, true, 0}, {200, 100, false, 0}})});
     t.push_back({"decode",
                  PXOP_FN(ImgDecode),
                  "Lines",
@@ -52,7 +54,9 @@ void add_lines(std::vector<Operation> &t) {
                  {{"factor", true, 2, 49, 2, "rows per source row"}},
                  kGray8,
                  [](const Image *in, const Args &a) { return MyResample2(const_cast<Image *>(in), a.i(0)); },
-                 plane([](C &c) { return (c.out = MyResample2(c.a, c.p)) != nullptr; }),
+                 // One row without a block is a new white row; a taller record without one is refused.
+                 plane([](C &c) { return (c.out = MyResample2(c.a, c.p)) != nullptr; }, {}, 0,
+                       {{17, 1, false, 1, "17x1x8 white"}, {17, 2, false, 0}}),
                  false});
     t.push_back({"bands",
                  PXOP_FN(BinImg),

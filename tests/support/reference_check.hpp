@@ -1,5 +1,5 @@
-// Shared checks for the effect tests: straightforward accessor versions are
-// run beside the library on random pictures of every format and awkward size.
+// Straightforward accessor versions run beside the library on random
+// pictures of every format and awkward size.
 #pragma once
 
 #include <gtest/gtest.h>
