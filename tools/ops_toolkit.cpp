@@ -228,12 +228,18 @@ void add_toolkit(std::vector<Operation> &t) {
                      PXImage_Free(src);
                      return out;
                  },
+                 // Targets without data or pixel rows take no writes.
                  two(
                      {32},
                      [](PXImage *a, PXImage *b, int32_t p) -> int64_t {
                          return PXImage_ROI_Zoom(a, b, ptr(rect(p)), p / 3.0, p, 1);
                      },
-                     in_both(kPixelless))});
+                     [] {
+                         std::vector<Accepted> v = in_both(kPixelless);
+                         for (size_t i = kPixelless.size(); i < v.size(); ++i)
+                             v[i].shape = "kept";
+                         return v;
+                     }())});
     t.push_back({"auto-exposure",
                  PXOP_FN(PXImage_AutoExposure),
                  "Toolkit tone",
