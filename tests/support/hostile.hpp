@@ -339,7 +339,7 @@ template <class R> void expect_accepted_outcomes(const std::string &name, const 
 template <class R> void expect_sizes(const std::string &name, const Contract<R> &c) {
     Runner<R> run{c, name};
     auto b = good<R>(9, 7, run.format_b(c.formats.front()), 52);
-    auto side = [](int32_t n) { return int32_t(std::clamp<int64_t>(std::llabs(n), 1, 64)); };
+    auto side = [](int32_t n) { return int32_t(std::clamp<int64_t>(std::llabs(n), 1, 1024)); };
     for (const pxop::Sized &k : c.sizes) {
         const std::string why = name + ": " + std::to_string(k.w) + "x" + std::to_string(k.h);
         auto held = good<R>(side(k.w), side(k.h), c.formats.front(), 51);
