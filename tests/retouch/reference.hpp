@@ -6,7 +6,7 @@
 #include <cstdlib>
 #include <random>
 
-#include "support/test_images.hpp"
+#include "support/reference_check.hpp"
 
 namespace rtest {
 
@@ -99,16 +99,11 @@ inline Owned ref_smooth_1(const Image *src) {
     return out;
 }
 
-// Replaces blue, green and red of every pixel by fn(value, shift); alpha kept.
-template <class Fn> void map_pixels(Image *im, Fn fn) {
-    for (int32_t y = 0; y < im->height; ++y)
-        for (int32_t x = 0; x < im->width; ++x) {
-            const uint32_t c = GetPixelColor(im, x, y);
-            uint32_t o = c & 0xFF000000u;
-            for (int s : {0, 8, 16})
-                o |= uint32_t(fn(chan(c, s), s)) << s;
-            SetPixelColor(im, x, y, o);
-        }
+// src with blue, green and red of every pixel replaced by fn(value); alpha kept.
+template <class Fn> Owned mapped(const Image *src, Fn fn) {
+    return pxtest::per_pixel(src, [&](uint32_t c, int, int) {
+        return pxtest::rgba(fn(chan(c, 0)), fn(chan(c, 8)), fn(chan(c, 16)), chan(c, 24));
+    });
 }
 
 inline uint32_t distance(int64_t dx, int64_t dy) {

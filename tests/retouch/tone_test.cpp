@@ -6,7 +6,6 @@
 #include <vector>
 
 #include "retouch/reference.hpp"
-#include "support/reference_check.hpp"
 
 using namespace pxtest;
 using namespace rtest;
