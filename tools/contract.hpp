@@ -57,6 +57,12 @@ inline Accepted shaped(const char *kind, const char *shape) {
     return a;
 }
 
+// The kind named `what` among `kinds`, or null.
+inline const Accepted *find_kind(const std::vector<Accepted> &kinds, const std::string &what) {
+    const auto it = std::find_if(kinds.begin(), kinds.end(), [&](const Accepted &a) { return a.what == what; });
+    return it == kinds.end() ? nullptr : &*it;
+}
+
 // A record of another size over a noise block of the first accepted bit
 // count (or over none), called with the typical parameter: what it returns
 // and, where pinned, the shape of the result. A failure result means refused.
@@ -96,16 +102,16 @@ template <class R> struct Contract {
     // null slot), held to the same promises.
     std::function<int64_t(Call<R> &)> also;
 
-    const Accepted *accepted(const std::string &what) const {
-        const auto it = std::find_if(accepts.begin(), accepts.end(), [&](const Accepted &a) { return a.what == what; });
-        return it == accepts.end() ? nullptr : &*it;
-    }
+    const Accepted *accepted(const std::string &what) const { return find_kind(accepts, what); }
 };
 
 // Bit counts the pixel readers take: any (unknown ones read as opaque black).
 inline const std::vector<int32_t> kAnyBits = {8, 16, 24, 32, 0, 1, 4, 12, 48};
-// Records of no pixel rows that a function with nothing to visit takes as done.
+// Records of no pixel rows that a function with nothing to visit takes as
+// done, and those and a record without a pixel block.
 inline const std::vector<Accepted> kEmptySizes = {"zero width", "negative height", "INT_MIN width", "negative sizes"};
+inline const std::vector<Accepted> kPixelless = {"null pixels", "zero width", "negative height", "INT_MIN width",
+                                                 "negative sizes"};
 
 // The kinds given, accepted in the first picture and in the second.
 inline std::vector<Accepted> in_both(const std::vector<Accepted> &kinds) {

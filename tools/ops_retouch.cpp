@@ -56,8 +56,7 @@ Contract<Image> no_slot(std::vector<int32_t> formats, std::function<int64_t(C &)
 // pixel block pastes nothing.
 Contract<Image> paste(std::function<int64_t(C &)> call) {
     return {.formats = kAnyBits, .call = std::move(call), .pictures = 2, .slot = false, .accepts = [] {
-                std::vector<Accepted> v =
-                    in_both({"null pixels", "zero width", "negative height", "INT_MIN width", "negative sizes"});
+                std::vector<Accepted> v = in_both(kPixelless);
                 v.insert(v.end(), {"second: pitch below a row", "second: zero pitch"});
                 for (Accepted &a : v)
                     a.reads_as_zeros = a.what != "second: null pixels";
@@ -125,8 +124,8 @@ void add_retouch(std::vector<Operation> &t) {
                  {},
                  kAllFormats,
                  [](const Image *in, const Args &) { return in_place(in, [](Image *p) { return LightUP(p) == 1; }); },
-                 no_slot(kAnyBits, [](C &c) -> int64_t { return LightUP(c.a); }, 0,
-                         {"zero width", "negative height", "INT_MIN width", "negative sizes", "null pixels"})});
+                 no_slot(
+                     kAnyBits, [](C &c) -> int64_t { return LightUP(c.a); }, 0, kPixelless)});
     t.push_back({"third-largest",
                  PXOP_FN(Best_Color),
                  "Skin",

@@ -62,10 +62,8 @@ const std::vector<int32_t> kGeometry = {8, 16, 24};
 // computed (1).
 const std::vector<int32_t> kEveryBits = {8, 0, 1, 4, 12, 16, 24, 32, 48};
 const std::vector<Accepted> kFilterSizes = {"negative sizes"};
-// Records without pixel rows (and, where named, without data).
+// Records without pixel rows.
 const std::vector<Accepted> kRowless = kEmptySizes;
-const std::vector<Accepted> kPixelless = {"null pixels", "zero width", "negative height", "INT_MIN width",
-                                          "negative sizes"};
 
 // A rectangle and a point following the parameter, and the address of such a
 // value for the duration of a call.
