@@ -37,13 +37,40 @@ inline constexpr int64_t kUnpinned = INT64_MIN + 1;
 // pinned here, the contract's `done`), and whether a record without a pixel
 // block gives the result and picture of the same record with an all-zero
 // block, as the pixel readers read a missing block as 0.
+//
+// The result picture is described by its shape: "null", or "WxHxB" (width,
+// height, bit count) and its block: "none" without one, "zeros" or "white"
+// when every byte it claims is 0 or 255, else "pixels"; "kept" for a
+// function working in place means its picture is left as it was.
 struct Accepted {
     std::string what;
     int64_t result = kUnpinned;
     bool reads_as_zeros = true;
+    const char *shape = nullptr; // the result picture (null: not pinned)
     Accepted(const char *kind) : what(kind) {}
     Accepted(std::string kind, int64_t r, bool zeros = true)
         : what(std::move(kind)), result(r), reads_as_zeros(zeros) {}
+};
+inline Accepted shaped(const char *kind, const char *shape) {
+    Accepted a(kind);
+    a.shape = shape;
+    return a;
+}
+
+// The kind named `what` among `kinds`, or null.
+inline const Accepted *find_kind(const std::vector<Accepted> &kinds, const std::string &what) {
+    const auto it = std::find_if(kinds.begin(), kinds.end(), [&](const Accepted &a) { return a.what == what; });
+    return it == kinds.end() ? nullptr : &*it;
+}
+
+// A record of another size over a noise block of the first accepted bit
+// count (or over none), called with the typical parameter: what it returns
+// and, where pinned, the shape of the result. A failure result means refused.
+struct Sized {
+    int32_t w, h;
+    bool pixels;
+    int64_t result;
+    const char *shape = nullptr;
 };
 
 // A function "refuses" when it returns its failure result, leaves its result
@@ -64,6 +91,7 @@ template <class R> struct Contract {
     // them (functions without a result return 1: done, nothing to do).
     std::vector<Accepted> accepts;
     int64_t done = 1;
+    std::vector<Sized> sizes; // small and empty sizes at the edges of its windows
     // Functions filling a caller's slot: for sources of an empty size (zero
     // width, INT_MIN width, negative height, both negative) holding a
     // matching record in the slot, the result digit and what became of the
@@ -74,22 +102,24 @@ template <class R> struct Contract {
     // null slot), held to the same promises.
     std::function<int64_t(Call<R> &)> also;
 
-    const Accepted *accepted(const std::string &what) const {
-        const auto it = std::find_if(accepts.begin(), accepts.end(), [&](const Accepted &a) { return a.what == what; });
-        return it == accepts.end() ? nullptr : &*it;
-    }
+    const Accepted *accepted(const std::string &what) const { return find_kind(accepts, what); }
 };
 
 // Bit counts the pixel readers take: any (unknown ones read as opaque black).
 inline const std::vector<int32_t> kAnyBits = {8, 16, 24, 32, 0, 1, 4, 12, 48};
-// Records of no pixel rows that a function with nothing to visit takes as done.
+// Records of no pixel rows that a function with nothing to visit takes as
+// done, and those and a record without a pixel block.
 inline const std::vector<Accepted> kEmptySizes = {"zero width", "negative height", "INT_MIN width", "negative sizes"};
+inline const std::vector<Accepted> kPixelless = {"null pixels", "zero width", "negative height", "INT_MIN width",
+                                                 "negative sizes"};
 
 // The kinds given, accepted in the first picture and in the second.
 inline std::vector<Accepted> in_both(const std::vector<Accepted> &kinds) {
     std::vector<Accepted> v = kinds;
-    for (const Accepted &a : kinds)
-        v.emplace_back("second: " + a.what, a.result, a.reads_as_zeros);
+    for (const Accepted &a : kinds) {
+        v.push_back(a);
+        v.back().what = "second: " + a.what;
+    }
     return v;
 }
 

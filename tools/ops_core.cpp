@@ -32,11 +32,13 @@ void add_core(std::vector<Operation> &t) {
         PXOP_FN(SetPixelColor), "Pixels",
         reader(
             kColourWritten, [](C &c) { return SetPixelColor(c.a, c.p, c.p, 0x12345678u), kNoResult; }, kNoResult)));
-    // Copies take records without pixels or rows as nothing to copy.
+    // Copies take records without pixels or rows as nothing to copy; a
+    // destination whose rows overrun its block takes nothing.
     Contract<Image> copy = reader(kAnyBits, [](C &c) { return int64_t(PX_Img_Copy(c.a, c.b)); });
     copy.pictures = 2;
-    copy.accepts = in_both({"null pixels", "zero width", "negative height", "INT_MIN width", "negative sizes",
-                            "pitch below a row", "zero pitch"});
+    copy.accepts = kPixelless;
+    copy.accepts.insert(copy.accepts.end(), {shaped("pitch below a row", "kept"), "zero pitch"});
+    copy.accepts = in_both(copy.accepts);
     t.push_back(contract_row(PXOP_FN(PX_Img_Copy), "Pixels", copy));
     Contract<Image> alpha = reader({32}, [](C &c) { return int64_t(PX_Img_CopyAlpha(c.a, c.b)); });
     alpha.pictures = 2, alpha.mismatch_fails = true, alpha.accepts = in_both({"null pixels"});

@@ -30,8 +30,9 @@ using C = Call<Image>;
 
 const std::vector<int32_t> kRgb = {24, 32};
 // A source without a pixel block reads as 0: the tools preparing a slot from
-// it work on it.
-const std::vector<Accepted> kNoPixels = {"null pixels"};
+// it work on it. Tools that always report 1 run no pixel loop on a source of
+// no columns and leave no result.
+const std::vector<Accepted> kNoPixels = {"null pixels"}, kNoColumns = {"null pixels", shaped("zero width", "null")};
 
 // A tool filling a result slot from one picture of any bit count.
 Contract<Image> slot_contract(std::function<int64_t(C &)> call, int64_t failure = 0,
@@ -51,12 +52,14 @@ Contract<Image> no_slot(std::vector<int32_t> formats, std::function<int64_t(C &)
             .slot = false,
             .accepts = std::move(accepts)};
 }
-// Pastes of a second picture of any size and bit count.
+// Pastes of a second picture of any size and bit count; a source without a
+// pixel block pastes nothing.
 Contract<Image> paste(std::function<int64_t(C &)> call) {
     return {.formats = kAnyBits, .call = std::move(call), .pictures = 2, .slot = false, .accepts = [] {
-                std::vector<Accepted> v =
-                    in_both({"null pixels", "zero width", "negative height", "INT_MIN width", "negative sizes"});
+                std::vector<Accepted> v = in_both(kPixelless);
                 v.insert(v.end(), {"second: pitch below a row", "second: zero pitch"});
+                for (Accepted &a : v)
+                    a.reads_as_zeros = a.what != "second: null pixels";
                 return v;
             }()};
 }
@@ -85,8 +88,8 @@ void add_retouch(std::vector<Operation> &t) {
          [](const Image *in, const Args &) { return slot_tool(in, [](Image *s, Image **d) { SmileDetect(s, d, 0); }); },
          [] {
              // Without a pixel block no mask is made: the slot keeps a new, white image.
-             Contract<Image> c =
-                 slot_contract([](C &c) { return SmileDetect(c.a, c.slot, c.p); }, 1, {{"null pixels", 1, false}});
+             Contract<Image> c = slot_contract([](C &c) { return SmileDetect(c.a, c.slot, c.p); }, 1,
+                                               {{"null pixels", 1, false}, shaped("zero width", "null")});
              c.falls_back_on_failure = true;
              return c;
          }()});
@@ -113,7 +116,7 @@ void add_retouch(std::vector<Operation> &t) {
                  {{"lighten", true, 0, 1, 1, "1 brightens once more"}},
                  kAllFormats,
                  [](const Image *in, const Args &a) { return effect(alg_Img_Skin, in, a.i(0)); },
-                 slot_contract([](C &c) { return alg_Img_Skin(c.a, c.slot, c.p); }, 1, kNoPixels, true)});
+                 slot_contract([](C &c) { return alg_Img_Skin(c.a, c.slot, c.p); }, 1, kNoColumns, true)});
     t.push_back({"light-up",
                  PXOP_FN(LightUP),
                  "Skin",
@@ -121,8 +124,8 @@ void add_retouch(std::vector<Operation> &t) {
                  {},
                  kAllFormats,
                  [](const Image *in, const Args &) { return in_place(in, [](Image *p) { return LightUP(p) == 1; }); },
-                 no_slot(kAnyBits, [](C &c) -> int64_t { return LightUP(c.a); }, 0,
-                         {"zero width", "negative height", "INT_MIN width", "negative sizes", "null pixels"})});
+                 no_slot(
+                     kAnyBits, [](C &c) -> int64_t { return LightUP(c.a); }, 0, kPixelless)});
     t.push_back({"third-largest",
                  PXOP_FN(Best_Color),
                  "Skin",
@@ -151,7 +154,7 @@ void add_retouch(std::vector<Operation> &t) {
                  {{"amount", true, 0, 100, 80, "blend of the corrected picture"}},
                  kAllFormats,
                  [](const Image *in, const Args &a) { return effect(ImageAutoGradationProcess, in, a.i(0)); },
-                 slot_contract([](C &c) { return ImageAutoGradationProcess(c.a, c.slot, c.p); }, 1)});
+                 slot_contract([](C &c) { return ImageAutoGradationProcess(c.a, c.slot, c.p); }, 1, kNoColumns)});
     t.push_back({"auto-levels-dark",
                  PXOP_FN(ImageAutoGradationProcess1),
                  "Tone",

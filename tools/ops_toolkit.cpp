@@ -62,10 +62,8 @@ const std::vector<int32_t> kGeometry = {8, 16, 24};
 // computed (1).
 const std::vector<int32_t> kEveryBits = {8, 0, 1, 4, 12, 16, 24, 32, 48};
 const std::vector<Accepted> kFilterSizes = {"negative sizes"};
-// Records without pixel rows (and, where named, without data).
+// Records without pixel rows.
 const std::vector<Accepted> kRowless = kEmptySizes;
-const std::vector<Accepted> kPixelless = {"null pixels", "zero width", "negative height", "INT_MIN width",
-                                          "negative sizes"};
 
 // A rectangle and a point following the parameter, and the address of such a
 // value for the duration of a call.
@@ -76,11 +74,12 @@ template <class T> const T *ptr(const T &v) { return &v; }
 // Contracts of functions taking the parameter and one picture, returning a
 // new record or changing the picture in place, or two pictures (no result slot).
 Contract<PXImage> made(std::vector<int32_t> formats, std::function<PXImage *(PXImage *, int32_t)> f,
-                       std::vector<Accepted> accepts = {}) {
+                       std::vector<Accepted> accepts = {}, std::vector<Sized> sizes = {}) {
     return {.formats = std::move(formats),
             .call = [f](P &c) { return (c.out = f(c.a, c.p)) != nullptr; },
             .slot = false,
-            .accepts = std::move(accepts)};
+            .accepts = std::move(accepts),
+            .sizes = std::move(sizes)};
 }
 template <class R>
 Contract<R> changed(std::vector<int32_t> formats, std::function<int64_t(R *, int32_t)> f,
@@ -116,8 +115,11 @@ void add_toolkit(std::vector<Operation> &t) {
                      if (static_cast<int64_t>(w) * h > kMaxResult) return static_cast<Image *>(nullptr);
                      return packed_new(in, [&](const PXImage *p) { return PXImage_Resize(p, w, h); });
                  },
-                 made(
-                     kGeometry, [](PXImage *a, int32_t p) { return PXImage_Resize(a, p, 3); }, kPixelless),
+                 // A source without pixel rows or data reads as zeros.
+                 made(kGeometry, [](PXImage *a, int32_t p) { return PXImage_Resize(a, p, 3); },
+                      {shaped("null pixels", "3x3x8 zeros"), shaped("zero width", "3x3x8 zeros"),
+                       shaped("negative height", "3x3x8 zeros"), shaped("INT_MIN width", "3x3x8 zeros"),
+                       shaped("negative sizes", "3x3x8 zeros")}),
                  false});
     t.push_back({"interpolate",
                  PXOP_FN(DualLinearIntepol_KWB),
@@ -149,8 +151,11 @@ void add_toolkit(std::vector<Operation> &t) {
                          return PXImage_Crop(p, &r);
                      });
                  },
-                 made(
-                     kGeometry, [](PXImage *a, int32_t p) { return PXImage_Crop(a, ptr(rect(p))); }, kPixelless),
+                 // Width rounded up to 8; rows claimed above a negative height, none beyond no columns.
+                 made(kGeometry, [](PXImage *a, int32_t p) { return PXImage_Crop(a, ptr(rect(p))); },
+                      {shaped("null pixels", "8x4x8 zeros"), shaped("zero width", "0x4x8 none"),
+                       shaped("negative height", "8x1x8 zeros"), shaped("INT_MIN width", "0x4x8 none"),
+                       shaped("negative sizes", "0x1x8 none")}),
                  false});
     t.push_back({"rotate90",
                  PXOP_FN(PXImage_Rotate90),
@@ -159,7 +164,9 @@ void add_toolkit(std::vector<Operation> &t) {
                  {},
                  kPacked,
                  [](const Image *in, const Args &) { return packed_new(in, PXImage_Rotate90); },
-                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_Rotate90(a); }),
+                 // Two negative sizes turn into a cleared block (none when its rounded width is 0).
+                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_Rotate90(a); }, {},
+                      {{-3, -9, true, 1, "-8x-3x8 zeros"}, {-3, -7, true, 0}}),
                  false});
     t.push_back({"rotate180",
                  PXOP_FN(PXImage_Rotate180),
@@ -168,7 +175,8 @@ void add_toolkit(std::vector<Operation> &t) {
                  {},
                  kPacked,
                  [](const Image *in, const Args &) { return packed_new(in, PXImage_Rotate180); },
-                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_Rotate180(a); }, {"negative sizes"})});
+                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_Rotate180(a); },
+                      {shaped("negative sizes", "-3x-2x8 zeros")})});
     t.push_back({"rotate270",
                  PXOP_FN(PXImage_Rotate270),
                  "Toolkit geometry",
@@ -176,7 +184,8 @@ void add_toolkit(std::vector<Operation> &t) {
                  {},
                  kPacked,
                  [](const Image *in, const Args &) { return packed_new(in, PXImage_Rotate270); },
-                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_Rotate270(a); }),
+                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_Rotate270(a); }, {},
+                      {{-3, -9, true, 1, "-8x-3x8 zeros"}, {-3, -7, true, 0}}),
                  false});
     t.push_back({"zoom-in",
                  PXOP_FN(PXImage_ZoomIn),
@@ -185,7 +194,8 @@ void add_toolkit(std::vector<Operation> &t) {
                  {},
                  kPacked,
                  [](const Image *in, const Args &) { return packed_new(in, PXImage_ZoomIn); },
-                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_ZoomIn(a); }, {"negative sizes"}),
+                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_ZoomIn(a); },
+                      {shaped("negative sizes", "-6x-4x8 zeros")}),
                  false});
     t.push_back({"zoom-out",
                  PXOP_FN(PXImage_ZoomOut),
@@ -194,7 +204,8 @@ void add_toolkit(std::vector<Operation> &t) {
                  {},
                  kPacked,
                  [](const Image *in, const Args &) { return packed_new(in, PXImage_ZoomOut); },
-                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_ZoomOut(a); }, {"null pixels"}),
+                 made(kGeometry, [](PXImage *a, int32_t) { return PXImage_ZoomOut(a); },
+                      {shaped("null pixels", "8x3x8 zeros")}, {{-16, -2, true, 1, "-8x-1x8 zeros"}, {-4, -2, true, 0}}),
                  false});
     t.push_back({"roi-zoom",
                  PXOP_FN(PXImage_ROI_Zoom),
@@ -215,12 +226,18 @@ void add_toolkit(std::vector<Operation> &t) {
                      PXImage_Free(src);
                      return out;
                  },
+                 // Targets without data or pixel rows take no writes.
                  two(
                      {32},
                      [](PXImage *a, PXImage *b, int32_t p) -> int64_t {
                          return PXImage_ROI_Zoom(a, b, ptr(rect(p)), p / 3.0, p, 1);
                      },
-                     in_both(kPixelless))});
+                     [] {
+                         std::vector<Accepted> v = in_both(kPixelless);
+                         for (size_t i = kPixelless.size(); i < v.size(); ++i)
+                             v[i].shape = "kept";
+                         return v;
+                     }())});
     t.push_back({"auto-exposure",
                  PXOP_FN(PXImage_AutoExposure),
                  "Toolkit tone",

@@ -87,7 +87,6 @@ TEST(Files, SaveBmpWritesHeadersPaletteAndRowsAsStored) {
     EXPECT_EQ(saveBmp(path("none/x.bmp").c_str(), im.get()), 0);
     EXPECT_EQ(saveBmp(dir.c_str(), im.get()), 0);                               // a directory
     EXPECT_EQ(saveBmp(("/tmp/" + std::string(251, 'c')).c_str(), im.get()), 0); // 256 bytes
-    EXPECT_EQ(saveBmp((dir + std::string(300, 'c')).c_str(), im.get()), 0);
     std::remove(path("a.bmp").c_str());
 }
 

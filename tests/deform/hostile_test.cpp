@@ -35,14 +35,6 @@ TEST(Hostile, DeformationScalars) {
     EXPECT_EQ(pxtest::diff(q, none), "");
     free_Image(&slot, 0);
     free_Image(&none, 0);
-    // A source without pixels reads as 0: black background, black pixels.
-    auto hollow = good<Image>(9, 7, 24, 2);
-    hollow->record.bits = nullptr;
-    ASSERT_EQ(DeformationFunc(&hollow->record, q, pairs, 4), 1);
-    EXPECT_TRUE(std::all_of(twin->block.begin(), twin->block.end(), [](uint8_t v) { return v == 0; }));
-    auto waved = good<Image>(9, 7, 32, 4);
-    ASSERT_EQ(render_wave(&hollow->record, &waved->record, wave_map, 0, 0), 1);
-    EXPECT_TRUE(std::all_of(waved->block.begin(), waved->block.end(), [](uint8_t v) { return v == 0; }));
     const int32_t xy[] = {INT_MAX, INT_MIN};
     const double weights[] = {1e300};
     for (int32_t v : kExtremes) {

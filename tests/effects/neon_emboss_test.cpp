@@ -4,7 +4,7 @@
 
 #include <cstdlib>
 
-#include "effect_check.hpp"
+#include "support/reference_check.hpp"
 #include "support/slot_rule.hpp"
 
 using namespace pxtest;

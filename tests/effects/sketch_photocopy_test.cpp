@@ -5,7 +5,7 @@
 #include <array>
 #include <vector>
 
-#include "effect_check.hpp"
+#include "support/reference_check.hpp"
 
 using namespace pxtest;
 

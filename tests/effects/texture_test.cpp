@@ -4,7 +4,7 @@
 #include <cstdlib>
 #include <vector>
 
-#include "effect_check.hpp"
+#include "support/reference_check.hpp"
 
 using namespace pxtest;
 

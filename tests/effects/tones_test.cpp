@@ -8,7 +8,7 @@
 #include <numeric>
 #include <vector>
 
-#include "effect_check.hpp"
+#include "support/reference_check.hpp"
 
 using namespace pxtest;
 
@@ -90,15 +90,6 @@ TEST(Tones, HandComputedPixelsInEveryFormat) {
         EXPECT_EQ(GetPixelColor(dst.get(), 1, 1), c.out) << std::hex << c.in;
         expect_format_consistent(c.effect, c.out);
     }
-}
-
-TEST(Tones, LineDarkensAllButEveryThirdRow) {
-    const auto line = [](uint32_t c, int, int y) {
-        const auto dark = [&](int sh) { return std::max(chan(c, sh) - 128, 0); };
-        return y % 3 == 2 ? c : rgba(dark(0), dark(8), dark(16), chan(c, 24));
-    };
-    expect_like_reference(
-        PX_IMG_Line, [&](const Image *s) { return per_pixel(s, line); }, 100);
 }
 
 TEST(Alter, EveryModeMatchesPerPixelCurvesAndExtremeShiftsWrap) {

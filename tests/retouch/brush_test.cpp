@@ -47,9 +47,7 @@ Owned tinted(const Image *pic, uint8_t lr, uint8_t lg, uint8_t lb) {
 }
 
 Owned brightened(const Image *pic, int level) {
-    Owned out = clone(pic);
-    map_pixels(out.get(), [&](int v, int) { return std::min(v + level, 255); });
-    return out;
+    return mapped(pic, [&](int v) { return std::min(v + level, 255); });
 }
 
 } // namespace

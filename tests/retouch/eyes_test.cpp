@@ -46,7 +46,7 @@ void ref_stretch(Image *im, int32_t cx, int32_t cy, int32_t a, bool ellipse) {
 
 void ref_under_eye(Image *im, int32_t cx, int32_t cy, int32_t strength) {
     const int q = std::clamp(strength, 0, 10) / 10, u = std::max(im->width / 24, 4);
-    auto lum = [](uint32_t c) { return (117 * ch(c, 0) + 601 * ch(c, 8) + 306 * ch(c, 16)) >> 10; };
+    auto lum = [](uint32_t c) { return (117 * chan(c, 0) + 601 * chan(c, 8) + 306 * chan(c, 16)) >> 10; };
     const int yr = lum(GetPixelColor(im, cx, cy - u - u - u / 2));
     for (int32_t y = cy; y >= cy - 3 * u; --y)
         for (int32_t x = cx - 2 * u; x <= cx + 2 * u; ++x) {
@@ -60,8 +60,8 @@ void ref_under_eye(Image *im, int32_t cx, int32_t cy, int32_t strength) {
             if (cc < v) v = (cc + v) / 2;
             v = std::min(int(v * (q + 1.0)), d);
             SetPixelColor(im, x, y,
-                          (c & 0xFF000000u) | ((ch(c, 0) + v) & 255) | ((ch(c, 8) + v) & 255) << 8 |
-                              uint32_t((ch(c, 16) + v) & 255) << 16);
+                          (c & 0xFF000000u) | ((chan(c, 0) + v) & 255) | ((chan(c, 8) + v) & 255) << 8 |
+                              uint32_t((chan(c, 16) + v) & 255) << 16);
         }
 }
 

@@ -6,13 +6,12 @@
 #include <cstdlib>
 #include <random>
 
-#include "support/test_images.hpp"
+#include "support/reference_check.hpp"
 
 namespace rtest {
 
+using pxtest::chan;
 using pxtest::Owned;
-
-inline int ch(uint32_t c, int shift) { return static_cast<int>((c >> shift) & 255); }
 
 // Skin-coloured noise with dark blobs and gaps, so that masks, runs and
 // holes of every length occur.
@@ -35,7 +34,7 @@ inline Owned ref_mask(const Image *src) {
     for (int32_t y = 0; y < h; ++y)
         for (int32_t x = 0; x < w; ++x) {
             const uint32_t c = GetPixelColor(src, x, y);
-            const int b = ch(c, 0), g = ch(c, 8), r = ch(c, 16);
+            const int b = chan(c, 0), g = chan(c, 8), r = chan(c, 16);
             SetPixelIndex(m.get(), x, y, r >= g && r >= b && r > 49 ? g : 0);
         }
     for (int32_t y = 0; y < h; ++y) // skin runs of 1 to 19 go; the last column ends a run
@@ -79,7 +78,7 @@ inline uint32_t lift(uint32_t c, int d, double wb, double wg, double wr) {
         const double r = v + w * d;
         return r > 255.0 ? 255u : static_cast<uint32_t>(r);
     };
-    return one(ch(c, 0), wb) | one(ch(c, 8), wg) << 8 | one(ch(c, 16), wr) << 16 | (c & 0xFF000000u);
+    return one(chan(c, 0), wb) | one(chan(c, 8), wg) << 8 | one(chan(c, 16), wr) << 16 | (c & 0xFF000000u);
 }
 
 inline Owned ref_smooth_1(const Image *src) {
@@ -100,16 +99,11 @@ inline Owned ref_smooth_1(const Image *src) {
     return out;
 }
 
-// Replaces blue, green and red of every pixel by fn(value, shift); alpha kept.
-template <class Fn> void map_pixels(Image *im, Fn fn) {
-    for (int32_t y = 0; y < im->height; ++y)
-        for (int32_t x = 0; x < im->width; ++x) {
-            const uint32_t c = GetPixelColor(im, x, y);
-            uint32_t o = c & 0xFF000000u;
-            for (int s : {0, 8, 16})
-                o |= uint32_t(fn(ch(c, s), s)) << s;
-            SetPixelColor(im, x, y, o);
-        }
+// src with blue, green and red of every pixel replaced by fn(value); alpha kept.
+template <class Fn> Owned mapped(const Image *src, Fn fn) {
+    return pxtest::per_pixel(src, [&](uint32_t c, int, int) {
+        return pxtest::rgba(fn(chan(c, 0)), fn(chan(c, 8)), fn(chan(c, 16)), chan(c, 24));
+    });
 }
 
 inline uint32_t distance(int64_t dx, int64_t dy) {

@@ -12,8 +12,6 @@ using namespace rtest;
 
 namespace {
 
-const int32_t kSizes[][2] = {{1, 1}, {1, 7}, {7, 1}, {2, 3}, {13, 9}, {31, 20}};
-
 std::vector<int32_t> mapping(std::vector<std::pair<int, int32_t>> bins, float low, float high) {
     std::vector<int32_t> t(256, 0);
     for (auto [i, n] : bins)
@@ -28,7 +26,7 @@ Owned ref_auto_levels(const Image *src, int32_t amount) {
     for (int32_t y = 0; y < h; ++y)
         for (int32_t x = 0; x < w; ++x)
             for (int s : {0, 8, 16})
-                ++hist[ch(GetPixelColor(src, x, y), s)];
+                ++hist[chan(GetPixelColor(src, x, y), s)];
     MakeMapping(hist.data(), 0.0005f, 0.0005f);
     const std::vector<int32_t> &m = hist;
     Owned out = make(w, h, static_cast<int32_t>(src->bitCount));
@@ -37,10 +35,11 @@ Owned ref_auto_levels(const Image *src, int32_t amount) {
             const uint32_t c = GetPixelColor(src, x, y);
             uint32_t o = c & 0xFF000000u;
             for (int s : {0, 8, 16}) {
-                const int v = ch(c, s);
-                const int n = (m[ch(GetPixelColor(src, x - 1, y), s)] + m[ch(GetPixelColor(src, x + 1, y), s)] +
-                               m[ch(GetPixelColor(src, x, y - 1), s)] + m[ch(GetPixelColor(src, x, y + 1), s)] + 2) /
-                              4;
+                const int v = chan(c, s);
+                const int n =
+                    (m[chan(GetPixelColor(src, x - 1, y), s)] + m[chan(GetPixelColor(src, x + 1, y), s)] +
+                     m[chan(GetPixelColor(src, x, y - 1), s)] + m[chan(GetPixelColor(src, x, y + 1), s)] + 2) /
+                    4;
                 const int sc = 255 - ((255 - n) * (255 - m[v])) / 255;
                 o |= uint32_t((amount * sc + (100 - amount) * v) / 100) << s;
             }
@@ -84,16 +83,11 @@ TEST(ToneCurves, GammaTableAndStretchMapping) {
 }
 
 TEST(AutoGradation, LocalScreenMatchesAccessorVersion) {
-    uint32_t seed = 5;
-    for (int32_t bc : kBitCounts)
-        for (auto [w, h] : kSizes)
-            for (int32_t amount : {-20, 37, 250}) { // amounts clamp to 0..100
-                Owned src = random_image(w, h, bc, seed++);
-                Slot dst;
-                ASSERT_EQ(ImageAutoGradationProcess(src.get(), &dst, amount), 1);
-                EXPECT_EQ(diff(dst.get(), ref_auto_levels(src.get(), std::clamp(amount, 0, 100)).get()), "")
-                    << bc << " " << w << "x" << h << " " << amount;
-            }
+    for (int32_t amount : {-20, 37, 250}) // amounts clamp to 0..100
+        expect_like_reference(
+            [amount](Image *s, Image **d) { return uint32_t(ImageAutoGradationProcess(s, d, amount)); },
+            [amount](const Image *s) { return ref_auto_levels(s, std::clamp(amount, 0, 100)); },
+            uint32_t(amount + 100));
 }
 
 TEST(AutoGradation, DarkHalfStretch) {
@@ -149,8 +143,8 @@ TEST(ThresholdBlur, NearBlackTapsBlackenTheirNeighbours) {
             thresholdBlur(0, 0, 3, 0, src.get(), &dst);
             for (int32_t x = 0; x < 20; ++x) {
                 const uint32_t c = GetPixelColor(dst.get(), x, 1), o = GetPixelColor(src.get(), x == 9 ? 8 : x, 1);
-                EXPECT_EQ(ch(c, 8) == 0, g <= 10 && x >= 6 && x <= 12) << bc << " " << g << " " << x;
-                EXPECT_EQ(ch(c, 16), ch(o, 16));
+                EXPECT_EQ(chan(c, 8) == 0, g <= 10 && x >= 6 && x <= 12) << bc << " " << g << " " << x;
+                EXPECT_EQ(chan(c, 16), chan(o, 16));
             }
         }
 }

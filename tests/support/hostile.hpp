@@ -60,38 +60,33 @@ inline uint32_t padded_pitch(int64_t width, uint32_t bitCount) {
     return static_cast<uint32_t>(((bits + 31) / 32) * 4);
 }
 
-inline HeldPtr<Image> held(std::string what, int32_t w, int32_t h, uint32_t bitCount, uint32_t pitch, size_t bytes,
-                           uint32_t seed) {
-    auto r = std::make_unique<Held<Image>>();
+// A record of w x h over a block of `bytes` noise bytes (none for 0); the
+// pitch is that of Image records.
+template <class R>
+HeldPtr<R> held(std::string what, int32_t w, int32_t h, int32_t bitCount, uint32_t pitch, size_t bytes, uint32_t seed) {
+    auto r = std::make_unique<Held<R>>();
     r->what = std::move(what);
     r->block = noise(bytes, seed);
-    r->record = Image{w, h, bitCount, bytes ? r->block.data() : nullptr, pitch, 0};
-    return r;
-}
-
-inline HeldPtr<PXImage> held(std::string what, int32_t w, int32_t h, int32_t bitCount, size_t bytes, uint32_t seed) {
-    auto r = std::make_unique<Held<PXImage>>();
-    r->what = std::move(what);
-    r->block = noise(bytes, seed);
-    r->record = PXImage{w, h, bitCount, bytes ? r->block.data() : nullptr};
+    uint8_t *pixels = bytes ? r->block.data() : nullptr;
+    if constexpr (std::is_same_v<R, Image>)
+        r->record = Image{w, h, uint32_t(bitCount), pixels, pitch, 0};
+    else
+        r->record = PXImage{w, h, bitCount, pixels};
     return r;
 }
 
 // A usable picture of w x h at a bit count, filled with noise.
 template <class R> HeldPtr<R> good(int32_t w, int32_t h, int32_t bitCount, uint32_t seed) {
-    if constexpr (std::is_same_v<R, Image>) {
-        const uint32_t pitch = padded_pitch(w, bitCount);
-        return held("good", w, h, bitCount, pitch, size_t(pitch) * h, seed);
-    } else {
-        return held("good", w, h, bitCount, size_t(w) * h * std::max(1, (bitCount + 7) / 8), seed);
-    }
+    const uint32_t pitch = padded_pitch(w, uint32_t(bitCount));
+    const size_t row = std::is_same_v<R, Image> ? pitch : size_t(w) * std::max(1, (bitCount + 7) / 8);
+    return held<R>("good", w, h, bitCount, pitch, row * h, seed);
 }
 
 inline constexpr int32_t kBitCountsTried[] = {0, 1, 4, 8, 12, 16, 24, 32, 48};
 
 // Every broken record for a function working on the given bit counts: null
-// pixels, zero, negative and overflowing sizes, pitches below a row, and each
-// bit count it does not accept.
+// pixels, zero, negative and overflowing sizes, pitches below a row (Image
+// records), and each bit count it does not accept.
 template <class R> std::vector<HeldPtr<R>> broken(const std::vector<int32_t> &formats) {
     const int32_t bc = formats.front();
     std::vector<HeldPtr<R>> v;
@@ -100,27 +95,27 @@ template <class R> std::vector<HeldPtr<R>> broken(const std::vector<int32_t> &fo
             v.push_back(good<R>(9, 7, other, 1));
             v.back()->what = "bit count " + std::to_string(other);
         }
-    if constexpr (std::is_same_v<R, Image>) {
-        const uint32_t row = padded_pitch(9, bc);
-        v.push_back(held("null pixels", 9, 7, bc, row, 0, 0));
-        v.push_back(held("zero width", 0, 7, bc, row, size_t(row) * 7, 2));
-        v.push_back(held("negative height", 9, -7, bc, row, 64, 3));
-        v.push_back(held("INT_MIN width", INT_MIN, 7, bc, row, size_t(row) * 7, 4));
-        v.push_back(held("negative sizes", -3, -2, bc, row, 64, 9));
-        v.push_back(held("block over 2^32 bytes", 65536, 65536, bc, padded_pitch(65536, bc), 64, 5));
-        v.push_back(held("INT_MAX height", 9, INT_MAX, bc, row, 64, 6));
-        if (bc >= 8) v.push_back(held("pitch below a row", 9, 7, bc, 9 * bc / 8 - 1, size_t(9 * bc / 8 - 1) * 7, 7));
-        v.push_back(held("zero pitch", 9, 7, bc, 0, 64, 8));
-    } else {
-        const size_t bytes = size_t(9) * 7 * std::max(1, (bc + 7) / 8);
-        v.push_back(held("null pixels", 9, 7, bc, 0, 0));
-        v.push_back(held("zero width", 0, 7, bc, bytes, 2));
-        v.push_back(held("negative height", 9, -7, bc, 64, 3));
-        v.push_back(held("INT_MIN width", INT_MIN, 7, bc, 64, 4));
-        v.push_back(held("negative sizes", -3, -2, bc, 64, 9));
-        v.push_back(held("block over 2^32 bytes", 65536, 65536, bc, 64, 5));
-        v.push_back(held("INT_MAX height", 9, INT_MAX, bc, 64, 6));
-    }
+    const bool image = std::is_same_v<R, Image>;
+    const uint32_t row = padded_pitch(9, uint32_t(bc)), low = uint32_t(9 * bc / 8 - 1);
+    const size_t rows = image ? size_t(row) * 7 : size_t(9) * 7 * std::max(1, (bc + 7) / 8);
+    const struct {
+        const char *what;
+        int32_t w, h;
+        uint32_t pitch;
+        size_t bytes;
+    } kinds[] = {{"null pixels", 9, 7, row, 0},
+                 {"zero width", 0, 7, row, rows},
+                 {"negative height", 9, -7, row, 64},
+                 {"INT_MIN width", INT_MIN, 7, row, image ? rows : 64},
+                 {"negative sizes", -3, -2, row, 64},
+                 {"block over 2^32 bytes", 65536, 65536, padded_pitch(65536, uint32_t(bc)), 64},
+                 {"INT_MAX height", 9, INT_MAX, row, 64},
+                 {"pitch below a row", 9, 7, low, size_t(low) * 7},
+                 {"zero pitch", 9, 7, 0, 64}};
+    // The pitches are Image records' only; rows below a byte have no shorter one.
+    for (uint32_t i = 0; i < std::size(kinds); ++i)
+        if (i < 7 || (image && (i == 8 || bc >= 8)))
+            v.push_back(held<R>(kinds[i].what, kinds[i].w, kinds[i].h, bc, kinds[i].pitch, kinds[i].bytes, i));
     return v;
 }
 
@@ -173,8 +168,9 @@ template <class R> struct Runner {
     // What one call gave: its result and the bytes of the picture it made.
     struct Outcome {
         int64_t result;
-        bool made;
         std::vector<uint8_t> picture;
+        std::string shape;
+        bool made() const { return shape != "null"; }
     };
     // Calls the function and releases its result.
     Outcome run(R *a, R *b, int32_t p, bool nullSlot = false) {
@@ -182,7 +178,7 @@ template <class R> struct Runner {
         call.p = p;
         if (nullSlot) call.slot = nullptr;
         const int64_t r = c.call(call);
-        Outcome o{r, call.out != nullptr, picture_bytes(call.out)};
+        Outcome o{r, picture_bytes(call.out), shape_of(call.out)};
         release(call.out);
         return o;
     }
@@ -190,11 +186,11 @@ template <class R> struct Runner {
         std::vector<std::vector<uint8_t>> before;
         for (auto *h : inputs)
             before.push_back(h->snapshot());
-        const auto [r, made, picture] = run(a, b, c.typical, nullSlot);
+        const auto o = run(a, b, c.typical, nullSlot);
         if (c.failure != kNoResult) {
-            EXPECT_EQ(r, c.failure) << name << ": " << why;
+            EXPECT_EQ(o.result, c.failure) << name << ": " << why;
         }
-        EXPECT_FALSE(made) << name << ": " << why;
+        EXPECT_FALSE(o.made()) << name << ": " << why;
         for (size_t i = 0; i < inputs.size(); ++i)
             EXPECT_TRUE(inputs[i]->snapshot() == before[i]) << name << ": " << why << " changed an input";
     }
@@ -270,51 +266,94 @@ template <class R> void expect_allocation_failures_handled(const std::string &na
             const bool same = o.result == full.result && o.picture == full.picture && a->snapshot() == fullA &&
                               b->snapshot() == fullB;
             const bool failed = (c.failure == kNoResult || o.result == c.failure) &&
-                                (c.keeps_result_on_failure || !o.made) && a->snapshot() == sa && b->snapshot() == sb;
+                                (c.keeps_result_on_failure || !o.made()) && a->snapshot() == sa && b->snapshot() == sb;
             EXPECT_TRUE(same || failed) << name << ": short of memory, neither a full run nor a clean failure (result "
-                                        << o.result << ", full run " << full.result << (o.made ? ", a picture" : "")
+                                        << o.result << ", full run " << full.result << (o.made() ? ", a picture" : "")
                                         << (a->snapshot() == sa ? "" : ", first picture changed") << ")";
         });
     }
 }
 
-// Accepted degenerate records in either picture position: the result the
-// contract gives, and for a record without a pixel block, what the same
-// record with an all-zero block gives.
+template <class R> R without_pixels(R r) {
+    if constexpr (std::is_same_v<R, Image>)
+        r.bits = nullptr;
+    else
+        r.data = nullptr;
+    return r;
+}
+
+// A call on `h` pinned to a shape: that of its result, or "kept" for `h` as
+// it was before the call.
+template <class R>
+void expect_shape(const char *want, const std::string &shape, const Held<R> &h, const std::vector<uint8_t> &before,
+                  const std::string &why) {
+    if (want == nullptr) return;
+    EXPECT_EQ(std::string(want) == "kept" ? (h.snapshot() == before ? "kept" : "changed") : shape, want) << why;
+}
+
+// Accepted degenerate records in either picture position: the result and
+// shape the contract gives, and for a record without a pixel block, the
+// result, picture and other picture of the same record with an all-zero block.
 template <class R> void expect_accepted_outcomes(const std::string &name, const Contract<R> &c) {
     Runner<R> run{c, name};
     const int32_t fa = c.formats.front(), fb = run.format_b(fa);
     for (const bool second : {false, true}) {
         if (second && c.pictures < 2) break;
-        auto other = good<R>(9, 7, second ? fa : fb, 41);
-        auto call = [&](R *degenerate) {
-            if (!second) return run.run(degenerate, c.pictures > 1 ? &other->record : nullptr, c.typical);
-            return run.run(&other->record, degenerate, c.typical);
+        auto call = [&](R *degenerate, int32_t otherBits, std::vector<uint8_t> *otherAfter = nullptr) {
+            auto other = good<R>(9, 7, otherBits, 41);
+            R *o = c.pictures > 1 ? &other->record : nullptr;
+            const auto out = second ? run.run(o, degenerate, c.typical) : run.run(degenerate, o, c.typical);
+            if (otherAfter) *otherAfter = other->block;
+            return out;
         };
         for (auto &bad : broken<R>(second ? std::vector<int32_t>{fb} : c.formats)) {
             const Accepted *acc = c.accepted(second ? "second: " + bad->what : bad->what);
             if (acc == nullptr) continue;
-            const std::string why = name + ": " + acc->what;
-            const auto o = call(&bad->record);
+            const auto before = bad->snapshot();
+            const auto o = call(&bad->record, second ? fa : fb);
             if (c.failure != kNoResult) {
-                EXPECT_EQ(o.result, acc->result != pxop::kUnpinned ? acc->result : c.done) << why;
+                EXPECT_EQ(o.result, acc->result != pxop::kUnpinned ? acc->result : c.done) << name << ": " << acc->what;
             }
+            expect_shape(acc->shape, o.shape, *bad, before, name + ": " + acc->what);
         }
-        // Without a pixel block, at every bit count: as with an all-zero block.
+        // Without a pixel block, at every bit count (beside every bit count of
+        // the first picture): as with an all-zero block.
         const Accepted *none = c.accepted(second ? "second: null pixels" : "null pixels");
         if (none == nullptr || !none->reads_as_zeros) continue;
-        for (const int32_t bc : second ? std::vector<int32_t>{fb} : c.formats) {
-            auto zeros = good<R>(9, 7, bc, 0);
-            std::fill(zeros->block.begin(), zeros->block.end(), 0);
-            R hollow = zeros->record;
-            if constexpr (std::is_same_v<R, Image>)
-                hollow.bits = nullptr;
-            else
-                hollow.data = nullptr;
-            const auto o = call(&hollow), z = call(&zeros->record);
-            EXPECT_TRUE(o.result == z.result && o.picture == z.picture)
-                << name << ": " << none->what << " at " << bc << " bits, not as an all-zero block";
+        for (const int32_t bc : second ? (c.formats_b.empty() ? c.formats : c.formats_b) : c.formats)
+            for (const int32_t ob : second ? c.formats : std::vector<int32_t>{fb}) {
+                auto zeros = good<R>(9, 7, bc, 0);
+                std::fill(zeros->block.begin(), zeros->block.end(), 0);
+                R hollow = without_pixels(zeros->record);
+                std::vector<uint8_t> otherH, otherZ;
+                const auto o = call(&hollow, ob, &otherH), z = call(&zeros->record, ob, &otherZ);
+                EXPECT_TRUE(o.result == z.result && o.picture == z.picture && otherH == otherZ)
+                    << name << ": " << none->what << " at " << bc << " bits beside " << ob
+                    << ", not as an all-zero block";
+            }
+    }
+}
+
+// Records of the contract's other sizes, over a block for every pixel they
+// claim: the result, a refusal as such, and the shape.
+template <class R> void expect_sizes(const std::string &name, const Contract<R> &c) {
+    Runner<R> run{c, name};
+    auto b = good<R>(9, 7, run.format_b(c.formats.front()), 52);
+    auto side = [](int32_t n) { return int32_t(std::clamp<int64_t>(std::llabs(n), 1, 1024)); };
+    for (const pxop::Sized &k : c.sizes) {
+        const std::string why = name + ": " + std::to_string(k.w) + "x" + std::to_string(k.h);
+        auto held = good<R>(side(k.w), side(k.h), c.formats.front(), 51);
+        held->record.width = k.w, held->record.height = k.h;
+        if (!k.pixels) held->record = without_pixels(held->record);
+        R *second = c.pictures > 1 ? &b->record : nullptr;
+        if (k.result == c.failure) {
+            run.expect_refused(&held->record, second, false, {held.get(), b.get()}, why);
+            continue;
         }
+        const auto before = held->snapshot();
+        const auto o = run.run(&held->record, second, c.typical);
+        EXPECT_EQ(o.result, k.result) << why;
+        expect_shape(k.shape, o.shape, *held, before, why);
     }
 }
 
@@ -322,6 +361,7 @@ template <class R> void expect_accepted_outcomes(const std::string &name, const 
 template <class R> void check_contract(const std::string &name, const Contract<R> &c) {
     expect_refusals(name, c);
     expect_accepted_outcomes(name, c);
+    expect_sizes(name, c);
     expect_extremes_survive(name, c);
     expect_allocation_failures_handled(name, c);
     if constexpr (std::is_same_v<R, Image>) {

@@ -4,12 +4,15 @@
 
 #include <pxfx/pxfx.h>
 
+#include <algorithm>
 #include <cstdint>
+#include <cstdlib>
 #include <fstream>
 #include <iterator>
 #include <memory>
 #include <random>
 #include <string>
+#include <type_traits>
 #include <vector>
 
 namespace pxtest {
@@ -69,6 +72,33 @@ struct ShapeCase {
     bool pixels;
     int32_t result;
 };
+
+// The shape of a result picture, as a contract pins it (pxop::Accepted).
+template <class R> std::string shape_of(const R *im) {
+    if (im == nullptr) return "null";
+    const uint8_t *pixels;
+    size_t bytes;
+    int32_t bits;
+    if constexpr (std::is_same_v<R, Image>) {
+        pixels = im->bits, bits = int32_t(im->bitCount);
+        bytes = size_t(im->pitch) * size_t(std::llabs(im->height));
+    } else {
+        pixels = im->data, bits = im->bitcount;
+        bytes = size_t(std::llabs(int64_t(im->width) * im->height)) * size_t(std::max(bits / 8, 0));
+    }
+    const std::string s = std::to_string(im->width) + "x" + std::to_string(im->height) + "x" + std::to_string(bits);
+    if (pixels == nullptr) return s + " none";
+    for (const uint8_t fill : {0, 255})
+        if (std::all_of(pixels, pixels + bytes, [fill](uint8_t b) { return b == fill; }))
+            return s + (fill ? " white" : " zeros");
+    return s + " pixels";
+}
+
+// A channel of a packed colour (blue at shift 0), and a colour of channels.
+constexpr int chan(uint32_t c, int shift) { return static_cast<int>((c >> shift) & 255); }
+constexpr uint32_t rgba(int b, int g, int r, int a) {
+    return uint32_t(b) | uint32_t(g) << 8 | uint32_t(r) << 16 | uint32_t(a) << 24;
+}
 
 // The bit counts every Image function must handle.
 inline constexpr int32_t kBitCounts[] = {8, 16, 24, 32};

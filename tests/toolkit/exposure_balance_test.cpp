@@ -176,22 +176,6 @@ TEST(ColorFilter, LevelMaps) {
     }
 }
 
-// Masks without a pixel block or area select nothing (1, image unchanged).
-TEST(ColorFilter, DegenerateMasks) {
-    std::vector<uint8_t> block(256, 77);
-    const auto orig = block;
-    auto rec = [&](int32_t w, int32_t h, bool data = true) {
-        return Image{w, h, 8, data ? block.data() : nullptr, 16, 0};
-    };
-    Owned gray = random_image(5, 4, 8, 3), rgb = random_image(5, 4, 24, 4);
-    Owned gray0 = clone(gray.get()), rgb0 = clone(rgb.get());
-    for (Image mask : {rec(5, 4, false), rec(0, 4), rec(5, -4)}) {
-        EXPECT_EQ(ColorFilter(gray.get(), 0, &mask) + ColorFilter24(rgb.get(), 0, &mask), 2);
-        EXPECT_EQ(diff(gray.get(), gray0.get()) + diff(rgb.get(), rgb0.get()), "");
-    }
-    EXPECT_EQ(block, orig);
-}
-
 TEST(ColorFilter, TintMasks) {
     Owned mask = random_image(7, 11, 8, 99), gray = random_image(13, 9, 8, 1), rgb = random_image(13, 9, 24, 2);
     Owned gray0 = clone(gray.get()), rgb0 = clone(rgb.get());

@@ -4,14 +4,13 @@
 
 #include <pxfx/pxfx.h>
 
-#include <algorithm>
 #include <cstdint>
-#include <cstdlib>
 #include <cstring>
 #include <memory>
 #include <random>
-#include <string>
 #include <vector>
+
+#include "support/test_images.hpp"
 
 namespace pxtest {
 
@@ -44,18 +43,6 @@ inline PX px_clone(const PXImage *src) {
 }
 
 inline std::vector<uint8_t> bytes(const PXImage *im) { return {im->data, im->data + px_size(im)}; }
-
-// "null", or a record's width x height x bit count and its block: "none"
-// without data, "zeros" when its |width x height| pixels are all 0, else
-// "pixels".
-inline std::string px_shape(const PXImage *im) {
-    if (im == nullptr) return "null";
-    const std::string s =
-        std::to_string(im->width) + "x" + std::to_string(im->height) + "x" + std::to_string(im->bitcount);
-    if (im->data == nullptr) return s + " none";
-    const size_t n = size_t(std::llabs(int64_t(im->width) * im->height)) * (im->bitcount / 8);
-    return s + (std::all_of(im->data, im->data + n, [](uint8_t b) { return b == 0; }) ? " zeros" : " pixels");
-}
 
 inline int32_t clampi(int64_t v, int32_t n) { return v < 0 ? 0 : (v >= n ? n - 1 : int32_t(v)); }
 

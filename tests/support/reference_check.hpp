@@ -1,5 +1,5 @@
-// Shared checks for the effect tests: straightforward accessor versions are
-// run beside the library on random pictures of every format and awkward size.
+// Straightforward accessor versions run beside the library on random
+// pictures of every format and awkward size.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -13,11 +13,6 @@ namespace pxtest {
 // 130 x 5 takes rows past the 64-pixel blocks of the vector table lookups.
 inline constexpr int32_t kAwkwardSizes[][2] = {{1, 1}, {1, 7},  {7, 1},   {2, 3},   {5, 5},
                                                {6, 4}, {13, 9}, {33, 17}, {64, 48}, {130, 5}};
-
-constexpr int chan(uint32_t c, int shift) { return static_cast<int>((c >> shift) & 255); }
-constexpr uint32_t rgba(int b, int g, int r, int a) {
-    return uint32_t(b) | uint32_t(g) << 8 | uint32_t(r) << 16 | uint32_t(a) << 24;
-}
 
 // The picture that a per-pixel function makes of src, written pixel by pixel.
 template <class Fn> Owned per_pixel(const Image *src, Fn fn) {
