@@ -67,7 +67,7 @@ void remove_isolated_dots(const View &img) {
             const int32_t n = w - 1 - x < kChunk ? w - 1 - x : kChunk;
             for (int32_t i = 0; i < n; ++i) {
                 const uint8_t *p = row + x + i;
-                judged[i] = (p[0] == 1) & (p[-1] != 1) & (p[1] != 1) ? 255 : p[0];
+                judged[i] = ((p[0] == 1) & (p[-1] != 1) & (p[1] != 1)) != 0 ? 255 : p[0];
             }
             std::memcpy(row + x, judged, static_cast<size_t>(n));
         }

@@ -96,7 +96,8 @@ TEST(Alter, EveryModeMatchesPerPixelCurvesAndExtremeShiftsWrap) {
     const int shifts[][3] = {{0, 0, 0}, {127, -127, 40}, {-5, 90, -60}, {200, -300, 128}};
     uint32_t seed = 1;
     for (uint32_t mode : {0u, 1u, 2u, 3u, 4u, 5u, 6u, 100u, 0xFFFFFFFFu})
-        for (auto [dR, dG, dB] : shifts) {
+        for (const auto &shift : shifts) {
+            const int dR = shift[0], dG = shift[1], dB = shift[2];
             const auto at = [&](int d, uint32_t c, int sh) { return curve(mode, d, ltouc(chan(c, sh) + d)); };
             const auto ref = [&](const Image *s) {
                 return per_pixel(s, [&](uint32_t c, int, int) {
