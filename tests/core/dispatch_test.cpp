@@ -167,3 +167,45 @@ TEST(Dispatch, MedianMatchesThePlainNetwork) {
                         << bits << " bits, width " << width << ", levels " << levels << ", path " << p;
             }
 }
+
+// Split and Combine in HSL, and the HSL transform, at every width up to past
+// a 64-byte vector, on rows whose pitch is larger than they need: noise, and
+// pictures of three levels (grays, channels that tie, both lightness
+// halves); Combine also from noise planes.
+TEST(Dispatch, HslPlanesMatchThePlainCode) {
+    constexpr uint8_t kLevels[] = {0, 128, 255};
+    std::mt19937 rng(17);
+    for (int32_t bits : {24, 32})
+        for (int32_t width = 1; width <= 70; ++width)
+            for (bool few : {false, true}) {
+                const Owned held = pxtest::random_image(80, 3, bits, rng());
+                if (few)
+                    for (size_t i = 0; i < size_t{held->pitch} * 3; ++i)
+                        held->bits[i] = kLevels[held->bits[i] % 3];
+                const Image src = pxtest::reshaped(held.get(), width, 3);
+                const Owned noise = pxtest::random_image(80, 9, 8, rng());
+                Image planes[3];
+                for (int i = 0; i < 3; ++i) {
+                    planes[i] = pxtest::reshaped(noise.get(), width, 3);
+                    planes[i].bits += size_t{noise->pitch} * 3 * i;
+                }
+                const auto runs = on_every_path([&] {
+                    std::vector<Owned> out;
+                    Image *p[4] = {};
+                    EXPECT_EQ(Split(&src, &p[0], &p[1], &p[2], &p[3], 1), 1);
+                    out.emplace_back(Combine(p[0], p[1], p[2], p[3], 1));
+                    out.emplace_back(Combine(p[0], p[1], p[2], nullptr, 1));
+                    out.emplace_back(Combine(&planes[0], &planes[1], &planes[2], &planes[0], 1));
+                    for (Image *plane : p)
+                        out.emplace_back(plane);
+                    Image *moved = nullptr;
+                    EXPECT_EQ(PX_IMG_Transform(&src, &moved, 40 + width, width % 3), 1);
+                    out.emplace_back(moved);
+                    return out;
+                });
+                for (size_t p = 1; p < runs.size(); ++p)
+                    for (size_t i = 0; i < runs[0].size(); ++i)
+                        EXPECT_EQ(pxtest::diff(runs[p][i].get(), runs[0][i].get()), "")
+                            << bits << " bits, width " << width << ", few " << few << ", " << i << ", path " << p;
+            }
+}
