@@ -8,6 +8,7 @@
 #include <pxfx/pxfx.h>
 
 #include <cstdio>
+#include <numeric>
 #include <random>
 #include <string>
 #include <utility>
@@ -169,21 +170,25 @@ TEST(Dispatch, MedianMatchesThePlainNetwork) {
 }
 
 // Split and Combine in HSL, and the HSL transform, at every width up to past
-// a 64-byte vector, on rows whose pitch is larger than they need: noise, and
-// pictures of three levels (grays, channels that tie, both lightness
-// halves); Combine also from noise planes.
+// a 64-byte vector and past the transform's 1024-pixel pieces, on rows whose
+// pitch is larger than they need: noise, and pictures of three levels
+// (grays, channels that tie, both lightness halves); Combine also from noise
+// planes.
 TEST(Dispatch, HslPlanesMatchThePlainCode) {
     constexpr uint8_t kLevels[] = {0, 128, 255};
+    std::vector<int32_t> widths(70);
+    std::iota(widths.begin(), widths.end(), 1);
+    widths.push_back(2100);
     std::mt19937 rng(17);
     for (int32_t bits : {24, 32})
-        for (int32_t width = 1; width <= 70; ++width)
+        for (int32_t width : widths)
             for (bool few : {false, true}) {
-                const Owned held = pxtest::random_image(80, 3, bits, rng());
+                const Owned held = pxtest::random_image(width + 9, 3, bits, rng());
                 if (few)
                     for (size_t i = 0; i < size_t{held->pitch} * 3; ++i)
                         held->bits[i] = kLevels[held->bits[i] % 3];
                 const Image src = pxtest::reshaped(held.get(), width, 3);
-                const Owned noise = pxtest::random_image(80, 9, 8, rng());
+                const Owned noise = pxtest::random_image(width + 9, 9, 8, rng());
                 Image planes[3];
                 for (int i = 0; i < 3; ++i) {
                     planes[i] = pxtest::reshaped(noise.get(), width, 3);
