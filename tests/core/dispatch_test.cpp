@@ -203,9 +203,11 @@ TEST(Dispatch, HslPlanesMatchThePlainCode) {
                     out.emplace_back(Combine(&planes[0], &planes[1], &planes[2], &planes[0], 1));
                     for (Image *plane : p)
                         out.emplace_back(plane);
-                    Image *moved = nullptr;
+                    Image *moved = nullptr, *self = pxtest::clone(&src).release();
                     EXPECT_EQ(PX_IMG_Transform(&src, &moved, 40 + width, width % 3), 1);
+                    EXPECT_EQ(PX_IMG_Transform(self, &self, 40 + width, width % 3), 1);
                     out.emplace_back(moved);
+                    out.emplace_back(self);
                     return out;
                 });
                 for (size_t p = 1; p < runs.size(); ++p)
