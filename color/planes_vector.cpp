@@ -2,8 +2,8 @@
 // of color/colorspace.hpp, byte for byte. The channels are split into byte
 // vectors; the arithmetic runs in 16-bit lanes, and the two divisions of
 // rgb_to_hsl, whose divisors change from pixel to pixel, in 32-bit lanes
-// through float. The hue weights of hsl_to_rgb are computed with compares
-// rather than read from tables.
+// through float division. The hue weights of hsl_to_rgb are computed with
+// compares rather than read from tables.
 #ifndef PXFX_PORTABLE_ONLY
 
 #undef HWY_TARGET_INCLUDE
@@ -52,18 +52,25 @@ HWY_INLINE V8 low_bytes(V16 lo, V16 hi) {
 HWY_INLINE VI16 as_signed(V16 v) { return hn::BitCast(DI16(), v); }
 HWY_INLINE V16 as_unsigned(VI16 v) { return hn::BitCast(D16(), v); }
 
-// floor(n / d) for 0 <= n < 2^16 and 1 <= d < 2^15. Float holds n and d
-// exactly and its division (correctly rounded, or within a few units of the
-// last place where the target refines a reciprocal) lands within one of n / d;
-// the remainder n - q d then moves q onto the quotient, so the result is
-// exact whatever the division's rounding.
+// floor(n / d) for 0 <= n < 2^16 and 1 <= d <= 510. Float holds n and d
+// exactly. With k = floor(n / d), a correctly rounded division gives k when d
+// divides n; otherwise k + 1 - n / d >= 1 / d, while rounding moves n / d by
+// at most 2^-24 (k + 1) < 1 / d (as d (k + 1) <= n + d < 2^24), so the
+// quotient stays in [k, k + 1) and truncates to k. 32-bit ARM has no division
+// instruction and divides through a refined reciprocal estimate, which lands
+// within one of n / d: there the remainder n - q d moves q onto k.
+constexpr bool kDivisionRounds = !HWY_ARCH_ARM_V7;
+
 HWY_INLINE V32 divide32(V32 n, V32 d) {
     const D32 di;
     const DF df;
     V32 q = hn::ConvertTo(di, hn::Div(hn::ConvertTo(df, n), hn::ConvertTo(df, d)));
-    const V32 r = hn::Sub(n, hn::Mul(q, d));
-    q = hn::Sub(q, hn::VecFromMask(di, hn::Lt(d, hn::Add(r, hn::Set(di, 1)))));
-    return hn::Add(q, hn::VecFromMask(di, hn::Lt(r, hn::Zero(di))));
+    if constexpr (!kDivisionRounds) {
+        const V32 r = hn::Sub(n, hn::Mul(q, d));
+        q = hn::Sub(q, hn::VecFromMask(di, hn::Lt(d, hn::Add(r, hn::Set(di, 1)))));
+        q = hn::Add(q, hn::VecFromMask(di, hn::Lt(r, hn::Zero(di))));
+    }
+    return q;
 }
 
 HWY_INLINE V16 divide(V16 n, V16 d) {
