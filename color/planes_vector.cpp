@@ -2,8 +2,8 @@
 // of color/colorspace.hpp, byte for byte. The channels are split into byte
 // vectors; the arithmetic runs in 16-bit lanes, and the two divisions of
 // rgb_to_hsl, whose divisors change from pixel to pixel, in 32-bit lanes
-// through float division. The hue weights of hsl_to_rgb are computed with
-// compares rather than read from tables.
+// through float division. hsl_to_rgb picks each channel by the hue's sixth
+// rather than reading weight tables.
 #ifndef PXFX_PORTABLE_ONLY
 
 #undef HWY_TARGET_INCLUDE
@@ -52,25 +52,29 @@ HWY_INLINE V8 low_bytes(V16 lo, V16 hi) {
 HWY_INLINE VI16 as_signed(V16 v) { return hn::BitCast(DI16(), v); }
 HWY_INLINE V16 as_unsigned(VI16 v) { return hn::BitCast(D16(), v); }
 
-// floor(n / d) for 0 <= n < 2^16 and 1 <= d <= 510. Float holds n and d
-// exactly. With k = floor(n / d), a correctly rounded division gives k when d
-// divides n; otherwise k + 1 - n / d >= 1 / d, while rounding moves n / d by
-// at most 2^-24 (k + 1) < 1 / d (as d (k + 1) <= n + d < 2^24), so the
-// quotient stays in [k, k + 1) and truncates to k. 32-bit ARM has no division
-// instruction and divides through a refined reciprocal estimate, which lands
-// within one of n / d: there the remainder n - q d moves q onto k.
+// floor(n / d) in the low 16 bits of each lane, for 0 <= n < 2^16 and
+// 1 <= d <= 510. Float holds n and d exactly. With k = floor(n / d), a
+// correctly rounded division gives k when d divides n; otherwise
+// k + 1 - n / d >= 1 / d, while rounding moves n / d by at most
+// 2^-24 (k + 1) < 1 / d (as d (k + 1) <= n + d < 2^24), so the quotient stays
+// in [k, k + 1) and truncates to k; adding 2^23 then puts k in the low bits
+// (cheaper than a conversion, which checks for overflow). 32-bit ARM has no
+// division instruction and divides through a refined reciprocal estimate,
+// which lands within one of n / d: there the remainder n - q d moves q onto k.
 constexpr bool kDivisionRounds = !HWY_ARCH_ARM_V7;
 
 HWY_INLINE V32 divide32(V32 n, V32 d) {
     const D32 di;
     const DF df;
-    V32 q = hn::ConvertTo(di, hn::Div(hn::ConvertTo(df, n), hn::ConvertTo(df, d)));
-    if constexpr (!kDivisionRounds) {
+    const auto quotient = hn::Div(hn::ConvertTo(df, n), hn::ConvertTo(df, d));
+    if constexpr (kDivisionRounds) {
+        return hn::BitCast(di, hn::Add(hn::Trunc(quotient), hn::Set(df, 8388608.0f)));
+    } else {
+        V32 q = hn::ConvertTo(di, quotient);
         const V32 r = hn::Sub(n, hn::Mul(q, d));
         q = hn::Sub(q, hn::VecFromMask(di, hn::Lt(d, hn::Add(r, hn::Set(di, 1)))));
-        q = hn::Add(q, hn::VecFromMask(di, hn::Lt(r, hn::Zero(di))));
+        return hn::Add(q, hn::VecFromMask(di, hn::Lt(r, hn::Zero(di))));
     }
-    return q;
 }
 
 HWY_INLINE V16 divide(V16 n, V16 d) {
@@ -125,20 +129,16 @@ HWY_INLINE void to_hsl(V8 r, V8 g, V8 b, V8 &h, V8 &s, V8 &l) {
 // v / 255 for any 16-bit v: (v * 32897) >> 23.
 HWY_INLINE V16 by255(V16 v) { return hn::ShiftRight<7>(hn::MulHigh(v, hn::Set(D16(), 32897))); }
 
-// hue_weight of a folded hue x <= 255 (negative x weighs 0).
-HWY_INLINE V16 weight(VI16 x) {
-    const DI16 di;
-    const VI16 six = hn::Mul(x, hn::Set(di, 6));
-    const VI16 w =
-        hn::IfThenElse(hn::Lt(x, hn::Set(di, 42)), six,
-                       hn::IfThenElse(hn::Lt(x, hn::Set(di, 127)), hn::Set(di, 255), hn::Sub(hn::Set(di, 1020), six)));
-    return as_unsigned(hn::Max(w, hn::Zero(di)));
-}
-
-// hsl_to_rgb in 16-bit lanes. The span m2 - m1 = 2 (m2 - l) is even, so
-// (span w + 126) / 255 = 2 (hs w + 63) / 255 with hs = m2 - l <= 127: the
-// product stays below 2^15 although w reaches 258, and (v * 32897) >> 22
-// gives 2 v / 255 exactly for v < 33026.
+// hsl_to_rgb in 16-bit lanes. A weight of 255 gives m2 and one of 0 gives m1,
+// and every hue leaves at most one channel on a slope of hue_weight: the
+// hue's sixth picks which channel takes m2, m1 or the sloped value. With
+// e = 6 hue - 510 p, p the hue's third (below 85, below 170, above), the
+// slope rises as e up to 246 and falls as 510 - e from 258.
+//
+// The span m2 - m1 = 2 (m2 - l) is even, so (span w + 126) / 255 =
+// 2 (hs w + 63) / 255 with hs = m2 - l <= 127: the product stays below 2^15
+// although w reaches 258, and (v * 32897) >> 22 gives 2 v / 255 exactly for
+// v < 33026.
 HWY_INLINE void from_hsl(V16 h, V16 s, V16 l, V16 &r, V16 &g, V16 &b) {
     const D16 dw;
     const DI16 di;
@@ -146,15 +146,20 @@ HWY_INLINE void from_hsl(V16 h, V16 s, V16 l, V16 &r, V16 &g, V16 &b) {
     const V16 high = hn::Sub(hn::Add(l, s), by255(hn::Add(hn::Mul(l, s), hn::Set(dw, 127))));
     const V16 m2 = hn::IfThenElse(hn::RebindMask(dw, hn::Lt(as_signed(l), hn::Set(di, 128))), low, high);
     const V16 hs = hn::Sub(m2, l), m1 = hn::Sub(l, hs);
-    const auto channel = [&](V16 w) {
-        const V16 v = hn::Add(hn::Mul(hs, w), hn::Set(dw, 63));
-        return hn::Add(m1, hn::ShiftRight<6>(hn::MulHigh(v, hn::Set(dw, 32897))));
-    };
     const VI16 hue = as_signed(h);
-    const VI16 red_hue = hn::Add(hue, hn::Set(di, 85));
-    r = channel(weight(hn::IfThenElse(hn::Gt(red_hue, hn::Set(di, 255)), hn::Sub(red_hue, hn::Set(di, 255)), red_hue)));
-    g = channel(weight(hue));
-    b = channel(weight(hn::Sub(hue, hn::Set(di, 85))));
+    const auto first = hn::RebindMask(dw, hn::Lt(hue, hn::Set(di, 85)));
+    const auto second = hn::RebindMask(dw, hn::Lt(hue, hn::Set(di, 170)));
+    const V16 third =
+        hn::Add(hn::IfThenElseZero(first, hn::Set(dw, 510)), hn::IfThenElseZero(second, hn::Set(dw, 510)));
+    const V16 e = hn::Sub(hn::Add(hn::Mul(h, hn::Set(dw, 6)), third), hn::Set(dw, 1020));
+    const auto rising = hn::RebindMask(dw, hn::Lt(as_signed(e), hn::Set(di, 252)));
+    const V16 w = hn::IfThenElse(rising, e, hn::Sub(hn::Set(dw, 510), e));
+    const V16 v = hn::Add(hn::Mul(hs, w), hn::Set(dw, 63));
+    const V16 slope = hn::Add(m1, hn::ShiftRight<6>(hn::MulHigh(v, hn::Set(dw, 32897))));
+    const V16 up = hn::IfThenElse(rising, slope, m2), down = hn::IfThenElse(rising, m2, slope);
+    g = hn::IfThenElse(first, up, hn::IfThenElse(second, down, m1));
+    r = hn::IfThenElse(first, down, hn::IfThenElse(second, m1, up));
+    b = hn::IfThenElse(first, m1, hn::IfThenElse(second, up, down));
 }
 
 HWY_INLINE void to_rgb(V8 h, V8 s, V8 l, V8 &r, V8 &g, V8 &b) {
