@@ -83,15 +83,15 @@ HWY_INLINE V16 divide(V16 n, V16 d) {
     return hn::ConcatEven(dw, hn::BitCast(dw, hi), hn::BitCast(dw, lo));
 }
 
-// Saturation and hue of rgb_to_hsl in 16-bit lanes for pixels that are not
-// gray: mx + mn and d = mx - mn, num = x - y and turn as picked by the
-// largest channel, l the lightness.
-HWY_INLINE void sat_hue(V16 sum, V16 d, V16 x, V16 y, V16 turn, V16 l, V16 &s, V16 &h) {
+// Saturation and the hue's quotient of rgb_to_hsl in 16-bit lanes for
+// pixels that are not gray: sum = mx + mn and d = mx - mn, num = x - y as
+// picked by the largest channel. The lightness is at most 127 when
+// sum <= 254.
+HWY_INLINE void sat_hue(V16 sum, V16 d, V16 x, V16 y, V16 &s, V16 &q) {
     const D16 dw;
     const DI16 di;
-    const V16 den = hn::Max(
-        hn::IfThenElse(hn::RebindMask(dw, hn::Lt(as_signed(l), hn::Set(di, 128))), sum, hn::Sub(hn::Set(dw, 510), sum)),
-        hn::Set(dw, 1));
+    const auto dark = hn::RebindMask(dw, hn::Lt(as_signed(sum), hn::Set(di, 255)));
+    const V16 den = hn::Max(hn::IfThenElse(dark, sum, hn::Sub(hn::Set(dw, 510), sum)), hn::Set(dw, 1));
     s = divide(hn::Add(hn::Mul(d, hn::Set(dw, 255)), hn::ShiftRight<1>(den)), den);
     // num * 255 / 6 truncated = sign(num) (42 |num| + |num| / 2), as 255 = 6 * 42 + 3.
     const VI16 num = hn::Sub(as_signed(x), as_signed(y));
@@ -101,11 +101,14 @@ HWY_INLINE void sat_hue(V16 sum, V16 d, V16 x, V16 y, V16 turn, V16 l, V16 &s, V
     const VI16 half = as_signed(hn::ShiftRight<1>(dd));
     const VI16 t = hn::IfThenElse(hn::Lt(num, hn::Zero(di)), hn::Sub(half, part), hn::Add(half, part));
     // The quotient truncates toward zero, as div_small does.
-    const VI16 q = as_signed(divide(as_unsigned(hn::Abs(t)), dd));
-    const VI16 signed_q = hn::IfThenElse(hn::Lt(t, hn::Zero(di)), hn::Neg(q), q);
-    h = hn::Min(as_unsigned(hn::Add(signed_q, as_signed(turn))), hn::Set(dw, 255));
+    const VI16 quotient = as_signed(divide(as_unsigned(hn::Abs(t)), dd));
+    q = as_unsigned(hn::IfThenElse(hn::Lt(t, hn::Zero(di)), hn::Neg(quotient), quotient));
 }
 
+// The hue is quotient + turn, whose clamp to 0..255 never acts: |t| <= 43 d
+// keeps |quotient| <= 43; turn 0 comes with num >= 0 and turn 255 with
+// num < 0, where t < d / 2 - 42 leaves quotient <= 0. So the byte sum of the
+// quotient's low byte and turn is the hue.
 HWY_INLINE void to_hsl(V8 r, V8 g, V8 b, V8 &h, V8 &s, V8 &l) {
     const D8 d;
     const V8 mx = hn::Max(hn::Max(r, g), b), mn = hn::Min(hn::Min(r, g), b);
@@ -116,14 +119,12 @@ HWY_INLINE void to_hsl(V8 r, V8 g, V8 b, V8 &h, V8 &s, V8 &l) {
     const V8 y = hn::IfThenElse(red_max, b, hn::IfThenElse(green_max, r, g));
     const V8 turn = hn::IfThenElse(red_max, hn::IfThenElseZero(hn::Lt(x, y), hn::Set(d, 255)),
                                    hn::IfThenElse(green_max, hn::Set(d, 85), hn::Set(d, 170)));
-    V16 s_lo, s_hi, h_lo, h_hi;
-    sat_hue(hn::Add(lower16(mx), lower16(mn)), lower16(dist), lower16(x), lower16(y), lower16(turn), lower16(l), s_lo,
-            h_lo);
-    sat_hue(hn::Add(upper16(mx), upper16(mn)), upper16(dist), upper16(x), upper16(y), upper16(turn), upper16(l), s_hi,
-            h_hi);
+    V16 s_lo, s_hi, q_lo, q_hi;
+    sat_hue(hn::Add(lower16(mx), lower16(mn)), lower16(dist), lower16(x), lower16(y), s_lo, q_lo);
+    sat_hue(hn::Add(upper16(mx), upper16(mn)), upper16(dist), upper16(x), upper16(y), s_hi, q_hi);
     const auto gray = hn::Eq(dist, hn::Zero(d));
     s = hn::IfThenZeroElse(gray, low_bytes(s_lo, s_hi));
-    h = hn::IfThenElse(gray, hn::Set(d, 170), low_bytes(h_lo, h_hi));
+    h = hn::IfThenElse(gray, hn::Set(d, 170), hn::Add(low_bytes(q_lo, q_hi), turn));
 }
 
 // v / 255 for any 16-bit v: (v * 32897) >> 23.
