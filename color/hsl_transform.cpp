@@ -65,11 +65,11 @@ constexpr size_t kPiece = 1024;
 // result O is Bgr24 or Bgra32, the source's alpha kept in the latter.
 template <class F, class O> void transform_rows(const View &src, const View &dst, const Map *maps, int moved) {
     constexpr size_t kBytes = F::kBitCount == 24 || F::kBitCount == 32 ? F::kBitCount / 8 : 0;
-    vec::SplitHsl split = nullptr;
-    vec::CombineHsl combine = nullptr;
+    vec::SplitPlanes split = nullptr;
+    vec::CombinePlanes combine = nullptr;
     if constexpr (kBytes != 0) {
-        split = vec::split_hsl(kBytes);
-        combine = vec::combine_hsl(O::kBitCount / 8);
+        split = vec::split_planes(kHsl, kBytes);
+        combine = vec::combine_planes(kHsl, O::kBitCount / 8);
     }
     uint8_t planes[4][kPiece];
     const uint8_t *map = moved >= 0 ? maps[moved] : nullptr;

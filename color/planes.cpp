@@ -24,7 +24,7 @@ struct PlaneViews {
     View p1, p2, p3, pa;
 };
 
-// Bytes per pixel of the formats whose HSL rows have vector code; 0 for the
+// Bytes per pixel of the formats whose rows have vector code; 0 for the
 // others.
 template <class F> constexpr int kVectorBytes = F::kBitCount == 24 || F::kBitCount == 32 ? F::kBitCount / 8 : 0;
 
@@ -32,14 +32,14 @@ template <class F, Mode M, bool Alpha> void split_rows(const View &src, const Pl
     const int32_t w = src.width;
     // The vector copy converts each row but its last pixels (fewer than a
     // vector), which the plain loop finishes.
-    vec::SplitHsl vector = nullptr;
-    if constexpr (M == kHsl && kVectorBytes<F> != 0) vector = vec::split_hsl(kVectorBytes<F>);
+    vec::SplitPlanes vector = nullptr;
+    if constexpr (kVectorBytes<F> != 0) vector = vec::split_planes(M, kVectorBytes<F>);
     for (int32_t y = 0; y < src.height; ++y) {
         const typename F::CRow in = F::crow(src, y);
         uint8_t *o1 = p.p1.row(y), *o2 = p.p2.row(y), *o3 = p.p3.row(y);
         uint8_t *oa = Alpha ? p.pa.row(y) : nullptr;
         int32_t x = 0;
-        if constexpr (M == kHsl && kVectorBytes<F> != 0)
+        if constexpr (kVectorBytes<F> != 0)
             if (vector != nullptr) x = static_cast<int32_t>(vector(in, static_cast<size_t>(w), o1, o2, o3, oa));
         for (; x < w; ++x) {
             const uint32_t c = from_rgb<M>(F::load(in, x));
@@ -87,7 +87,7 @@ struct PlaneRows {
 template <Mode M, int Bpp>
 void combine_rows(const View &out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3, const PlaneRows *ra) {
     const int32_t w = out.width;
-    const vec::CombineHsl vector = M == kHsl ? vec::combine_hsl(Bpp) : nullptr;
+    const vec::CombinePlanes vector = vec::combine_planes(M, Bpp);
     for (int32_t y = 0; y < out.height; ++y) {
         const uint8_t *c1 = r1.row(y, w), *c2 = r2.row(y, w), *c3 = r3.row(y, w);
         const uint8_t *ca = Bpp == 4 ? ra->row(y, w) : nullptr;

@@ -1,9 +1,10 @@
-// RGB to HSL and back over vectors of byte pixels: rgb_to_hsl and hsl_to_rgb
-// of color/colorspace.hpp, byte for byte. The channels are split into byte
-// vectors; the arithmetic runs in 16-bit lanes, and the two divisions of
-// rgb_to_hsl, whose divisors change from pixel to pixel, in 32-bit lanes
-// through float division. hsl_to_rgb picks each channel by the hue's sixth
-// rather than reading weight tables.
+// Colour modes over vectors of byte pixels: rgb_to_hsl, rgb_to_yuv,
+// rgb_to_yiq and their inverses of color/colorspace.hpp, byte for byte. The
+// channels are split into byte vectors. HSL runs in 16-bit lanes, and the two
+// divisions of rgb_to_hsl, whose divisors change from pixel to pixel, in
+// 32-bit lanes through float division; hsl_to_rgb picks each channel by the
+// hue's sixth rather than reading weight tables. YUV and YIQ run in float
+// lanes with the plain code's products and sums, in its order.
 #ifndef PXFX_PORTABLE_ONLY
 
 #undef HWY_TARGET_INCLUDE
@@ -21,11 +22,16 @@ namespace hn = hwy::HWY_NAMESPACE;
 
 #if HWY_TARGET == HWY_SCALAR
 // Single lanes never run (core/cpu.cpp leaves them out): the plain loops do.
-template <int C> size_t split_hsl(const uint8_t *, size_t, uint8_t *, uint8_t *, uint8_t *, uint8_t *) { return 0; }
-template <int C>
-size_t combine_hsl(const uint8_t *, const uint8_t *, const uint8_t *, const uint8_t *, size_t, uint8_t *) {
+template <class M, int C> size_t split_row(const uint8_t *, size_t, uint8_t *, uint8_t *, uint8_t *, uint8_t *) {
     return 0;
 }
+template <class M, int C>
+size_t combine_row(const uint8_t *, const uint8_t *, const uint8_t *, const uint8_t *, size_t, uint8_t *) {
+    return 0;
+}
+struct Hsl {};
+struct Yuv {};
+struct Yiq {};
 #else
 using D8 = hn::ScalableTag<uint8_t>;
 using V8 = hn::Vec<D8>;
@@ -172,8 +178,86 @@ HWY_INLINE void to_rgb(V8 h, V8 s, V8 l, V8 &r, V8 &g, V8 &b) {
     b = low_bytes(b_lo, b_hi);
 }
 
-template <int C>
-size_t split_hsl(const uint8_t *in, size_t pixels, uint8_t *hue, uint8_t *sat, uint8_t *light, uint8_t *alpha) {
+struct Hsl {
+    static void forward(V8 r, V8 g, V8 b, V8 &h, V8 &s, V8 &l) { to_hsl(r, g, b, h, s, l); }
+    static void back(V8 h, V8 s, V8 l, V8 &r, V8 &g, V8 &b) { to_rgb(h, s, l, r, g, b); }
+};
+
+// The float modes work on 32-bit lanes, a quarter of the byte vectors at a
+// time: f(a, b, c, x, y, z) takes the three components as integers and gives
+// three integers, which are clamped to bytes as clamp_u8 does.
+template <class Fn> HWY_INLINE void by_quarters(V8 a, V8 b, V8 c, V8 &x, V8 &y, V8 &z, Fn f) {
+    const D32 di;
+    const V16 a16[2] = {lower16(a), upper16(a)}, b16[2] = {lower16(b), upper16(b)}, c16[2] = {lower16(c), upper16(c)};
+    V32 out[3][4];
+    for (int i = 0; i < 4; ++i) {
+        const auto quarter = [&](V16 v) { return i % 2 == 0 ? lower32(v) : upper32(v); };
+        f(quarter(a16[i / 2]), quarter(b16[i / 2]), quarter(c16[i / 2]), out[0][i], out[1][i], out[2][i]);
+    }
+    V8 *const to[3] = {&x, &y, &z};
+    const D16 dw;
+    for (int k = 0; k < 3; ++k) {
+        V16 half[2];
+        for (int j = 0; j < 2; ++j) {
+            const auto clamp = [&](V32 v) {
+                return hn::BitCast(dw, hn::Min(hn::Max(v, hn::Zero(di)), hn::Set(di, 255)));
+            };
+            half[j] = hn::ConcatEven(dw, clamp(out[k][2 * j + 1]), clamp(out[k][2 * j]));
+        }
+        *to[k] = low_bytes(half[0], half[1]);
+    }
+}
+
+HWY_INLINE hn::Vec<DF> fl(V32 v) { return hn::ConvertTo(DF(), v); }
+HWY_INLINE V32 trunc_i(hn::Vec<DF> v) { return hn::ConvertTo(D32(), v); }
+HWY_INLINE hn::Vec<DF> k(float c) { return hn::Set(DF(), c); }
+
+// rgb_to_yuv and yuv_to_rgb: products first, then the sums in their order.
+struct Yuv {
+    static void forward(V8 r, V8 g, V8 b, V8 &y, V8 &u, V8 &v) {
+        by_quarters(r, g, b, y, u, v, [](V32 ri, V32 gi, V32 bi, V32 &yo, V32 &uo, V32 &vo) {
+            yo = trunc_i(
+                hn::Add(hn::Add(hn::Mul(k(0.299f), fl(ri)), hn::Mul(k(0.587f), fl(gi))), hn::Mul(k(0.114f), fl(bi))));
+            uo = trunc_i(hn::Add(hn::Mul(fl(hn::Sub(bi, yo)), k(0.565f)), k(128.0f)));
+            vo = trunc_i(hn::Add(hn::Mul(fl(hn::Sub(ri, yo)), k(0.713f)), k(128.0f)));
+        });
+    }
+    static void back(V8 y, V8 u, V8 v, V8 &r, V8 &g, V8 &b) {
+        by_quarters(y, u, v, r, g, b, [](V32 yi, V32 ui, V32 vi, V32 &ro, V32 &go, V32 &bo) {
+            const D32 di;
+            const auto yf = fl(yi), uf = fl(hn::Sub(ui, hn::Set(di, 128))), vf = fl(hn::Sub(vi, hn::Set(di, 128)));
+            ro = trunc_i(hn::Add(yf, hn::Mul(k(1.403f), vf)));
+            go = trunc_i(hn::Sub(hn::Sub(yf, hn::Mul(k(0.344f), uf)), hn::Mul(k(0.714f), vf)));
+            bo = trunc_i(hn::Add(yf, hn::Mul(k(1.77f), uf)));
+        });
+    }
+};
+
+// rgb_to_yiq and yiq_to_rgb, in the same way.
+struct Yiq {
+    static void forward(V8 r, V8 g, V8 b, V8 &y, V8 &i, V8 &q) {
+        by_quarters(r, g, b, y, i, q, [](V32 ri, V32 gi, V32 bi, V32 &yo, V32 &io, V32 &qo) {
+            const auto rf = fl(ri), gf = fl(gi), bf = fl(bi);
+            yo = trunc_i(hn::Add(hn::Add(hn::Mul(k(0.2992f), rf), hn::Mul(k(0.5868f), gf)), hn::Mul(k(0.114f), bf)));
+            io = trunc_i(hn::Add(
+                hn::Sub(hn::Sub(hn::Mul(k(0.596f), rf), hn::Mul(k(0.2742f), gf)), hn::Mul(k(0.3219f), bf)), k(128.0f)));
+            qo = trunc_i(hn::Add(
+                hn::Add(hn::Sub(hn::Mul(k(0.2109f), rf), hn::Mul(k(0.5229f), gf)), hn::Mul(k(0.312f), bf)), k(128.0f)));
+        });
+    }
+    static void back(V8 y, V8 i, V8 q, V8 &r, V8 &g, V8 &b) {
+        by_quarters(y, i, q, r, g, b, [](V32 yi, V32 ii, V32 qi, V32 &ro, V32 &go, V32 &bo) {
+            const D32 di;
+            const auto yf = fl(yi), if_ = fl(hn::Sub(ii, hn::Set(di, 128))), qf = fl(hn::Sub(qi, hn::Set(di, 128)));
+            ro = trunc_i(hn::Add(hn::Add(yf, hn::Mul(k(0.956f), if_)), hn::Mul(k(0.621f), qf)));
+            go = trunc_i(hn::Sub(hn::Sub(yf, hn::Mul(k(0.273f), if_)), hn::Mul(k(0.647f), qf)));
+            bo = trunc_i(hn::Add(hn::Sub(yf, hn::Mul(k(1.104f), if_)), hn::Mul(k(1.701f), qf)));
+        });
+    }
+};
+
+template <class M, int C>
+size_t split_row(const uint8_t *in, size_t pixels, uint8_t *p1, uint8_t *p2, uint8_t *p3, uint8_t *alpha) {
     const D8 d;
     const size_t lanes = hn::Lanes(d), whole = pixels / lanes * lanes;
     for (size_t i = 0; i < whole; i += lanes) {
@@ -182,24 +266,24 @@ size_t split_hsl(const uint8_t *in, size_t pixels, uint8_t *hue, uint8_t *sat, u
             hn::LoadInterleaved3(d, in + 3 * i, b, g, r);
         else
             hn::LoadInterleaved4(d, in + 4 * i, b, g, r, a);
-        V8 h, s, l;
-        to_hsl(r, g, b, h, s, l);
-        hn::StoreU(h, d, hue + i);
-        hn::StoreU(s, d, sat + i);
-        hn::StoreU(l, d, light + i);
+        V8 c1, c2, c3;
+        M::forward(r, g, b, c1, c2, c3);
+        hn::StoreU(c1, d, p1 + i);
+        hn::StoreU(c2, d, p2 + i);
+        hn::StoreU(c3, d, p3 + i);
         if (alpha != nullptr) hn::StoreU(a, d, alpha + i);
     }
     return whole;
 }
 
-template <int C>
-size_t combine_hsl(const uint8_t *hue, const uint8_t *sat, const uint8_t *light, const uint8_t *alpha, size_t pixels,
+template <class M, int C>
+size_t combine_row(const uint8_t *p1, const uint8_t *p2, const uint8_t *p3, const uint8_t *alpha, size_t pixels,
                    uint8_t *out) {
     const D8 d;
     const size_t lanes = hn::Lanes(d), whole = pixels / lanes * lanes;
     for (size_t i = 0; i < whole; i += lanes) {
         V8 r, g, b;
-        to_rgb(hn::LoadU(d, hue + i), hn::LoadU(d, sat + i), hn::LoadU(d, light + i), r, g, b);
+        M::back(hn::LoadU(d, p1 + i), hn::LoadU(d, p2 + i), hn::LoadU(d, p3 + i), r, g, b);
         if constexpr (C == 3)
             hn::StoreInterleaved3(b, g, r, d, out + 3 * i);
         else
@@ -209,20 +293,21 @@ size_t combine_hsl(const uint8_t *hue, const uint8_t *sat, const uint8_t *light,
 }
 #endif
 
-size_t split_hsl3(const uint8_t *in, size_t pixels, uint8_t *h, uint8_t *s, uint8_t *l, uint8_t *a) {
-    return split_hsl<3>(in, pixels, h, s, l, a);
-}
-size_t split_hsl4(const uint8_t *in, size_t pixels, uint8_t *h, uint8_t *s, uint8_t *l, uint8_t *a) {
-    return split_hsl<4>(in, pixels, h, s, l, a);
-}
-size_t combine_hsl3(const uint8_t *h, const uint8_t *s, const uint8_t *l, const uint8_t *a, size_t pixels,
-                    uint8_t *out) {
-    return combine_hsl<3>(h, s, l, a, pixels, out);
-}
-size_t combine_hsl4(const uint8_t *h, const uint8_t *s, const uint8_t *l, const uint8_t *a, size_t pixels,
-                    uint8_t *out) {
-    return combine_hsl<4>(h, s, l, a, pixels, out);
-}
+#define PXFX_PLANE_ROWS(NAME, MODE, C)                                                                                 \
+    size_t split_##NAME##C(const uint8_t *in, size_t n, uint8_t *p1, uint8_t *p2, uint8_t *p3, uint8_t *a) {           \
+        return split_row<MODE, C>(in, n, p1, p2, p3, a);                                                               \
+    }                                                                                                                  \
+    size_t combine_##NAME##C(const uint8_t *p1, const uint8_t *p2, const uint8_t *p3, const uint8_t *a, size_t n,      \
+                             uint8_t *out) {                                                                           \
+        return combine_row<MODE, C>(p1, p2, p3, a, n, out);                                                            \
+    }
+PXFX_PLANE_ROWS(hsl, Hsl, 3)
+PXFX_PLANE_ROWS(hsl, Hsl, 4)
+PXFX_PLANE_ROWS(yuv, Yuv, 3)
+PXFX_PLANE_ROWS(yuv, Yuv, 4)
+PXFX_PLANE_ROWS(yiq, Yiq, 3)
+PXFX_PLANE_ROWS(yiq, Yiq, 4)
+#undef PXFX_PLANE_ROWS
 
 } // namespace
 } // namespace pxfx::HWY_NAMESPACE
@@ -237,14 +322,35 @@ HWY_EXPORT(split_hsl3);
 HWY_EXPORT(split_hsl4);
 HWY_EXPORT(combine_hsl3);
 HWY_EXPORT(combine_hsl4);
+HWY_EXPORT(split_yuv3);
+HWY_EXPORT(split_yuv4);
+HWY_EXPORT(combine_yuv3);
+HWY_EXPORT(combine_yuv4);
+HWY_EXPORT(split_yiq3);
+HWY_EXPORT(split_yiq4);
+HWY_EXPORT(combine_yiq3);
+HWY_EXPORT(combine_yiq4);
 } // namespace
 
-vec::SplitHsl vec::split_hsl(int channels) {
-    return channels == 3 ? PXFX_VECTOR_COPY(split_hsl3) : PXFX_VECTOR_COPY(split_hsl4);
+// Modes 1 (HSL), 2 (YUV) and 3 (YIQ) of color/colorspace.hpp.
+vec::SplitPlanes vec::split_planes(int mode, int channels) {
+    const bool three = channels == 3;
+    switch (mode) {
+    case 1: return three ? PXFX_VECTOR_COPY(split_hsl3) : PXFX_VECTOR_COPY(split_hsl4);
+    case 2: return three ? PXFX_VECTOR_COPY(split_yuv3) : PXFX_VECTOR_COPY(split_yuv4);
+    case 3: return three ? PXFX_VECTOR_COPY(split_yiq3) : PXFX_VECTOR_COPY(split_yiq4);
+    default: return nullptr;
+    }
 }
 
-vec::CombineHsl vec::combine_hsl(int channels) {
-    return channels == 3 ? PXFX_VECTOR_COPY(combine_hsl3) : PXFX_VECTOR_COPY(combine_hsl4);
+vec::CombinePlanes vec::combine_planes(int mode, int channels) {
+    const bool three = channels == 3;
+    switch (mode) {
+    case 1: return three ? PXFX_VECTOR_COPY(combine_hsl3) : PXFX_VECTOR_COPY(combine_hsl4);
+    case 2: return three ? PXFX_VECTOR_COPY(combine_yuv3) : PXFX_VECTOR_COPY(combine_yuv4);
+    case 3: return three ? PXFX_VECTOR_COPY(combine_yiq3) : PXFX_VECTOR_COPY(combine_yiq4);
+    default: return nullptr;
+    }
 }
 
 } // namespace pxfx

@@ -169,12 +169,12 @@ TEST(Dispatch, MedianMatchesThePlainNetwork) {
             }
 }
 
-// Split and Combine in HSL, and the HSL transform, at every width up to past
-// a 64-byte vector and past the transform's 1024-pixel pieces, on rows whose
-// pitch is larger than they need: noise, and pictures of three levels
-// (grays, channels that tie, both lightness halves); Combine also from noise
-// planes.
-TEST(Dispatch, HslPlanesMatchThePlainCode) {
+// Split and Combine in the modes with vector rows (HSL, YUV, YIQ), and the
+// HSL transform, at every width up to past a 64-byte vector and past the
+// transform's 1024-pixel pieces, on rows whose pitch is larger than they
+// need: noise, and pictures of three levels (grays, channels that tie, both
+// lightness halves); Combine also from noise planes.
+TEST(Dispatch, PlaneRowsMatchThePlainCode) {
     constexpr uint8_t kLevels[] = {0, 128, 255};
     std::vector<int32_t> widths(70);
     std::iota(widths.begin(), widths.end(), 1);
@@ -196,13 +196,15 @@ TEST(Dispatch, HslPlanesMatchThePlainCode) {
                 }
                 const auto runs = on_every_path([&] {
                     std::vector<Owned> out;
-                    Image *p[4] = {};
-                    EXPECT_EQ(Split(&src, &p[0], &p[1], &p[2], &p[3], 1), 1);
-                    out.emplace_back(Combine(p[0], p[1], p[2], p[3], 1));
-                    out.emplace_back(Combine(p[0], p[1], p[2], nullptr, 1));
-                    out.emplace_back(Combine(&planes[0], &planes[1], &planes[2], &planes[0], 1));
-                    for (Image *plane : p)
-                        out.emplace_back(plane);
+                    for (int32_t mode : {1, 2, 3}) {
+                        Image *p[4] = {};
+                        EXPECT_EQ(Split(&src, &p[0], &p[1], &p[2], &p[3], mode), 1);
+                        out.emplace_back(Combine(p[0], p[1], p[2], p[3], mode));
+                        out.emplace_back(Combine(p[0], p[1], p[2], nullptr, mode));
+                        out.emplace_back(Combine(&planes[0], &planes[1], &planes[2], &planes[0], mode));
+                        for (Image *plane : p)
+                            out.emplace_back(plane);
+                    }
                     Image *moved = nullptr, *self = pxtest::clone(&src).release();
                     EXPECT_EQ(PX_IMG_Transform(&src, &moved, 40 + width, width % 3), 1);
                     EXPECT_EQ(PX_IMG_Transform(self, &self, 40 + width, width % 3), 1);
