@@ -1,16 +1,22 @@
 // Hue, saturation and lightness shifts: the plane operations BaseTran_Hue and
 // BaseTran_LS, and PX_IMG_Transform, which applies one of them to a picture
-// through HSL. The picture pass converts, shifts and converts back pixel by
-// pixel into one 32-bit image, which equals splitting into planes, shifting
-// a plane and combining them, without the four planes.
+// through HSL. The picture pass converts, shifts and converts back, which
+// equals splitting into planes, shifting a plane, combining them (32 bits)
+// and copying that into the result, without the planes and, for results of
+// 24 or 32 bits, without the 32-bit image: byte pixels a piece of a row at a
+// time in vectors, the rest pixel by pixel.
 #include <pxfx/color.h>
 
+#include <algorithm>
+#include <cstdint>
 #include <optional>
 
 #include "color/colorspace.hpp"
+#include "core/internal/byte_map.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "core/internal/view.hpp"
 
 using namespace pxfx;
@@ -50,18 +56,62 @@ int32_t map_plane(const View &plane, const Map &m) {
     return 1;
 }
 
-// maps[0] is applied to hue, maps[1] to saturation, maps[2] to lightness.
-template <class F> void transform_rows(const View &src, const View &dst, const Map *maps) {
+// Pixels per piece of a row that the vector copies convert through
+// hue, saturation, lightness and alpha rows on the stack.
+constexpr size_t kPiece = 1024;
+
+// maps[0] is applied to hue, maps[1] to saturation, maps[2] to lightness;
+// only maps[moved] differs from the identity (none when moved is -1). The
+// result O is Bgr24 or Bgra32, the source's alpha kept in the latter.
+template <class F, class O> void transform_rows(const View &src, const View &dst, const Map *maps, int moved) {
+    constexpr size_t kBytes = F::kBitCount == 24 || F::kBitCount == 32 ? F::kBitCount / 8 : 0;
+    vec::SplitPlanes split = nullptr;
+    vec::CombinePlanes combine = nullptr;
+    if constexpr (kBytes != 0) {
+        split = vec::split_planes(kHsl, kBytes);
+        combine = vec::combine_planes(kHsl, O::kBitCount / 8);
+    }
+    uint8_t planes[4][kPiece];
+    const uint8_t *map = moved >= 0 ? maps[moved] : nullptr;
+    const auto w = static_cast<size_t>(src.width);
     for (int32_t y = 0; y < src.height; ++y) {
         const typename F::CRow in = F::crow(src, y);
         uint8_t *out = dst.row(y);
-        for (int32_t x = 0; x < src.width; ++x) {
-            const uint32_t hsl = rgb_to_hsl(F::load(in, x));
-            const uint32_t moved =
+        // The vector copies take whole vectors of each piece, which they read
+        // before writing it (the result may be the source); the plain loop
+        // finishes the row.
+        size_t x = 0;
+        if constexpr (kBytes != 0)
+            while (split != nullptr && x < w) {
+                const size_t n =
+                    split(in + kBytes * x, std::min(kPiece, w - x), planes[0], planes[1], planes[2], planes[3]);
+                if (n == 0) break;
+                if (map != nullptr) map_bytes(planes[moved], planes[moved], n, 1, &map);
+                combine(planes[0], planes[1], planes[2], planes[3], n, out + O::kBitCount / 8 * x);
+                x += n;
+            }
+        for (; x < w; ++x) {
+            const auto i = static_cast<int32_t>(x);
+            const uint32_t hsl = rgb_to_hsl(F::load(in, i));
+            const uint32_t moved_hsl =
                 pack(maps[2][blue_of(hsl)], maps[1][green_of(hsl)], maps[0][red_of(hsl)], 0) | keep_alpha(hsl);
-            Bgra32::store(out, x, hsl_to_rgb(moved));
+            O::store(out, i, hsl_to_rgb(moved_hsl));
         }
     }
+}
+
+// Whether the result image takes the rows directly, with the bytes the copy
+// from a 32-bit image would give it: the source's size, 24 bits, or 32 bits
+// with rows as a new image has them (the copy then moves the whole block,
+// alpha included; into other rows it keeps their alpha). It is the source
+// itself or shares no memory with it.
+bool takes_rows(const Image *dst, const View &src) {
+    const std::optional<View> to = view_of(dst);
+    if (!to || to->width != src.width || to->height != src.height || !block_claim_ok(dst)) return false;
+    if (to->bitCount != 24 && !(to->bitCount == 32 && to->pitch == fresh_pitch(src.width, 32))) return false;
+    if (dst == src.record) return true;
+    const auto d = reinterpret_cast<uintptr_t>(to->bits), s = reinterpret_cast<uintptr_t>(src.bits);
+    return d + block_bytes(dst) <= s || s + block_bytes(src.record) <= d;
 }
 
 // An 8-bit plane with a pixel block whose rows it holds; its size may be empty.
@@ -100,16 +150,33 @@ int32_t PX_IMG_Transform(const Image *src, Image **out, int32_t amount, int32_t 
     for (int i = 0; i < 3; ++i)
         for (int v = 0; v < 256; ++v)
             maps[i][v] = static_cast<uint8_t>(v);
+    int moved = -1;
     if (component == 0) hue_map(amount, maps[0]);
     if (component == 1 || component == 2) linear_map(amount, maps[component]);
+    if (component >= 0 && component <= 2) moved = component;
+    // A new result of 24 or 32 bits, and a slot image that takes them, get
+    // the rows directly; any other goes through a 32-bit image and a copy.
+    ImagePtr made;
+    if (*out == nullptr && (from->bitCount == 24 || from->bitCount == 32)) {
+        made = make_image(from->width, from->height, static_cast<int32_t>(from->bitCount));
+        if (!made) return 0;
+    }
+    Image *direct = made ? made.get() : *out;
+    if (direct != nullptr && takes_rows(direct, *from)) {
+        const View to = *view_of(direct);
+        with_format(from->bitCount, [&](auto f) {
+            if (to.bitCount == 24)
+                transform_rows<decltype(f), Bgr24>(*from, to, maps, moved);
+            else
+                transform_rows<decltype(f), Bgra32>(*from, to, maps, moved);
+        });
+        if (made) *out = made.release();
+        return 1;
+    }
     ImagePtr combined = make_image(from->width, from->height, 32);
     if (!combined) return 0;
     const View to = *view_of(combined.get());
-    with_format(from->bitCount, [&](auto f) { transform_rows<decltype(f)>(*from, to, maps); });
-    if (*out == nullptr && from->bitCount == 32) {
-        *out = combined.release();
-        return 1;
-    }
+    with_format(from->bitCount, [&](auto f) { transform_rows<decltype(f), Bgra32>(*from, to, maps, moved); });
     if (*out == nullptr) {
         *out = malloc_Image(from->width, from->height, static_cast<int32_t>(from->bitCount));
         if (*out == nullptr) return 0;

@@ -11,6 +11,7 @@
 #include "core/internal/image_check.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "core/internal/view.hpp"
 
 using namespace pxfx;
@@ -23,13 +24,24 @@ struct PlaneViews {
     View p1, p2, p3, pa;
 };
 
+// Bytes per pixel of the formats whose rows have vector code; 0 for the
+// others.
+template <class F> constexpr int kVectorBytes = F::kBitCount == 24 || F::kBitCount == 32 ? F::kBitCount / 8 : 0;
+
 template <class F, Mode M, bool Alpha> void split_rows(const View &src, const PlaneViews &p) {
     const int32_t w = src.width;
+    // The vector copy converts each row but its last pixels (fewer than a
+    // vector), which the plain loop finishes.
+    vec::SplitPlanes vector = nullptr;
+    if constexpr (kVectorBytes<F> != 0) vector = vec::split_planes(M, kVectorBytes<F>);
     for (int32_t y = 0; y < src.height; ++y) {
         const typename F::CRow in = F::crow(src, y);
         uint8_t *o1 = p.p1.row(y), *o2 = p.p2.row(y), *o3 = p.p3.row(y);
         uint8_t *oa = Alpha ? p.pa.row(y) : nullptr;
-        for (int32_t x = 0; x < w; ++x) {
+        int32_t x = 0;
+        if constexpr (kVectorBytes<F> != 0)
+            if (vector != nullptr) x = static_cast<int32_t>(vector(in, static_cast<size_t>(w), o1, o2, o3, oa));
+        for (; x < w; ++x) {
             const uint32_t c = from_rgb<M>(F::load(in, x));
             o1[x] = static_cast<uint8_t>(c >> 16);
             o2[x] = static_cast<uint8_t>(c >> 8);
@@ -75,11 +87,13 @@ struct PlaneRows {
 template <Mode M, int Bpp>
 void combine_rows(const View &out, const PlaneRows &r1, const PlaneRows &r2, const PlaneRows &r3, const PlaneRows *ra) {
     const int32_t w = out.width;
+    const vec::CombinePlanes vector = vec::combine_planes(M, Bpp);
     for (int32_t y = 0; y < out.height; ++y) {
         const uint8_t *c1 = r1.row(y, w), *c2 = r2.row(y, w), *c3 = r3.row(y, w);
         const uint8_t *ca = Bpp == 4 ? ra->row(y, w) : nullptr;
         uint8_t *o = out.row(y);
-        for (int32_t x = 0; x < w; ++x) {
+        int32_t x = vector != nullptr ? static_cast<int32_t>(vector(c1, c2, c3, ca, static_cast<size_t>(w), o)) : 0;
+        for (; x < w; ++x) {
             const uint32_t a = Bpp == 4 ? ca[x] : 0;
             const uint32_t c = to_rgb<M>(pack(c3[x], c2[x], c1[x], a));
             o[Bpp * x] = static_cast<uint8_t>(c);

@@ -126,18 +126,28 @@ TEST(BaseTran, HueWrapsBy255AndLevelsClamp) {
 }
 
 TEST(Transform, EqualsThePlaneRoute) {
+    // The slot by amount: empty; an image of the source's size with 24 bits,
+    // with 32 bits, with 32 bits in wider rows (its alpha kept); one of another
+    // size and format, kept and filled; the source itself.
+    const int kAmounts[] = {0, 37, 100, 163, 200, 251};
     uint32_t seed = 10;
     for (int32_t bc : kBitCounts)
         for (int component : {0, 1, 2, 5})
-            for (int amount : {0, 37, 100, 163, 200}) {
-                // At 163 an existing image of another size and format is kept and filled.
-                Owned src = random_image(7, 5, bc, seed++),
-                      other = amount == 163 ? random_image(5, 6, bc == 24 ? 32 : 24, seed) : nullptr,
-                      want = plane_route(src.get(), other.get(), amount, component);
+            for (int slot = 0; slot < 6; ++slot) {
+                const int amount = kAmounts[slot];
+                Owned src = random_image(7, 5, bc, seed++), other;
+                if (slot == 1 || slot == 2) other = random_image(7, 5, slot == 1 ? 24 : 32, seed);
+                if (slot == 3) other = random_image(5, 6, bc == 24 ? 32 : 24, seed);
+                if (slot == 4) {
+                    other = random_image(9, 5, 32, seed);
+                    other->width = 7;
+                }
+                if (slot == 5) other = clone(src.get());
+                const Owned want = plane_route(src.get(), other.get(), amount, component);
                 Slot out;
                 Image *kept = out.image = other.release();
-                ASSERT_EQ(PX_IMG_Transform(src.get(), &out, amount, component), 1);
+                ASSERT_EQ(PX_IMG_Transform(slot == 5 ? kept : src.get(), &out, amount, component), 1);
                 EXPECT_TRUE(kept == nullptr || out.get() == kept);
-                ASSERT_EQ(diff(out.get(), want.get()), "") << bc << " c" << component << " a" << amount;
+                ASSERT_EQ(diff(out.get(), want.get()), "") << bc << " c" << component << " slot " << slot;
             }
 }

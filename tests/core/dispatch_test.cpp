@@ -8,6 +8,7 @@
 #include <pxfx/pxfx.h>
 
 #include <cstdio>
+#include <numeric>
 #include <random>
 #include <string>
 #include <utility>
@@ -165,5 +166,55 @@ TEST(Dispatch, MedianMatchesThePlainNetwork) {
                 for (size_t p = 1; p < runs.size(); ++p)
                     EXPECT_EQ(runs[p], runs[0])
                         << bits << " bits, width " << width << ", levels " << levels << ", path " << p;
+            }
+}
+
+// Split and Combine in the modes with vector rows (HSL, YUV, YIQ), and the
+// HSL transform, at every width up to past a 64-byte vector and past the
+// transform's 1024-pixel pieces, on rows whose pitch is larger than they
+// need: noise, and pictures of three levels (grays, channels that tie, both
+// lightness halves); Combine also from noise planes.
+TEST(Dispatch, PlaneRowsMatchThePlainCode) {
+    constexpr uint8_t kLevels[] = {0, 128, 255};
+    std::vector<int32_t> widths(70);
+    std::iota(widths.begin(), widths.end(), 1);
+    widths.push_back(2100);
+    std::mt19937 rng(17);
+    for (int32_t bits : {24, 32})
+        for (int32_t width : widths)
+            for (bool few : {false, true}) {
+                const Owned held = pxtest::random_image(width + 9, 3, bits, rng());
+                if (few)
+                    for (size_t i = 0; i < size_t{held->pitch} * 3; ++i)
+                        held->bits[i] = kLevels[held->bits[i] % 3];
+                const Image src = pxtest::reshaped(held.get(), width, 3);
+                const Owned noise = pxtest::random_image(width + 9, 9, 8, rng());
+                Image planes[3];
+                for (int i = 0; i < 3; ++i) {
+                    planes[i] = pxtest::reshaped(noise.get(), width, 3);
+                    planes[i].bits += size_t{noise->pitch} * 3 * i;
+                }
+                const auto runs = on_every_path([&] {
+                    std::vector<Owned> out;
+                    for (int32_t mode : {1, 2, 3}) {
+                        Image *p[4] = {};
+                        EXPECT_EQ(Split(&src, &p[0], &p[1], &p[2], &p[3], mode), 1);
+                        out.emplace_back(Combine(p[0], p[1], p[2], p[3], mode));
+                        out.emplace_back(Combine(p[0], p[1], p[2], nullptr, mode));
+                        out.emplace_back(Combine(&planes[0], &planes[1], &planes[2], &planes[0], mode));
+                        for (Image *plane : p)
+                            out.emplace_back(plane);
+                    }
+                    Image *moved = nullptr, *self = pxtest::clone(&src).release();
+                    EXPECT_EQ(PX_IMG_Transform(&src, &moved, 40 + width, width % 3), 1);
+                    EXPECT_EQ(PX_IMG_Transform(self, &self, 40 + width, width % 3), 1);
+                    out.emplace_back(moved);
+                    out.emplace_back(self);
+                    return out;
+                });
+                for (size_t p = 1; p < runs.size(); ++p)
+                    for (size_t i = 0; i < runs[0].size(); ++i)
+                        EXPECT_EQ(pxtest::diff(runs[p][i].get(), runs[0][i].get()), "")
+                            << bits << " bits, width " << width << ", few " << few << ", " << i << ", path " << p;
             }
 }

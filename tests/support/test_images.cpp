@@ -28,6 +28,11 @@ Owned filled(int32_t width, int32_t height, int32_t bitCount, uint32_t colour) {
 
 Owned clone(const Image *src) {
     Owned im = make(src->width, src->height, static_cast<int32_t>(src->bitCount));
+    if (im->pitch != src->pitch) {
+        PX_free(im->bits);
+        im->bits = static_cast<uint8_t *>(PX_malloc(static_cast<size_t>(src->pitch) * src->height));
+        im->pitch = src->pitch;
+    }
     std::memcpy(im->bits, src->bits, static_cast<size_t>(src->pitch) * src->height);
     return im;
 }
