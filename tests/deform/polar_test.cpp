@@ -43,7 +43,7 @@ TEST(Polar, MatchesAccessorVersion) {
     const float cases[][3] = {{9, 0, 1},  {-3, 0, 1},  {2, 0, 0},   {2, 7, -3.5f}, {0, 500, 1}, {1, 500, 1}, {3, 9, 1},
                               {4, -5, 1}, {0, 0, 100}, {1, 0, 100}, {2, 0, 100},   {3, 0, 100}, {4, 0, 1}};
     for (int i = 0; i < 13; ++i) {
-        const auto [mode, radius, factor] = cases[i];
+        const float mode = cases[i][0], radius = cases[i][1], factor = cases[i][2];
         expect_like_reference(
             [&](Image *s, Image **d) {
                 return i < 8 ? CircleTransform(s, d, int(mode), int(radius), factor) : entries[i - 8](s, d);
