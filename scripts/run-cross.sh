@@ -35,7 +35,7 @@ if [ "$arch" = armhf ]; then
 fi
 cmake -S . -B "$dir" -G Ninja -DCMAKE_BUILD_TYPE=Release \
   -DCMAKE_TOOLCHAIN_FILE="$PWD/cmake/toolchains/$triple.cmake" \
-  -DPXFX_BUILD_BENCH=OFF "${flags[@]}"
+  -DPXFX_BUILD_BENCH=OFF -DPXFX_WERROR=ON "${flags[@]}"
 cmake --build "$dir" -j "$(nproc)"
 # A test that hangs under emulation fails after 15 minutes instead of stalling the run.
 ctest --test-dir "$dir" --output-on-failure --timeout 900 -j "$(nproc)"

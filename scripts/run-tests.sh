@@ -4,7 +4,7 @@
 set -euo pipefail
 cd "$(dirname "$0")/.."
 bash scripts/install-deps.sh chromium
-cmake -S . -B build -G Ninja -DCMAKE_BUILD_TYPE=Release -DPXFX_BUILD_TESTS=ON -DPXFX_BUILD_BENCH=ON
+cmake -S . -B build -G Ninja -DCMAKE_BUILD_TYPE=Release -DPXFX_BUILD_TESTS=ON -DPXFX_BUILD_BENCH=ON -DPXFX_WERROR=ON
 cmake --build build -j "$(nproc)"
 ctest --test-dir build --output-on-failure -j "$(nproc)"
 bash scripts/check-install.sh

@@ -10,7 +10,7 @@ cd "$(dirname "$0")/.."
 filter=${1:-*}
 bash scripts/install-deps.sh valgrind
 cmake -S . -B build-valgrind -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo \
-  -DPXFX_BUILD_BENCH=OFF -DPXFX_BUILD_TOOLS=ON -DPXFX_SIMD=OFF
+  -DPXFX_BUILD_BENCH=OFF -DPXFX_BUILD_TOOLS=ON -DPXFX_SIMD=OFF -DPXFX_WERROR=ON
 cmake --build build-valgrind -j "$(nproc)"
 failed=0
 passed=0
