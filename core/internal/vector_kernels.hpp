@@ -21,15 +21,33 @@ using Median5Row = void (*)(const uint8_t *const *rows, int32_t channels, size_t
 using MapBytes = size_t (*)(const uint8_t *in, uint8_t *out, size_t pixels, const uint8_t *const *tables);
 using ToneBytes = size_t (*)(const uint8_t *in, uint8_t *out, size_t pixels, const ToneTables &t);
 
+// Local means of a photocopy row: rows[0..4] are five gray rows of n + 4
+// samples; output i (column i + 2) is the 5 x 5 window centred there:
+// u[i] = its (1 2 4 2 1)^T (1 2 4 2 1) weighted sum / 100 and ratio[i] =
+// 1000 u[i] / (its sum / 25), or kNoRatio where that mean is 0. cols holds
+// 2 (n + 4) words of room. Does the first outputs, a multiple of the vector
+// size, and returns how many.
+inline constexpr int32_t kNoRatio = -1;
+using PhotocopyMeans = size_t (*)(const uint8_t *const *rows, size_t n, uint16_t *cols, uint8_t *u, int32_t *ratio);
+// The photocopy tone of gray[i] from u[i] and ratio[i] (as photocopy_means
+// gives them) under the dark and bright thresholds t1 (0 .. 990) and t2
+// (0 .. 1009), into out[i]; the first outputs of n, as above.
+using PhotocopyTone = size_t (*)(const uint8_t *gray, const uint8_t *u, const int32_t *ratio, size_t n, int32_t t1,
+                                 int32_t t2, uint8_t *out);
+
 #ifdef PXFX_PORTABLE_ONLY
 inline Median5Row median5_row() { return nullptr; }
 inline MapBytes map_bytes(int) { return nullptr; }
 inline ToneBytes tone_bytes(int) { return nullptr; }
+inline PhotocopyMeans photocopy_means() { return nullptr; }
+inline PhotocopyTone photocopy_tone() { return nullptr; }
 #else
 Median5Row median5_row();
 // For pixels of `channels` bytes (1, 3 or 4; 3 or 4 for the tone map).
 MapBytes map_bytes(int channels);
 ToneBytes tone_bytes(int channels);
+PhotocopyMeans photocopy_means();
+PhotocopyTone photocopy_tone();
 #endif
 
 } // namespace pxfx::vec

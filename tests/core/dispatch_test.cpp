@@ -167,3 +167,23 @@ TEST(Dispatch, MedianMatchesThePlainNetwork) {
                         << bits << " bits, width " << width << ", levels " << levels << ", path " << p;
             }
 }
+
+// Photocopy's local means and tones at every width around the vector sizes,
+// on noise whose upper rows are nearly black (means of 0, ratios far apart).
+TEST(Dispatch, PhotocopyMatchesThePlainLoops) {
+    for (int32_t bits : pxtest::kBitCounts)
+        for (int32_t height : {5, 11})
+            for (int32_t width = 1; width <= 70; ++width) {
+                const Owned src = pxtest::random_image(width, height, bits, static_cast<uint32_t>(width * 64 + bits));
+                for (size_t i = 0; i < 4 * static_cast<size_t>(src->pitch); ++i)
+                    src->bits[i] >>= 6;
+                const auto runs = on_every_path([&] {
+                    Image *out = nullptr;
+                    EXPECT_EQ(PX_IMG_Photocopy(src.get(), &out), 1u);
+                    return Owned(out);
+                });
+                for (size_t p = 1; p < runs.size(); ++p)
+                    EXPECT_EQ(pxtest::diff(runs[p].get(), runs[0].get()), "")
+                        << bits << " bits, " << width << " x " << height << ", path " << p;
+            }
+}
