@@ -35,12 +35,24 @@ using PhotocopyMeans = size_t (*)(const uint8_t *const *rows, size_t n, uint16_t
 using PhotocopyTone = size_t (*)(const uint8_t *gray, const uint8_t *u, const int32_t *ratio, size_t n, int32_t t1,
                                  int32_t t2, uint8_t *out);
 
+// Auto levels with a local screen over one row of `pixels` pixels of
+// `channels` bytes (1, 3 or 4, the fourth alpha): cur is the row, mUp, mCur
+// and mDown the rows above, itself and below through the levels map. For
+// byte i of a pixel with both neighbours in the row, n = (mCur[i - channels]
+// + mCur[i + channels] + mUp[i] + mDown[i] + 2) / 4, the screen
+// s = 255 - (255 - n)(255 - mCur[i]) / 255, and out[i] = (amount s +
+// (100 - amount) cur[i]) / 100; alpha bytes are copied. Does pixels 1 .. k
+// for k a multiple of the vector size and returns k.
+using GradationRow = size_t (*)(const uint8_t *cur, const uint8_t *mUp, const uint8_t *mCur, const uint8_t *mDown,
+                                size_t pixels, int channels, int32_t amount, uint8_t *out);
+
 #ifdef PXFX_PORTABLE_ONLY
 inline Median5Row median5_row() { return nullptr; }
 inline MapBytes map_bytes(int) { return nullptr; }
 inline ToneBytes tone_bytes(int) { return nullptr; }
 inline PhotocopyMeans photocopy_means() { return nullptr; }
 inline PhotocopyTone photocopy_tone() { return nullptr; }
+inline GradationRow gradation_row() { return nullptr; }
 #else
 Median5Row median5_row();
 // For pixels of `channels` bytes (1, 3 or 4; 3 or 4 for the tone map).
@@ -48,6 +60,7 @@ MapBytes map_bytes(int channels);
 ToneBytes tone_bytes(int channels);
 PhotocopyMeans photocopy_means();
 PhotocopyTone photocopy_tone();
+GradationRow gradation_row();
 #endif
 
 } // namespace pxfx::vec

@@ -187,3 +187,21 @@ TEST(Dispatch, PhotocopyMatchesThePlainLoops) {
                         << bits << " bits, " << width << " x " << height << ", path " << p;
             }
 }
+
+// Auto gradation's rows at every width around the vector sizes, for each
+// format the vector rows take and one they leave to the plain loop.
+TEST(Dispatch, AutoGradationMatchesThePlainLoop) {
+    for (int32_t bits : pxtest::kBitCounts)
+        for (int32_t height : {1, 3, 7})
+            for (int32_t width = 1; width <= 70; ++width) {
+                const Owned src = pxtest::random_image(width, height, bits, static_cast<uint32_t>(width * 8 + height));
+                const auto runs = on_every_path([&] {
+                    Image *out = nullptr;
+                    EXPECT_EQ(ImageAutoGradationProcess(src.get(), &out, 60), 1);
+                    return Owned(out);
+                });
+                for (size_t p = 1; p < runs.size(); ++p)
+                    EXPECT_EQ(pxtest::diff(runs[p].get(), runs[0].get()), "")
+                        << bits << " bits, " << width << " x " << height << ", path " << p;
+            }
+}
