@@ -205,3 +205,25 @@ TEST(Dispatch, AutoGradationMatchesThePlainLoop) {
                         << bits << " bits, " << width << " x " << height << ", path " << p;
             }
 }
+
+// The box median of the line filters (the 5 x 5 median's vector code where
+// it runs) at every width around the vector sizes and the strips.
+TEST(Dispatch, LineBoxMedianMatchesTheHistograms) {
+    std::mt19937 rng(21);
+    for (int32_t height : {5, 9})
+        for (int32_t width = 1; width <= 70; ++width)
+            for (int levels : {256, 3}) {
+                const Owned src = pxtest::random_image(width, height, 8, rng());
+                for (int32_t y = 0; y < height; ++y)
+                    for (int32_t x = 0; x < width; ++x)
+                        src->bits[static_cast<size_t>(y) * src->pitch + x] %= levels;
+                const auto runs = on_every_path([&] {
+                    Image *out = nullptr;
+                    EXPECT_EQ(MyFliter1(src.get(), &out), 1);
+                    return Owned(out);
+                });
+                for (size_t p = 1; p < runs.size(); ++p)
+                    EXPECT_EQ(pxtest::diff(runs[p].get(), runs[0].get()), "")
+                        << width << " x " << height << ", levels " << levels << ", path " << p;
+            }
+}
