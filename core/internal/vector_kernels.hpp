@@ -14,6 +14,10 @@ namespace pxfx::vec {
 // padded rows (2 * channels samples readable before and after), out[i] gets
 // the median of sample i for i < n.
 using Median5Row = void (*)(const uint8_t *const *rows, int32_t channels, size_t n, uint8_t *out);
+// Element 9 (from 0) of 19 bytes: for out[i], i < n, the bytes i of rows[0..4]
+// (a column of five rows) and the fourteen others of rows[2] from i - 7 to
+// i + 7 (rows[2] readable 7 bytes before and after).
+using Cross19Row = void (*)(const uint8_t *const *rows, size_t n, uint8_t *out);
 
 // Byte-table maps of core/internal/byte_map.hpp over whole vectors: they map
 // the first pixels, a multiple of the vector size, and return how many; the
@@ -48,6 +52,7 @@ using GradationRow = size_t (*)(const uint8_t *cur, const uint8_t *mUp, const ui
 
 #ifdef PXFX_PORTABLE_ONLY
 inline Median5Row median5_row() { return nullptr; }
+inline Cross19Row cross19_row() { return nullptr; }
 inline MapBytes map_bytes(int) { return nullptr; }
 inline ToneBytes tone_bytes(int) { return nullptr; }
 inline PhotocopyMeans photocopy_means() { return nullptr; }
@@ -55,6 +60,7 @@ inline PhotocopyTone photocopy_tone() { return nullptr; }
 inline GradationRow gradation_row() { return nullptr; }
 #else
 Median5Row median5_row();
+Cross19Row cross19_row();
 // For pixels of `channels` bytes (1, 3 or 4; 3 or 4 for the tone map).
 MapBytes map_bytes(int channels);
 ToneBytes tone_bytes(int channels);
