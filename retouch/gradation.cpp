@@ -243,11 +243,9 @@ int32_t ImageAutoGradationProcess(const Image *src, Image **dst, int32_t amount)
     // The vector rows read the source as they write: only into a block of
     // its own.
     const uint32_t bits = in.bitCount;
-    const auto from = reinterpret_cast<uintptr_t>(in.bits), to = reinterpret_cast<uintptr_t>(out->bits);
-    const bool apart = to + out->block_bytes() <= from || from + in.block_bytes() <= to;
     const vec::GradationRow run = vec::gradation_row();
     Buffer<uint8_t> mapped;
-    if (run != nullptr && apart && bits == out->bitCount && (bits == 8 || bits == 24 || bits == 32))
+    if (run != nullptr && blocks_apart(in, *out) && bits == out->bitCount && (bits == 8 || bits == 24 || bits == 32))
         mapped = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(in.width), bits / 8, 3));
     if (mapped) {
         with_format(bits, [&](auto f) {
