@@ -208,10 +208,10 @@ extern "C" uint32_t PX_IMG_Photocopy(Image *src, Image **dst) {
     if (out == nullptr) return 0;
     const int32_t w = src->width, h = src->height;
     if (w <= 0 || h <= 0) {
-        // Nothing to draw, but the work buffer of 5 x stride x height + 8000
-        // bytes (the stride being the width rounded up to a multiple of 4) is
-        // still needed; when its size is not positive it cannot be had, and
-        // the result is released.
+        // Nothing to draw, but the call still stands or falls with a work
+        // buffer of 5 x stride x height + 8000 bytes (the stride being the
+        // width rounded up to a multiple of 4): when that size is not
+        // positive it cannot be had, and the result is released.
         const int64_t plane = ((int64_t{w} + 3) & ~int64_t{3}) * h;
         if (buffer_size_ok(block_size(plane, 5, 1) + 8000)) return 1;
         free_Image(dst, 0);

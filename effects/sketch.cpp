@@ -129,17 +129,19 @@ uint32_t sketch(Image *src, Image **dst, bool withEdges) {
     if (out == nullptr) return 0;
     const int32_t w = src->width, h = src->height;
     if (w <= 0 || h <= 0) {
-        // Nothing to draw, but the work buffer of planes x width x height
-        // bytes is still needed: a size of 0 or below cannot be had (0, the
-        // prepared result kept), a positive one (both sizes negative) can.
+        // Nothing to draw, but the call still stands or falls with a work
+        // buffer of planes x width x height bytes: a size of 0 or below
+        // cannot be had (0, the prepared result kept), a positive one (both
+        // sizes negative) can.
         return buffer_size_ok(block_size(w, h, withEdges ? 4 : 3)) ? 1 : 0;
     }
     const std::optional<View> to = view_of(out);
     if (!to) return 1;
     const View from = *view_of(src); // the result's size: the source has pixels too
-    // The gray plane, the byte temp_ex reads past it, and two rows.
-    const size_t plane = checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h));
-    Buffer<uint8_t> buf = alloc_buffer<uint8_t>(checked_size(plane + 1 + 2 * static_cast<uint64_t>(w), 1));
+    // The gray plane, the byte temp_ex reads past it, and two rows: within
+    // width x (height + 3) bytes.
+    const size_t plane = static_cast<size_t>(w) * static_cast<size_t>(h);
+    Buffer<uint8_t> buf = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h) + 3));
     if (!buf) return 0;
     uint8_t *g = buf.get();
     g[plane] = 0;
