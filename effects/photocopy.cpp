@@ -11,6 +11,7 @@
 #include "core/internal/result.hpp"
 #include "core/internal/vector_kernels.hpp"
 #include "core/internal/view.hpp"
+#include "effects/drawing_gray.hpp"
 
 using namespace pxfx;
 
@@ -19,16 +20,6 @@ namespace {
 constexpr int32_t kWeights[5] = {1, 2, 4, 2, 1};
 constexpr int32_t kBins = 2000;
 constexpr int32_t kBrightFrom = 990;
-
-template <class F> void gray_plane(const View &src, uint8_t *g) {
-    const int32_t w = src.width;
-    for (int32_t y = 0; y < src.height; ++y) {
-        const typename F::CRow row = F::crow(src, y);
-        uint8_t *out = g + static_cast<size_t>(y) * w;
-        for (int32_t x = 0; x < w; ++x)
-            out[x] = static_cast<uint8_t>(drawing_gray(F::load(row, x)));
-    }
-}
 
 // Local means of one row y, 2 <= y < h - 2, of the gray plane: for the
 // columns x = 2 .. w - 3, mean M = 5 x 5 sum / 25 and weighted mean
@@ -225,7 +216,7 @@ extern "C" uint32_t PX_IMG_Photocopy(Image *src, Image **dst) {
         free_Image(dst, 0);
         return 0;
     }
-    with_format(from.bitCount, [&](auto f) { gray_plane<decltype(f)>(from, g.get()); });
+    drawing_gray_plane(from, g.get());
     if (!with_format(to->bitCount, [&](auto f) { return photocopy<decltype(f)>(*to, g.get(), w, h); })) {
         free_Image(dst, 0);
         return 0;

@@ -13,6 +13,7 @@
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
 #include "core/internal/view.hpp"
+#include "effects/drawing_gray.hpp"
 
 using namespace pxfx;
 
@@ -48,16 +49,6 @@ struct SketchTables {
 const SketchTables &tables() {
     static const SketchTables t;
     return t;
-}
-
-template <class F> void gray_plane(const View &src, uint8_t *g) {
-    const int32_t w = src.width;
-    for (int32_t y = 0; y < src.height; ++y) {
-        const typename F::CRow row = F::crow(src, y);
-        uint8_t *out = g + static_cast<size_t>(y) * w;
-        for (int32_t x = 0; x < w; ++x)
-            out[x] = static_cast<uint8_t>(drawing_gray(F::load(row, x)));
-    }
 }
 
 // Edge row y: E = low byte of ~max(|left - right|, |upper - lower|) of the
@@ -145,7 +136,7 @@ uint32_t sketch(Image *src, Image **dst, bool withEdges) {
     if (!buf) return 0;
     uint8_t *g = buf.get();
     g[plane] = 0;
-    with_format(from.bitCount, [&](auto f) { gray_plane<decltype(f)>(from, g); });
+    drawing_gray_plane(from, g);
     uint8_t *b = g + plane + 1, *e = withEdges ? b + w : nullptr;
     with_format(to->bitCount, [&](auto f) { compose<decltype(f)>(*to, g, w, h, b, e); });
     return 1;

@@ -50,6 +50,11 @@ using PhotocopyTone = size_t (*)(const uint8_t *gray, const uint8_t *u, const in
 using GradationRow = size_t (*)(const uint8_t *cur, const uint8_t *mUp, const uint8_t *mCur, const uint8_t *mDown,
                                 size_t pixels, int channels, int32_t amount, uint8_t *out);
 
+// The drawing gray of the first pixels of 3 or 4 bytes (blue, green, red
+// and alpha) into one byte each; does a multiple of the vector size and
+// returns how many.
+using DrawingGray = size_t (*)(const uint8_t *in, size_t pixels, uint8_t *out);
+
 #ifdef PXFX_PORTABLE_ONLY
 inline Median5Row median5_row() { return nullptr; }
 inline Cross19Row cross19_row() { return nullptr; }
@@ -58,6 +63,7 @@ inline ToneBytes tone_bytes(int) { return nullptr; }
 inline PhotocopyMeans photocopy_means() { return nullptr; }
 inline PhotocopyTone photocopy_tone() { return nullptr; }
 inline GradationRow gradation_row() { return nullptr; }
+inline DrawingGray drawing_gray(int) { return nullptr; }
 #else
 Median5Row median5_row();
 Cross19Row cross19_row();
@@ -67,6 +73,8 @@ ToneBytes tone_bytes(int channels);
 PhotocopyMeans photocopy_means();
 PhotocopyTone photocopy_tone();
 GradationRow gradation_row();
+// For pixels of `channels` bytes, 3 or 4.
+DrawingGray drawing_gray(int channels);
 #endif
 
 } // namespace pxfx::vec
