@@ -4,7 +4,6 @@
 #include <pxfx/color.h>
 #include <pxfx/effects.h>
 
-#include <cstring>
 #include <optional>
 
 #include "core/internal/image_check.hpp"
@@ -25,87 +24,51 @@ constexpr uint32_t intensity_class(uint32_t c) {
     return (306 * red_of(c) + 601 * green_of(c) + 117 * blue_of(c)) >> 15;
 }
 
-// Pixel count and red, green, blue sums per class in one histogram (class k
-// counts at 4k, its red sum at 4k + 1, green at 4k + 2, blue at 4k + 3), so
-// that merging and sliding run over all of them in one pass. `S` holds the
-// sums of one window exactly: 16 bits while (2r + 1)^2 * 255 fits (radii up
-// to 7, where a histogram takes a quarter of the memory and of the work of
-// 64-bit sums), 32 bits while that fits, 64 bits beyond.
+// Pixel count and red, green, blue sums per class in one histogram of four
+// groups of bins (class k counts at k, its red sum at kRed + k, and so on),
+// so that merging and sliding run over all of them in one pass. `S` holds the
+// sums of one window exactly: 32 bits while (2r + 1)^2 * 255 fits, 64 bits
+// beyond.
+constexpr int32_t kRed = kClasses, kGreen = 2 * kClasses, kBlue = 3 * kClasses;
 template <class S> using Hist = rank::Histogram<4 * kClasses, S>;
 
-// The counts of the classes, for the rank queries.
-template <class S> struct ClassCounts {
-    static constexpr uint32_t kLevels = kClasses;
-    const Hist<S> &h;
-    S count(int32_t k) const { return h.count(4 * k); }
-};
-
-// Adds (sign 1) or removes (sign -1) a pixel. With 16-bit sums, the four
-// bins of its class change as one 64-bit word: every bin stays within 16 bits
-// and never falls below what is taken from it, so no carry or borrow crosses
-// from one bin to the next.
-template <class S> void move_pixel(Hist<S> &h, uint32_t c, int sign) {
+template <class S> void add_pixel(Hist<S> &h, uint32_t c) {
     const auto k = static_cast<int32_t>(intensity_class(c));
-    const S part[4] = {1, static_cast<S>(red_of(c)), static_cast<S>(green_of(c)), static_cast<S>(blue_of(c))};
-    if constexpr (sizeof(S) == 2) {
-        uint64_t word, change;
-        std::memcpy(&word, &h.bins[4 * k], sizeof word);
-        std::memcpy(&change, part, sizeof change);
-        word = sign > 0 ? word + change : word - change;
-        std::memcpy(&h.bins[4 * k], &word, sizeof word);
-    } else {
-        for (int32_t i = 0; i < 4; ++i)
-            sign > 0 ? h.add(4 * k + i, part[i]) : h.remove(4 * k + i, part[i]);
-    }
+    h.add(k);
+    h.add(kRed + k, red_of(c));
+    h.add(kGreen + k, green_of(c));
+    h.add(kBlue + k, blue_of(c));
 }
 
-// Division of a class's channel sums by its count n, 1 .. (2r + 1)^2. For
-// windows of at most kByTable pixels as a multiply and a shift: with
-// m = ceil(2^32 / n) = (2^32 + e) / n, 0 <= e < n, sum m / 2^32 exceeds
-// sum / n by sum e / (n 2^32) < 1 / n, which never reaches the next integer,
-// as sum e < 255 n^2 < 2^32. Larger windows divide.
-constexpr uint64_t kByTable = 4103;
-
-class Means {
-  public:
-    explicit Means(uint64_t pixels)
-        : byCount_(pixels <= kByTable ? alloc_buffer<uint64_t>(static_cast<size_t>(pixels) + 1) : Buffer<uint64_t>()) {
-        if (byCount_)
-            for (uint64_t n = 1; n <= pixels; ++n)
-                byCount_[n] = ((uint64_t{1} << 32) + n - 1) / n;
-    }
-    template <class S> uint32_t operator()(S sum, S n) const {
-        if (byCount_) return static_cast<uint32_t>((sum * byCount_[n]) >> 32);
-        return static_cast<uint32_t>(sum / n);
-    }
-
-  private:
-    Buffer<uint64_t> byCount_;
-};
+template <class S> void remove_pixel(Hist<S> &h, uint32_t c) {
+    const auto k = static_cast<int32_t>(intensity_class(c));
+    h.remove(k);
+    h.remove(kRed + k, red_of(c));
+    h.remove(kGreen + k, green_of(c));
+    h.remove(kBlue + k, blue_of(c));
+}
 
 // Mean colour of the most populated class, the lowest class on a tie.
-template <class S> uint32_t dominant(const Hist<S> &h, const Means &mean, uint32_t alpha) {
-    const int32_t k = rank::most_frequent(ClassCounts<S>{h}, 0, kClasses);
-    const S n = h.count(4 * k);
-    return pack(mean(h.count(4 * k + 3), n), mean(h.count(4 * k + 2), n), mean(h.count(4 * k + 1), n), alpha);
+template <class S> uint32_t dominant(const Hist<S> &h, uint32_t alpha) {
+    const int32_t k = rank::most_frequent(h, 0, kClasses);
+    const S n = h.count(k);
+    return pack(static_cast<uint32_t>(h.count(kBlue + k) / n), static_cast<uint32_t>(h.count(kGreen + k) / n),
+                static_cast<uint32_t>(h.count(kRed + k) / n), alpha);
 }
 
 // Border pixels (closer than r to an edge) are copied; interior pixels take
 // the dominant class of their (2r + 1)^2 window. The window is the sum of
 // per-column histograms over rows y - r .. y + r; moving down a row updates
 // each column by one pixel out and one in, moving right adds one column and
-// subtracts another, so the cost per pixel does not depend on r. A column is
-// moved down just before the window first takes it, while it is at hand.
-constexpr int32_t kAhead = 16;
-
-template <class F, class S> void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols, const Means &mean) {
+// subtracts another, so the cost per pixel does not depend on r.
+template <class F, class S> void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols) {
     const int32_t w = src.width, h = src.height;
     for (int32_t x = 0; x < w; ++x)
         cols[x] = Hist<S>{};
     for (int32_t y = 0; y < 2 * r; ++y) {
         const typename F::CRow in = F::crow(src, y);
         for (int32_t x = 0; x < w; ++x)
-            move_pixel(cols[x], F::load(in, x), 1);
+            add_pixel(cols[x], F::load(in, x));
     }
     for (int32_t y = 0; y < h; ++y) {
         const typename F::CRow in = F::crow(src, y);
@@ -115,48 +78,40 @@ template <class F, class S> void oil(const View &src, const View &dst, int32_t r
                 F::store(out, x, F::load(in, x));
             continue;
         }
-        // Column x moves from rows y - r - 1 .. y + r - 1 (0 .. 2r - 1 on the
-        // first interior row) to y - r .. y + r.
+        // Columns now cover rows y - r .. y + r.
         const typename F::CRow enter = F::crow(src, y + r);
-        const bool leaves = y > r;
-        const typename F::CRow leave = F::crow(src, leaves ? y - r - 1 : 0);
-        auto move_down = [&](int32_t x) {
-            move_pixel(cols[x], F::load(enter, x), 1);
-            if (leaves) move_pixel(cols[x], F::load(leave, x), -1);
-        };
+        for (int32_t x = 0; x < w; ++x)
+            add_pixel(cols[x], F::load(enter, x));
         for (int32_t x = 0; x < r; ++x)
             F::store(out, x, F::load(in, x));
-        // Columns move kAhead columns before the window takes them, so that
-        // their stores have landed when the window reads them whole.
-        for (int32_t x = 0; x <= 2 * r + kAhead && x < w; ++x)
-            move_down(x);
         Hist<S> win{};
         for (int32_t x = 0; x <= 2 * r; ++x)
             win.merge(cols[x]);
-        F::store(out, r, dominant(win, mean, alpha_of(F::load(in, r))));
+        F::store(out, r, dominant(win, alpha_of(F::load(in, r))));
         for (int32_t x = r + 1; x < w - r; ++x) {
-            if (x + r + kAhead < w) move_down(x + r + kAhead);
             win.slide(cols[x + r], cols[x - r - 1]);
-            F::store(out, x, dominant(win, mean, alpha_of(F::load(in, x))));
+            F::store(out, x, dominant(win, alpha_of(F::load(in, x))));
         }
         for (int32_t x = w - r; x < w; ++x)
             F::store(out, x, F::load(in, x));
+        const typename F::CRow leave = F::crow(src, y - r);
+        for (int32_t x = 0; x < w; ++x)
+            remove_pixel(cols[x], F::load(leave, x));
     }
 }
 
 template <class F> bool oil_with_sums(const View &src, const View &dst, int32_t r) {
     const uint64_t side = 2 * static_cast<uint64_t>(r) + 1;
-    const Means mean(side * side);
-    auto run = [&](auto sum) {
-        using S = decltype(sum);
-        Buffer<Hist<S>> cols = alloc_buffer<Hist<S>>(static_cast<size_t>(src.width));
+    if (side < 0x10000 && side * side * 255 <= 0xFFFFFFFFu) {
+        Buffer<Hist<uint32_t>> cols = alloc_buffer<Hist<uint32_t>>(static_cast<size_t>(src.width));
         if (!cols) return false;
-        oil<F>(src, dst, r, cols.get(), mean);
-        return true;
-    };
-    if (side * side * 255 <= 0xFFFFu) return run(uint16_t{});
-    if (side < 0x10000 && side * side * 255 <= 0xFFFFFFFFu) return run(uint32_t{});
-    return run(uint64_t{});
+        oil<F>(src, dst, r, cols.get());
+    } else {
+        Buffer<Hist<uint64_t>> cols = alloc_buffer<Hist<uint64_t>>(static_cast<size_t>(src.width));
+        if (!cols) return false;
+        oil<F>(src, dst, r, cols.get());
+    }
+    return true;
 }
 
 // Channel planes of one call, released on every path.
