@@ -14,12 +14,32 @@ using namespace pxfx;
 
 namespace {
 
-uint32_t neon_channel(int32_t c, int32_t r, int32_t d) {
+// Doubled gradient magnitude of one channel, clamp_u8(2 isqrt_round(dx^2 +
+// dy^2)), looked up by the squared length. From kNeonFull on the rounded root
+// is at least 128, so the doubled value is capped at 255: the table stops there.
+constexpr uint32_t kNeonFull = 128 * 128 - 128 + 1;
+
+struct NeonTable {
+    uint8_t level[kNeonFull + 1];
+    NeonTable() {
+        for (uint32_t s = 0; s <= kNeonFull; ++s)
+            level[s] = clamp_u8(static_cast<int32_t>(2 * isqrt_round(s)));
+    }
+};
+
+const NeonTable &neon_table() {
+    static const NeonTable t;
+    return t;
+}
+
+uint32_t neon_channel(const NeonTable &t, int32_t c, int32_t r, int32_t d) {
     const int32_t dx = c - r, dy = c - d;
-    return clamp_u8(static_cast<int32_t>(2 * isqrt_round(static_cast<uint32_t>(dx * dx + dy * dy))));
+    const auto s = static_cast<uint32_t>(dx * dx + dy * dy);
+    return t.level[s < kNeonFull ? s : kNeonFull];
 }
 
 template <class F> void neon(const View &src, const View &dst) {
+    const NeonTable &t = neon_table();
     const int32_t w = src.width, h = src.height;
     for (int32_t y = 0; y + 1 < h; ++y) {
         const typename F::CRow row = F::crow(src, y);
@@ -27,9 +47,9 @@ template <class F> void neon(const View &src, const View &dst) {
         const typename F::Row out = F::row(dst, y);
         for (int32_t x = 0; x + 1 < w; ++x) {
             const uint32_t c = F::load(row, x), r = F::load(row, x + 1), d = F::load(below, x);
-            const uint32_t b = neon_channel(blue_of(c), blue_of(r), blue_of(d));
-            const uint32_t g = neon_channel(green_of(c), green_of(r), green_of(d));
-            const uint32_t rr = neon_channel(red_of(c), red_of(r), red_of(d));
+            const uint32_t b = neon_channel(t, blue_of(c), blue_of(r), blue_of(d));
+            const uint32_t g = neon_channel(t, green_of(c), green_of(r), green_of(d));
+            const uint32_t rr = neon_channel(t, red_of(c), red_of(r), red_of(d));
             F::store(out, x, pack(b, g, rr, alpha_of(c)));
         }
     }

@@ -9,7 +9,9 @@
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "core/internal/view.hpp"
+#include "effects/drawing_gray.hpp"
 
 using namespace pxfx;
 
@@ -19,67 +21,84 @@ constexpr int32_t kWeights[5] = {1, 2, 4, 2, 1};
 constexpr int32_t kBins = 2000;
 constexpr int32_t kBrightFrom = 990;
 
-template <class F> void gray_plane(const View &src, uint8_t *g, int32_t stride) {
-    for (int32_t y = 0; y < src.height; ++y) {
-        const typename F::CRow row = F::crow(src, y);
-        uint8_t *out = g + static_cast<size_t>(y) * stride;
-        for (int32_t x = 0; x < src.width; ++x)
-            out[x] = static_cast<uint8_t>(drawing_gray(F::load(row, x)));
-    }
-}
+// Local means of one row y, 2 <= y < h - 2, of the gray plane: for the
+// columns x = 2 .. w - 3, mean M = 5 x 5 sum / 25 and weighted mean
+// U = (1 2 4 2 1)^T (1 2 4 2 1) sum / 100, both separable and exact; u[x - 2]
+// gets U and ratio[x - 2] the ratio 1000 U / M, or kNoRatio where M is 0.
+// The vector copy does the first columns, the plain loop the rest.
+class LocalMeans {
+  public:
+    static constexpr int32_t kNoRatio = vec::kNoRatio;
 
-struct Stats {
-    int64_t dark = 0, bright = 0;
-    int64_t hist[kBins] = {};
-};
+    explicit LocalMeans(int32_t width)
+        : w_(width), cols_(alloc_buffer<int32_t>(2 * static_cast<size_t>(width))),
+          vectorCols_(alloc_buffer<uint16_t>(2 * static_cast<size_t>(width))), vector_(vec::photocopy_means()) {}
+    bool ok() const { return cols_ && vectorCols_; }
 
-// Local means for rows and columns 2 .. n-3: mean M = 5 x 5 sum / 25 and
-// weighted U = (1 2 4 2 1)^T (1 2 4 2 1) sum / 100, both separable and exact.
-// Stores U and the ratio q = 1000 U / M (low 16 bits) and counts the ratios.
-void local_stats(const uint8_t *g, uint8_t *u, uint16_t *q, int32_t w, int32_t h, int32_t s, int32_t *colSum,
-                 int32_t *colWeighted, Stats &st) {
-    for (int32_t y = 2; y + 2 < h; ++y) {
-        for (int32_t x = 0; x < w; ++x) {
+    void row(const uint8_t *g, int32_t y, uint8_t *u, int32_t *ratio) {
+        const uint8_t *rows[5];
+        for (int32_t k = 0; k < 5; ++k)
+            rows[k] = g + static_cast<size_t>(y - 2 + k) * w_;
+        const size_t n = static_cast<size_t>(w_ - 4);
+        const size_t done = vector_ != nullptr ? vector_(rows, n, vectorCols_.get(), u, ratio) : 0;
+        int32_t *colSum = cols_.get(), *colWeighted = colSum + w_;
+        for (size_t x = done; x < n + 4; ++x) {
             int32_t sum = 0, weighted = 0;
             for (int32_t k = 0; k < 5; ++k) {
-                const int32_t v = g[static_cast<size_t>(y - 2 + k) * s + x];
-                sum += v;
-                weighted += kWeights[k] * v;
+                sum += rows[k][x];
+                weighted += kWeights[k] * rows[k][x];
             }
             colSum[x] = sum;
             colWeighted[x] = weighted;
         }
-        const size_t o = static_cast<size_t>(y) * s;
-        for (int32_t x = 2; x + 2 < w; ++x) {
+        for (size_t i = done; i < n; ++i) {
             int32_t sum = 0, weighted = 0;
             for (int32_t k = 0; k < 5; ++k) {
-                sum += colSum[x - 2 + k];
-                weighted += kWeights[k] * colWeighted[x - 2 + k];
+                sum += colSum[i + k];
+                weighted += kWeights[k] * colWeighted[i + k];
             }
             const int32_t m = sum / 25;
             const int32_t uu = weighted / 100;
-            u[o + x] = static_cast<uint8_t>(uu);
-            if (m == 0) continue;
-            const int32_t ratio = uu * 1000 / m;
-            q[o + x] = static_cast<uint16_t>(ratio);
-            if (ratio < kBrightFrom) {
-                ++st.dark;
-                ++st.hist[ratio];
-            } else if (ratio < kBins) {
-                ++st.bright;
-                ++st.hist[ratio];
-            }
+            u[i] = static_cast<uint8_t>(uu);
+            ratio[i] = m == 0 ? kNoRatio : uu * 1000 / m;
         }
     }
-}
+
+  private:
+    int32_t w_;
+    Buffer<int32_t> cols_;
+    Buffer<uint16_t> vectorCols_;
+    vec::PhotocopyMeans vector_;
+};
+
+// Counts of the ratios below kBins: dark ones below kBrightFrom, bright ones
+// from there. Neighbouring pixels, often of one ratio, count into two
+// histograms in turn, so that one count's update need not wait for the last.
+struct Stats {
+    int64_t hist[2][kBins] = {};
+    void count(const int32_t *ratio, int32_t n) {
+        for (int32_t i = 0; i < n; ++i) {
+            const auto r = static_cast<uint32_t>(ratio[i]);
+            if (r < kBins) ++hist[i & 1][r];
+        }
+    }
+    int64_t at(int32_t i) const { return hist[0][i] + hist[1][i]; }
+    int64_t total(int32_t first, int32_t end) const {
+        int64_t n = 0;
+        for (int32_t i = first; i < end; ++i)
+            n += at(i);
+        return n;
+    }
+};
 
 // Dark threshold: 990 - the first ratio below 990 at which more than 20 % of
 // the dark pixels are counted; 0 if none.
 int32_t dark_threshold(const Stats &st) {
+    const int64_t dark = st.total(0, kBrightFrom);
     int64_t cum = 0;
     for (int32_t i = 0; i < kBrightFrom; ++i) {
-        cum += st.hist[i];
-        if (cum * 1000 > st.dark * 200) return kBrightFrom - i;
+        cum += st.at(i);
+        if (cum * 1000 > dark * 200) return kBrightFrom - i;
     }
     return 0;
 }
@@ -87,50 +106,89 @@ int32_t dark_threshold(const Stats &st) {
 // Bright threshold: the first ratio from 990 at which more than 80 % of the
 // bright pixels are counted, minus 990; 1000 if none.
 int32_t bright_threshold(const Stats &st) {
+    const int64_t bright = st.total(kBrightFrom, kBins);
     int64_t cum = 0;
     for (int32_t i = kBrightFrom; i < kBins; ++i) {
-        cum += st.hist[i];
-        if (cum * 1000 > st.bright * 800) return i - kBrightFrom;
+        cum += st.at(i);
+        if (cum * 1000 > bright * 800) return i - kBrightFrom;
     }
     return 1000;
 }
 
-void tone_map(uint8_t *g, const uint8_t *u, const uint16_t *q, int32_t w, int32_t h, int32_t s, int32_t t1,
-              int32_t t2) {
-    for (int32_t y = 1; y + 1 < h; ++y) {
-        const size_t o = static_cast<size_t>(y) * s;
-        for (int32_t x = 1; x + 1 < w; ++x) {
-            const int32_t ratio = q[o + x];
-            if (ratio == 0) continue;
-            const int32_t uu = u[o + x];
-            int32_t v;
-            if (ratio < kBrightFrom) {
-                int32_t k = 0;
-                if (t1 != 0) {
-                    const int32_t d = kBrightFrom - ratio < t1 ? kBrightFrom - ratio : t1;
-                    k = (t1 - d) * 1000 / t1;
-                }
-                v = uu * k / 1000;
-            } else {
-                int32_t k = 1000;
-                if (t2 != 0) {
-                    const int32_t d = ratio - kBrightFrom < t2 ? ratio - kBrightFrom : t2;
-                    k = d * 1000 / t2;
-                }
-                v = 255 - (255 - uu) * (1000 - k) / 1000;
+// Weight k of the tone mapping per ratio, 0 .. 1000: for dark ratios it
+// falls from 1000 at 990 to 0 at 990 - t1, for bright ones it rises from 0 at
+// 990 to 1000 at 990 + t2. t2 <= 1009, so from kBins - 1 on k is 1000: the
+// last entry stands for every larger ratio.
+void tone_weights(int32_t t1, int32_t t2, int32_t *weight) {
+    for (int32_t ratio = 0; ratio < kBins; ++ratio) {
+        int32_t k;
+        if (ratio < kBrightFrom) {
+            k = 0;
+            if (t1 != 0) {
+                const int32_t d = kBrightFrom - ratio < t1 ? kBrightFrom - ratio : t1;
+                k = (t1 - d) * 1000 / t1;
             }
-            g[o + x] = static_cast<uint8_t>(v < 0 ? 0 : (v > 255 ? 255 : v));
+        } else {
+            k = 1000;
+            if (t2 != 0) {
+                const int32_t d = ratio - kBrightFrom < t2 ? ratio - kBrightFrom : t2;
+                k = d * 1000 / t2;
+            }
         }
+        weight[ratio] = k;
     }
 }
 
-template <class F> void write_gray(const View &dst, const uint8_t *g, int32_t s) {
-    for (int32_t y = 0; y < dst.height; ++y) {
-        const uint8_t *in = g + static_cast<size_t>(y) * s;
-        const typename F::Row out = F::row(dst, y);
-        for (int32_t x = 0; x < dst.width; ++x)
-            F::store(out, x, pack(in[x], in[x], in[x], 255));
+// The tone of gray value a whose local means are uu and ratio: the ratio
+// taken modulo 2^16, where 0 keeps the gray value (as does a mean of 0).
+uint32_t tone(uint32_t a, int32_t uu, int32_t ratio, const int32_t *weight) {
+    if (ratio == LocalMeans::kNoRatio) return a;
+    const int32_t q = ratio & 0xFFFF;
+    if (q == 0) return a;
+    const int32_t k = weight[q < kBins ? q : kBins - 1];
+    const int32_t v = q < kBrightFrom ? uu * k / 1000 : 255 - (255 - uu) * (1000 - k) / 1000;
+    return static_cast<uint32_t>(v < 0 ? 0 : (v > 255 ? 255 : v));
+}
+
+// Two passes over the rows: the first counts the ratios, the second sets the
+// thresholds from them and writes the result, working the local means out
+// again rather than keeping planes of them.
+template <class F> bool photocopy(const View &dst, const uint8_t *g, int32_t w, int32_t h) {
+    LocalMeans means(w);
+    Buffer<uint8_t> u = alloc_buffer<uint8_t>(static_cast<size_t>(w));
+    Buffer<int32_t> ratio = alloc_buffer<int32_t>(static_cast<size_t>(w));
+    Buffer<uint8_t> toned = alloc_buffer<uint8_t>(static_cast<size_t>(w));
+    if (!means.ok() || !u || !ratio || !toned) return false;
+    Stats st;
+    for (int32_t y = 2; y + 2 < h && w > 4; ++y) {
+        means.row(g, y, u.get(), ratio.get());
+        st.count(ratio.get(), w - 4);
     }
+    const int32_t t1 = dark_threshold(st), t2 = bright_threshold(st);
+    int32_t weight[kBins];
+    tone_weights(t1, t2, weight);
+    const vec::PhotocopyTone toneVector = vec::photocopy_tone();
+    for (int32_t y = 0; y < h; ++y) {
+        const uint8_t *gray = g + static_cast<size_t>(y) * w;
+        if (y >= 2 && y + 2 < h && w > 4) {
+            means.row(g, y, u.get(), ratio.get());
+            uint8_t *t = toned.get();
+            t[0] = gray[0];
+            t[1] = gray[1];
+            const size_t n = static_cast<size_t>(w - 4);
+            const auto done = static_cast<int32_t>(
+                toneVector != nullptr ? toneVector(gray + 2, u.get(), ratio.get(), n, t1, t2, t + 2) : 0);
+            for (int32_t x = 2 + done; x + 2 < w; ++x)
+                t[x] = static_cast<uint8_t>(tone(gray[x], u[x - 2], ratio[x - 2], weight));
+            t[w - 2] = gray[w - 2];
+            t[w - 1] = gray[w - 1];
+            gray = t;
+        }
+        const typename F::Row out = F::row(dst, y);
+        for (int32_t x = 0; x < w; ++x)
+            F::store(out, x, pack(gray[x], gray[x], gray[x], 255));
+    }
+    return true;
 }
 
 } // namespace
@@ -141,10 +199,10 @@ extern "C" uint32_t PX_IMG_Photocopy(Image *src, Image **dst) {
     if (out == nullptr) return 0;
     const int32_t w = src->width, h = src->height;
     if (w <= 0 || h <= 0) {
-        // Nothing to draw, but the work buffer of 5 x stride x height + 8000
-        // bytes (the stride being the width rounded up to a multiple of 4) is
-        // still needed; when its size is not positive it cannot be had, and
-        // the result is released.
+        // Nothing to draw, but the call still stands or falls with a work
+        // buffer of 5 x stride x height + 8000 bytes (the stride being the
+        // width rounded up to a multiple of 4): when that size is not
+        // positive it cannot be had, and the result is released.
         const int64_t plane = ((int64_t{w} + 3) & ~int64_t{3}) * h;
         if (buffer_size_ok(block_size(plane, 5, 1) + 8000)) return 1;
         free_Image(dst, 0);
@@ -153,21 +211,16 @@ extern "C" uint32_t PX_IMG_Photocopy(Image *src, Image **dst) {
     const std::optional<View> to = view_of(out);
     if (!to) return 1;
     const View from = *view_of(src); // the result's size: the source has pixels too
-    const int32_t s = static_cast<int32_t>((static_cast<int64_t>(w) + 3) & ~int64_t{3});
-    const size_t plane = checked_size(static_cast<uint64_t>(s), static_cast<uint64_t>(h));
-    Buffer<uint8_t> g = alloc_zeroed<uint8_t>(plane);
-    Buffer<uint8_t> u = alloc_zeroed<uint8_t>(plane);
-    Buffer<uint16_t> q = alloc_zeroed<uint16_t>(plane);
-    Buffer<int32_t> cols = alloc_buffer<int32_t>(2 * static_cast<size_t>(w));
-    if (!g || !u || !q || !cols) {
+    Buffer<uint8_t> g = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h)));
+    if (!g) {
         free_Image(dst, 0);
         return 0;
     }
-    with_format(from.bitCount, [&](auto f) { gray_plane<decltype(f)>(from, g.get(), s); });
-    Stats st;
-    local_stats(g.get(), u.get(), q.get(), w, h, s, cols.get(), cols.get() + w, st);
-    tone_map(g.get(), u.get(), q.get(), w, h, s, dark_threshold(st), bright_threshold(st));
-    with_format(to->bitCount, [&](auto f) { write_gray<decltype(f)>(*to, g.get(), s); });
+    drawing_gray_plane(from, g.get());
+    if (!with_format(to->bitCount, [&](auto f) { return photocopy<decltype(f)>(*to, g.get(), w, h); })) {
+        free_Image(dst, 0);
+        return 0;
+    }
     PX_Img_CopyAlpha(out, src);
     return 1;
 }

@@ -12,6 +12,7 @@
 #include "core/internal/pixel.hpp"
 #include "core/internal/rank.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "lines/lines_internal.hpp"
 
 using namespace pxfx;
@@ -28,10 +29,20 @@ constexpr int32_t kCrossMinWidth = 16, kBoxMinWidth = 7;
 // Rows 3 .. h - 4, columns 7 .. w - 9 (at least one): the 10th smallest of
 // the column's five pixels of rows y - 2 .. y + 2 and the fourteen other
 // pixels of row y in columns x - 7 .. x + 7. The rank is tracked along the
-// row.
+// row; where a selection network of the 19 values runs in vectors
+// (toolkit/median_vector.cpp), that runs along each row instead.
 bool cross_median(const View &img, const View &res) {
     const int32_t w = img.width, h = img.height;
     const int32_t x0 = 7, x1 = w - 9;
+    if (const vec::Cross19Row cross19 = vec::cross19_row()) {
+        for (int32_t y = 3; y <= h - 4; ++y) {
+            const uint8_t *rows[5];
+            for (int32_t d = 0; d < 5; ++d)
+                rows[d] = img.row(y - 2 + d) + x0;
+            cross19(rows, static_cast<size_t>(x1 - x0 + 1), res.row(y) + x0);
+        }
+        return true;
+    }
     Buffer<Hist> block = alloc_zeroed<Hist>(static_cast<size_t>(x1 - x0 + 1));
     if (!block) return false;
     Hist *const hists = block.get();
@@ -83,11 +94,21 @@ bool cross_median(const View &img, const View &res) {
 }
 
 // Rows 3 .. h - 4, columns 2 .. w - 5 (at least one): the 13th smallest of
-// the 5 x 5 block around the pixel. Each column's block histogram carries its
-// own rank down the picture.
+// the 5 x 5 block around the pixel, its median. Each column's block histogram
+// carries its own rank down the picture; where the 5 x 5 median has vector
+// code (toolkit/median_vector.cpp), that runs along each row instead.
 bool box_median(const View &img, const View &res) {
     const int32_t w = img.width, h = img.height;
     const int32_t x0 = 2, x1 = w - 5;
+    if (const vec::Median5Row median5 = vec::median5_row()) {
+        for (int32_t y = 3; y <= h - 4; ++y) {
+            const uint8_t *rows[5];
+            for (int32_t d = 0; d < 5; ++d)
+                rows[d] = img.row(y - 2 + d) + x0;
+            median5(rows, 1, static_cast<size_t>(x1 - x0 + 1), res.row(y) + x0);
+        }
+        return true;
+    }
     const int32_t cols = x1 - x0 + 1;
     Buffer<Hist> block = alloc_zeroed<Hist>(static_cast<size_t>(cols));
     Buffer<rank::Cursor> trackers = alloc_zeroed<rank::Cursor>(static_cast<size_t>(cols));

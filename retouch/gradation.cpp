@@ -4,13 +4,16 @@
 #include <pxfx/retouch.h>
 
 #include <cmath>
+#include <cstring>
 
+#include "core/internal/byte_map.hpp"
 #include "core/internal/channel_map.hpp"
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/vector_kernels.hpp"
 
 using namespace pxfx;
 
@@ -80,9 +83,7 @@ struct LocalScreen {
     uint8_t blend[256][256];  // [screen s][v]
 };
 
-template <class FS, class FD>
-void auto_levels(const View &src, const View &out, const int32_t map[256], int32_t amount, LocalScreen &t,
-                 uint32_t *rows) {
+void make_screen(const int32_t map[256], int32_t amount, LocalScreen &t) {
     for (int32_t i = 0; i < 256; ++i)
         t.map[i] = static_cast<uint8_t>(map[i]);
     for (int32_t n = 0; n < 256; ++n)
@@ -91,6 +92,25 @@ void auto_levels(const View &src, const View &out, const int32_t map[256], int32
     for (int32_t s = 0; s < 256; ++s)
         for (int32_t v = 0; v < 256; ++v)
             t.blend[s][v] = static_cast<uint8_t>((amount * s + (100 - amount) * v) / 100);
+}
+
+// The pixel of colour c whose neighbours are l and r (left, right), a and b
+// (above, below): each channel blended with the screen of its mapped value
+// and the rounded mean of its neighbours' mapped values; alpha kept.
+uint32_t level_pixel(const LocalScreen &t, uint32_t c, uint32_t l, uint32_t r, uint32_t a, uint32_t b) {
+    uint32_t res = c & 0xFF000000u;
+    for (uint32_t shift = 0; shift < 24; shift += 8) {
+        const uint32_t v = (c >> shift) & 255;
+        const uint32_t n = (t.map[(l >> shift) & 255] + t.map[(r >> shift) & 255] + t.map[(a >> shift) & 255] +
+                            t.map[(b >> shift) & 255] + 2) /
+                           4;
+        res |= static_cast<uint32_t>(t.blend[t.screen[n][t.map[v]]][v]) << shift;
+    }
+    return res;
+}
+
+// Edge pixels take themselves as their missing neighbours.
+template <class FS, class FD> void auto_levels(const View &src, const View &out, const LocalScreen &t, uint32_t *rows) {
     const int32_t w = src.width, h = src.height;
     uint32_t *up = rows, *cur = up + (w + 2), *down = cur + (w + 2);
     load_row<FS>(src, 0, cur);
@@ -99,18 +119,8 @@ void auto_levels(const View &src, const View &out, const int32_t map[256], int32
         up[i] = cur[i];
     for (int32_t y = 0; y < h; ++y) {
         const typename FD::Row o = FD::row(out, y);
-        for (int32_t x = 1; x <= w; ++x) {
-            const uint32_t c = cur[x], l = cur[x - 1], r = cur[x + 1], a = up[x], b = down[x];
-            uint32_t res = c & 0xFF000000u;
-            for (uint32_t shift = 0; shift < 24; shift += 8) {
-                const uint32_t v = (c >> shift) & 255;
-                const uint32_t n = (t.map[(l >> shift) & 255] + t.map[(r >> shift) & 255] + t.map[(a >> shift) & 255] +
-                                    t.map[(b >> shift) & 255] + 2) /
-                                   4;
-                res |= static_cast<uint32_t>(t.blend[t.screen[n][t.map[v]]][v]) << shift;
-            }
-            FD::store(o, x - 1, res);
-        }
+        for (int32_t x = 1; x <= w; ++x)
+            FD::store(o, x - 1, level_pixel(t, cur[x], cur[x - 1], cur[x + 1], up[x], down[x]));
         uint32_t *spare = up;
         up = cur;
         cur = down;
@@ -120,6 +130,43 @@ void auto_levels(const View &src, const View &out, const int32_t map[256], int32
         else
             for (int32_t i = 0; i < w + 2; ++i)
                 down[i] = cur[i];
+    }
+}
+
+// auto_levels for byte formats of 1, 3 or 4 bytes with the vector copy of
+// the rows, into a block apart from the source's. mapped holds three rows of
+// bytes, each source row through the levels map.
+template <class F>
+void auto_levels_rows(const View &src, const View &out, const LocalScreen &t, int32_t amount, vec::GradationRow run,
+                      uint8_t *mapped) {
+    constexpr int kChannels = static_cast<int>(F::kBitCount / 8);
+    const int32_t w = src.width, h = src.height;
+    const size_t bytes = static_cast<size_t>(w) * kChannels;
+    const uint8_t *const table[1] = {t.map};
+    uint8_t *up = mapped, *cur = up + bytes, *down = cur + bytes;
+    map_bytes(src.row(0), cur, bytes, 1, table);
+    std::memcpy(up, cur, bytes);
+    map_bytes(src.row(h > 1 ? 1 : 0), down, bytes, 1, table);
+    for (int32_t y = 0; y < h; ++y) {
+        const typename F::CRow above = F::crow(src, y > 0 ? y - 1 : 0), row = F::crow(src, y),
+                               below = F::crow(src, y + 1 < h ? y + 1 : h - 1);
+        const typename F::Row o = F::row(out, y);
+        const auto done = static_cast<int32_t>(run(row, up, cur, down, static_cast<size_t>(w), kChannels, amount, o));
+        auto pixel = [&](int32_t x) {
+            const uint32_t l = F::load(row, x > 0 ? x - 1 : 0), r = F::load(row, x + 1 < w ? x + 1 : w - 1);
+            F::store(o, x, level_pixel(t, F::load(row, x), l, r, F::load(above, x), F::load(below, x)));
+        };
+        pixel(0);
+        for (int32_t x = 1 + done; x < w; ++x)
+            pixel(x);
+        uint8_t *spare = up;
+        up = cur;
+        cur = down;
+        down = spare;
+        if (y + 2 < h)
+            map_bytes(src.row(y + 2), down, bytes, 1, table);
+        else
+            std::memcpy(down, cur, bytes);
     }
 }
 
@@ -192,9 +239,24 @@ int32_t ImageAutoGradationProcess(const Image *src, Image **dst, int32_t amount)
     with_format(in.bitCount, [&](auto f) { channel_histogram<decltype(f)>(in, hist); });
     int32_t map[256];
     make_mapping(hist, 0.0005f, 0.0005f, map);
-    with_formats(in, *out, [&](auto fs, auto fd) {
-        auto_levels<decltype(fs), decltype(fd)>(in, *out, map, amount, tables[0], rows.get());
-    });
+    make_screen(map, amount, tables[0]);
+    // The vector rows read the source as they write: only into a block of
+    // its own.
+    const uint32_t bits = in.bitCount;
+    const vec::GradationRow run = vec::gradation_row();
+    Buffer<uint8_t> mapped;
+    if (run != nullptr && blocks_apart(in, *out) && bits == out->bitCount && (bits == 8 || bits == 24 || bits == 32))
+        mapped = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(in.width), bits / 8, 3));
+    if (mapped) {
+        with_format(bits, [&](auto f) {
+            if constexpr (decltype(f)::kBitCount == 8 || decltype(f)::kBitCount >= 24)
+                auto_levels_rows<decltype(f)>(in, *out, tables[0], amount, run, mapped.get());
+        });
+    } else {
+        with_formats(in, *out, [&](auto fs, auto fd) {
+            auto_levels<decltype(fs), decltype(fd)>(in, *out, tables[0], rows.get());
+        });
+    }
     return 1;
 }
 

@@ -1,4 +1,5 @@
-// The 5 x 5 median of byte samples in vectors. The window's five columns are
+// The 5 x 5 median of byte samples in vectors, and the cross median of the
+// line filters. The window's five columns are
 // sorted first, once per row for every sample (each column serves five
 // results); then the values of equal rank across the window's columns are
 // sorted. Each value of the resulting 5 x 5 table then has every value above
@@ -148,6 +149,44 @@ void median5_row(const uint8_t *const *rows, int32_t channels, size_t n, uint8_t
     }
 }
 
+template <size_t... I> HWY_INLINE void select_cross(V (&v)[19], std::index_sequence<I...>) {
+    (compare_exchange(v[kSelect<19, 9>.ops[I].lo], v[kSelect<19, 9>.ops[I].hi]), ...);
+}
+
+// The cross median: the 19 values of a centre go through the selection
+// network, a vector of centres at a time; the last, partial vector is read
+// and written through the stack.
+void cross19_row(const uint8_t *const *rows, size_t n, uint8_t *out) {
+    const D d;
+    const size_t lanes = hn::Lanes(d);
+    HWY_ALIGN uint8_t part[HWY_MAX_BYTES];
+    for (size_t i = 0; i < n; i += lanes) {
+        const size_t m = std::min(lanes, n - i);
+        V v[19];
+        auto load = [&](int wire, const uint8_t *p) {
+            if (m == lanes) {
+                v[wire] = hn::LoadU(d, p);
+            } else {
+                std::memset(part, 0, sizeof part);
+                std::memcpy(part, p, m);
+                v[wire] = hn::Load(d, part);
+            }
+        };
+        for (int k = 0; k < 5; ++k)
+            load(k, rows[k] + i);
+        int wire = 5;
+        for (ptrdiff_t off = -7; off <= 7; ++off)
+            if (off != 0) load(wire++, rows[2] + static_cast<ptrdiff_t>(i) + off);
+        select_cross(v, std::make_index_sequence<kSelect<19, 9>.count>{});
+        if (m == lanes) {
+            hn::StoreU(v[kSelect<19, 9>.out], d, out + i);
+        } else {
+            hn::Store(v[kSelect<19, 9>.out], d, part);
+            std::memcpy(out + i, part, m);
+        }
+    }
+}
+
 } // namespace
 } // namespace pxfx::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
@@ -158,9 +197,11 @@ HWY_AFTER_NAMESPACE();
 namespace pxfx {
 namespace {
 HWY_EXPORT(median5_row);
+HWY_EXPORT(cross19_row);
 } // namespace
 
 vec::Median5Row vec::median5_row() { return PXFX_VECTOR_COPY(median5_row); }
+vec::Cross19Row vec::cross19_row() { return PXFX_VECTOR_COPY(cross19_row); }
 
 } // namespace pxfx
 #endif

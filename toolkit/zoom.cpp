@@ -30,24 +30,27 @@ struct WordSamples {
 
 // Doubles one source row horizontally: even columns copy X0, odd columns
 // average X0 and X0 + 1 (held at the last pixel), per sample of C channels.
-template <class S, int32_t C> void widen_row(const uint8_t *in, int32_t w, uint32_t *out) {
+// The samples keep their type: an average of two fits it.
+template <class S, int32_t C> void widen_row(const uint8_t *in, int32_t w, typename S::T *out) {
+    using T = typename S::T;
     for (int32_t x = 0; x < w; ++x) {
         const int32_t x1 = x + 1 < w ? x + 1 : w - 1;
         for (int32_t c = 0; c < C; ++c) {
             const uint32_t a = S::get(in, static_cast<size_t>(x) * C + c);
             const uint32_t b = S::get(in, static_cast<size_t>(x1) * C + c);
-            out[static_cast<size_t>(2 * x) * C + c] = a;
-            out[static_cast<size_t>(2 * x + 1) * C + c] = (a + b + 1) >> 1;
+            out[static_cast<size_t>(2 * x) * C + c] = static_cast<T>(a);
+            out[static_cast<size_t>(2 * x + 1) * C + c] = static_cast<T>((a + b + 1) >> 1);
         }
     }
 }
 
 template <class S, int32_t C> bool zoom_in(const View &src, const View &dst) {
+    using T = typename S::T;
     const int32_t w = src.width, h = src.height;
     const size_t n = static_cast<size_t>(2 * static_cast<int64_t>(w)) * C;
-    Buffer<uint32_t> rows = alloc_buffer<uint32_t>(2 * n);
+    Buffer<T> rows = alloc_buffer<T>(2 * n);
     if (!rows) return false;
-    uint32_t *top = rows.get(), *bottom = top + n;
+    T *top = rows.get(), *bottom = top + n;
     widen_row<S, C>(src.row(0), w, top);
     for (int32_t a = 0; a < h; ++a) {
         const int32_t b = a + 1 < h ? a + 1 : a;
@@ -56,7 +59,7 @@ template <class S, int32_t C> bool zoom_in(const View &src, const View &dst) {
         uint8_t *odd = dst.row(2 * a + 1);
         for (size_t i = 0; i < n; ++i) {
             S::put(even, i, top[i]);
-            S::put(odd, i, (top[i] + bottom[i] + 1) >> 1);
+            S::put(odd, i, (static_cast<uint32_t>(top[i]) + bottom[i] + 1) >> 1);
         }
         std::swap(top, bottom);
     }

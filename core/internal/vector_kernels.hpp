@@ -14,6 +14,10 @@ namespace pxfx::vec {
 // padded rows (2 * channels samples readable before and after), out[i] gets
 // the median of sample i for i < n.
 using Median5Row = void (*)(const uint8_t *const *rows, int32_t channels, size_t n, uint8_t *out);
+// Element 9 (from 0) of 19 bytes: for out[i], i < n, the bytes i of rows[0..4]
+// (a column of five rows) and the fourteen others of rows[2] from i - 7 to
+// i + 7 (rows[2] readable 7 bytes before and after).
+using Cross19Row = void (*)(const uint8_t *const *rows, size_t n, uint8_t *out);
 
 // Byte-table maps of core/internal/byte_map.hpp over whole vectors: they map
 // the first pixels, a multiple of the vector size, and return how many; the
@@ -31,14 +35,50 @@ using SplitPlanes = size_t (*)(const uint8_t *in, size_t pixels, uint8_t *p1, ui
 using CombinePlanes = size_t (*)(const uint8_t *p1, const uint8_t *p2, const uint8_t *p3, const uint8_t *alpha,
                                  size_t pixels, uint8_t *out);
 
+// Local means of a photocopy row: rows[0..4] are five gray rows of n + 4
+// samples; output i (column i + 2) is the 5 x 5 window centred there:
+// u[i] = its (1 2 4 2 1)^T (1 2 4 2 1) weighted sum / 100 and ratio[i] =
+// 1000 u[i] / (its sum / 25), or kNoRatio where that mean is 0. cols holds
+// 2 (n + 4) words of room. Does the first outputs, a multiple of the vector
+// size, and returns how many.
+inline constexpr int32_t kNoRatio = -1;
+using PhotocopyMeans = size_t (*)(const uint8_t *const *rows, size_t n, uint16_t *cols, uint8_t *u, int32_t *ratio);
+// The photocopy tone of gray[i] from u[i] and ratio[i] (as photocopy_means
+// gives them) under the dark and bright thresholds t1 (0 .. 990) and t2
+// (0 .. 1009), into out[i]; the first outputs of n, as above.
+using PhotocopyTone = size_t (*)(const uint8_t *gray, const uint8_t *u, const int32_t *ratio, size_t n, int32_t t1,
+                                 int32_t t2, uint8_t *out);
+
+// Auto levels with a local screen over one row of `pixels` pixels of
+// `channels` bytes (1, 3 or 4, the fourth alpha): cur is the row, mUp, mCur
+// and mDown the rows above, itself and below through the levels map. For
+// byte i of a pixel with both neighbours in the row, n = (mCur[i - channels]
+// + mCur[i + channels] + mUp[i] + mDown[i] + 2) / 4, the screen
+// s = 255 - (255 - n)(255 - mCur[i]) / 255, and out[i] = (amount s +
+// (100 - amount) cur[i]) / 100; alpha bytes are copied. Does pixels 1 .. k
+// for k a multiple of the vector size and returns k.
+using GradationRow = size_t (*)(const uint8_t *cur, const uint8_t *mUp, const uint8_t *mCur, const uint8_t *mDown,
+                                size_t pixels, int channels, int32_t amount, uint8_t *out);
+
+// The drawing gray of the first pixels of 3 or 4 bytes (blue, green, red
+// and alpha) into one byte each; does a multiple of the vector size and
+// returns how many.
+using DrawingGray = size_t (*)(const uint8_t *in, size_t pixels, uint8_t *out);
+
 #ifdef PXFX_PORTABLE_ONLY
 inline Median5Row median5_row() { return nullptr; }
+inline Cross19Row cross19_row() { return nullptr; }
 inline MapBytes map_bytes(int) { return nullptr; }
 inline ToneBytes tone_bytes(int) { return nullptr; }
 inline SplitPlanes split_planes(int, int) { return nullptr; }
 inline CombinePlanes combine_planes(int, int) { return nullptr; }
+inline PhotocopyMeans photocopy_means() { return nullptr; }
+inline PhotocopyTone photocopy_tone() { return nullptr; }
+inline GradationRow gradation_row() { return nullptr; }
+inline DrawingGray drawing_gray(int) { return nullptr; }
 #else
 Median5Row median5_row();
+Cross19Row cross19_row();
 // For pixels of `channels` bytes (1, 3 or 4; 3 or 4 for the tone map).
 MapBytes map_bytes(int channels);
 ToneBytes tone_bytes(int channels);
@@ -46,6 +86,11 @@ ToneBytes tone_bytes(int channels);
 // modes without vector code (RGB, XYZ).
 SplitPlanes split_planes(int mode, int channels);
 CombinePlanes combine_planes(int mode, int channels);
+PhotocopyMeans photocopy_means();
+PhotocopyTone photocopy_tone();
+GradationRow gradation_row();
+// For pixels of `channels` bytes, 3 or 4.
+DrawingGray drawing_gray(int channels);
 #endif
 
 } // namespace pxfx::vec

@@ -35,6 +35,13 @@ struct View {
     size_t block_bytes() const { return pitch * static_cast<size_t>(height); }
 };
 
+// Whether two views' pixel blocks share no byte, so that a kernel may write
+// one in any order while it reads the other.
+inline bool blocks_apart(const View &a, const View &b) {
+    const auto pa = reinterpret_cast<uintptr_t>(a.bits), pb = reinterpret_cast<uintptr_t>(b.bits);
+    return pa + a.block_bytes() <= pb || pb + b.block_bytes() <= pa;
+}
+
 // The view of a record with pixels (has_pixels), else nothing. The view may
 // write: a caller's const record still points at writable pixels, and the
 // functions that write through a view of it are those that own the result.

@@ -218,3 +218,66 @@ TEST(Dispatch, PlaneRowsMatchThePlainCode) {
                             << bits << " bits, width " << width << ", few " << few << ", " << i << ", path " << p;
             }
 }
+
+// Photocopy's local means and tones at every width around the vector sizes,
+// on noise whose upper rows are nearly black (means of 0, ratios far apart).
+TEST(Dispatch, PhotocopyMatchesThePlainLoops) {
+    for (int32_t bits : pxtest::kBitCounts)
+        for (int32_t height : {5, 11})
+            for (int32_t width = 1; width <= 70; ++width) {
+                const Owned src = pxtest::random_image(width, height, bits, static_cast<uint32_t>(width * 64 + bits));
+                for (size_t i = 0; i < 4 * static_cast<size_t>(src->pitch); ++i)
+                    src->bits[i] >>= 6;
+                const auto runs = on_every_path([&] {
+                    Image *out = nullptr;
+                    EXPECT_EQ(PX_IMG_Photocopy(src.get(), &out), 1u);
+                    return Owned(out);
+                });
+                for (size_t p = 1; p < runs.size(); ++p)
+                    EXPECT_EQ(pxtest::diff(runs[p].get(), runs[0].get()), "")
+                        << bits << " bits, " << width << " x " << height << ", path " << p;
+            }
+}
+
+// Auto gradation's rows at every width around the vector sizes, for each
+// format the vector rows take and one they leave to the plain loop.
+TEST(Dispatch, AutoGradationMatchesThePlainLoop) {
+    for (int32_t bits : pxtest::kBitCounts)
+        for (int32_t height : {1, 3, 7})
+            for (int32_t width = 1; width <= 70; ++width) {
+                const Owned src = pxtest::random_image(width, height, bits, static_cast<uint32_t>(width * 8 + height));
+                const auto runs = on_every_path([&] {
+                    Image *out = nullptr;
+                    EXPECT_EQ(ImageAutoGradationProcess(src.get(), &out, 60), 1);
+                    return Owned(out);
+                });
+                for (size_t p = 1; p < runs.size(); ++p)
+                    EXPECT_EQ(pxtest::diff(runs[p].get(), runs[0].get()), "")
+                        << bits << " bits, " << width << " x " << height << ", path " << p;
+            }
+}
+
+// The line filters' medians (selection networks in vectors where they run)
+// at every width around the vector sizes.
+TEST(Dispatch, LineMediansMatchTheHistograms) {
+    std::mt19937 rng(21);
+    for (int32_t height : {7, 11})
+        for (int32_t width = 1; width <= 70; ++width)
+            for (int levels : {256, 3}) {
+                const Owned src = pxtest::random_image(width, height, 8, rng());
+                for (int32_t y = 0; y < height; ++y)
+                    for (int32_t x = 0; x < width; ++x)
+                        src->bits[static_cast<size_t>(y) * src->pitch + x] %= levels;
+                const auto runs = on_every_path([&] {
+                    Image *cross = nullptr, *box = nullptr;
+                    EXPECT_EQ(MyFliter(src.get(), &cross) + MyFliter1(src.get(), &box), 2);
+                    return std::pair(Owned(cross), Owned(box));
+                });
+                for (size_t p = 1; p < runs.size(); ++p) {
+                    EXPECT_EQ(pxtest::diff(runs[p].first.get(), runs[0].first.get()), "")
+                        << "cross, " << width << " x " << height << ", levels " << levels << ", path " << p;
+                    EXPECT_EQ(pxtest::diff(runs[p].second.get(), runs[0].second.get()), "")
+                        << "box, " << width << " x " << height << ", levels " << levels << ", path " << p;
+                }
+            }
+}
