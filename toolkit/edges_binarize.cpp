@@ -20,10 +20,10 @@ template <class F> bool edge_filter(const View &v) {
     Buffer<int32_t> acc = alloc_buffer<int32_t>(n);
     if (!win.ok() || !acc) return false;
     const typename F::T *rows[3];
+    const vec::ConvolveBytes vector = vec::convolve_bytes();
     for (int32_t y = 0; y < v.height; ++y) {
         win.rows_for(y, rows);
-        convolve_row(rows, kEdge, 3, F::kChannels, n, acc.get());
-        store_row<F>(v, y, acc.get(), n, [](int32_t s) { return s >> 2; });
+        convolve_store<F>(v, y, rows, kEdge, 3, 2, vector, acc.get());
     }
     return true;
 }

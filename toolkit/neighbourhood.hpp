@@ -11,6 +11,7 @@
 
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "toolkit/pximage_check.hpp"
 
 namespace pxfx::packed {
@@ -151,6 +152,21 @@ void convolve_row(const T *const *rows, const int32_t *kernel, int32_t size, int
             for (size_t i = 0; i < n; ++i)
                 acc[i] += k * static_cast<int32_t>(src[i]);
         }
+}
+
+// Row y of the view from its window rows convolved with `kernel` (size x size
+// weights whose magnitudes sum to at most 128), each sum shifted right by
+// `shift` and clamped to the format's range. Byte samples go through
+// `vector` (vec::convolve_bytes(), picked once per call) where it takes the
+// row; `acc` has room for a row of sums.
+template <class F>
+void convolve_store(const View &v, int32_t y, const typename F::T *const *rows, const int32_t *kernel, int32_t size,
+                    int32_t shift, vec::ConvolveBytes vector, int32_t *acc) {
+    const size_t n = static_cast<size_t>(v.width) * F::kChannels;
+    if constexpr (sizeof(typename F::T) == 1)
+        if (vector != nullptr && vector(rows, kernel, size, F::kChannels, n, shift, v.row(y))) return;
+    convolve_row(rows, kernel, size, F::kChannels, n, acc);
+    store_row<F>(v, y, acc, n, [shift](int32_t s) { return s >> shift; });
 }
 
 // acc[i] = sum of the size x size window around sample i; `cols` holds

@@ -37,6 +37,7 @@ template <class F> bool sharpen(const View &v, int32_t size) {
     if (!win.ok() || !acc || !cols) return false;
     const typename F::T *rows[7];
     const int32_t first = size == 7 ? kSharpen7FirstRow : 0;
+    const vec::ConvolveBytes vector = vec::convolve_bytes();
     for (int32_t y = first; y < v.height; ++y) {
         win.rows_for(y, rows);
         if (size == 7) {
@@ -44,10 +45,10 @@ template <class F> bool sharpen(const View &v, int32_t size) {
             const typename F::T *centre = rows[3];
             for (size_t i = 0; i < n; ++i)
                 acc[i] = 50 * static_cast<int32_t>(centre[i]) - acc[i];
+            store_row<F>(v, y - first, acc.get(), n, [](int32_t s) { return s; });
         } else {
-            convolve_row(rows, size == 3 ? kSharpen3 : kSharpen5, size, F::kChannels, n, acc.get());
+            convolve_store<F>(v, y, rows, size == 3 ? kSharpen3 : kSharpen5, size, 0, vector, acc.get());
         }
-        store_row<F>(v, y - first, acc.get(), n, [](int32_t s) { return s; });
     }
     return true;
 }

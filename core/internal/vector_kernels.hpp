@@ -21,15 +21,27 @@ using Median5Row = void (*)(const uint8_t *const *rows, int32_t channels, size_t
 using MapBytes = size_t (*)(const uint8_t *in, uint8_t *out, size_t pixels, const uint8_t *const *tables);
 using ToneBytes = size_t (*)(const uint8_t *in, uint8_t *out, size_t pixels, const ToneTables &t);
 
+// Convolution of byte samples with a kernel of size x size weights (size at
+// most 7): out[i] = the sum of kernel[ky * size + kx] *
+// rows[ky][i + (kx - size / 2) * channels], shifted right by `shift` and
+// clamped to 0..255, for i < n; rows are the window's padded rows, out is none
+// of them. The sums are held in 16 bits: 255 times the sum of the weights'
+// magnitudes must stay below 32768. Rows shorter than a vector are left to
+// the plain loop (false, nothing written).
+using ConvolveBytes = bool (*)(const uint8_t *const *rows, const int32_t *kernel, int32_t size, int32_t channels,
+                               size_t n, int32_t shift, uint8_t *out);
+
 #ifdef PXFX_PORTABLE_ONLY
 inline Median5Row median5_row() { return nullptr; }
 inline MapBytes map_bytes(int) { return nullptr; }
 inline ToneBytes tone_bytes(int) { return nullptr; }
+inline ConvolveBytes convolve_bytes() { return nullptr; }
 #else
 Median5Row median5_row();
 // For pixels of `channels` bytes (1, 3 or 4; 3 or 4 for the tone map).
 MapBytes map_bytes(int channels);
 ToneBytes tone_bytes(int channels);
+ConvolveBytes convolve_bytes();
 #endif
 
 } // namespace pxfx::vec

@@ -167,3 +167,26 @@ TEST(Dispatch, MedianMatchesThePlainNetwork) {
                         << bits << " bits, width " << width << ", levels " << levels << ", path " << p;
             }
 }
+
+// The window convolutions (PXImage_Sharpen's 3 x 3 and 5 x 5 kernels and
+// PXImage_EdgeDetection) at every width up to past two 32-byte vectors, on
+// noise, whose sums leave 0..255 both ways.
+TEST(Dispatch, WindowConvolutionsMatchThePlainLoops) {
+    std::mt19937 rng(13);
+    for (int32_t bits : {8, 16, 24})
+        for (int32_t width = 1; width <= 70; ++width) {
+            const pxtest::PX src = pxtest::px_random(width, 3 + 2 * (width % 3), bits, rng());
+            const auto runs = on_every_path([&] {
+                std::vector<std::vector<uint8_t>> out;
+                for (int32_t strength : {0, 20, 60}) {
+                    const pxtest::PX img = pxtest::px_clone(src.get());
+                    EXPECT_EQ(strength == 0 ? PXImage_EdgeDetection(img.get()) : PXImage_Sharpen(img.get(), strength),
+                              1);
+                    out.push_back(pxtest::bytes(img.get()));
+                }
+                return out;
+            });
+            for (size_t p = 1; p < runs.size(); ++p)
+                EXPECT_EQ(runs[p], runs[0]) << bits << " bits, width " << width << ", path " << p;
+        }
+}
