@@ -31,17 +31,32 @@ using ToneBytes = size_t (*)(const uint8_t *in, uint8_t *out, size_t pixels, con
 using ConvolveBytes = bool (*)(const uint8_t *const *rows, const int32_t *kernel, int32_t size, int32_t channels,
                                size_t n, int32_t shift, uint8_t *out);
 
+// One row of box means of byte samples, for boxes of size x size with size 2
+// .. 11 (kMinBoxBytes .. kMaxBoxBytes). cols holds the 16-bit column sums of
+// the row's boxes, `channels` interleaved, for the pixels -size / 2 ..
+// width - 1 + size - 1 - size / 2; the n = width x channels sums of the
+// pixels 0 .. width - 1 start at cols + size / 2 x channels and are the ones
+// kept: when `in` is not null they first add the entering row's samples and
+// subtract the leaving row `gone`'s, then the others repeat the edge pixels'.
+// out[i] = the sum of the box of sample i divided by size^2, truncated, plus
+// `offset`, clamped to 0..255. out may be `in` or `gone`.
+using BoxBytes = void (*)(const uint8_t *in, const uint8_t *gone, uint16_t *cols, size_t n, int32_t size,
+                          int32_t channels, int32_t offset, uint8_t *out);
+inline constexpr int32_t kMinBoxBytes = 2, kMaxBoxBytes = 11;
+
 #ifdef PXFX_PORTABLE_ONLY
 inline Median5Row median5_row() { return nullptr; }
 inline MapBytes map_bytes(int) { return nullptr; }
 inline ToneBytes tone_bytes(int) { return nullptr; }
 inline ConvolveBytes convolve_bytes() { return nullptr; }
+inline BoxBytes box_bytes() { return nullptr; }
 #else
 Median5Row median5_row();
 // For pixels of `channels` bytes (1, 3 or 4; 3 or 4 for the tone map).
 MapBytes map_bytes(int channels);
 ToneBytes tone_bytes(int channels);
 ConvolveBytes convolve_bytes();
+BoxBytes box_bytes();
 #endif
 
 } // namespace pxfx::vec

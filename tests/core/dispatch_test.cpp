@@ -190,3 +190,32 @@ TEST(Dispatch, WindowConvolutionsMatchThePlainLoops) {
                 EXPECT_EQ(runs[p], runs[0]) << bits << " bits, width " << width << ", path " << p;
         }
 }
+
+// Filter_fast at every width up to past four 16-byte and two 32-byte vectors
+// of sums, odd heights, box sizes around those the vector sums take and a
+// large one, in place and through the working image (a record narrower than
+// its pitch), offsets that move the means both ways.
+TEST(Dispatch, BoxMeansMatchThePlainLoops) {
+    constexpr int32_t kSizes[] = {1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 31};
+    for (int32_t bits : {8, 24, 32})
+        for (int32_t width = 1; width <= 70; ++width) {
+            const int32_t height = 1 + 2 * (width % 4), offset = (width % 3 - 1) * 40;
+            const Owned fresh = pxtest::random_image(width, height, bits, static_cast<uint32_t>(width * bits));
+            const Owned wide = pxtest::random_image(width + 4, height, bits, static_cast<uint32_t>(width + bits));
+            const auto runs = on_every_path([&] {
+                std::vector<Owned> out;
+                for (int32_t size : kSizes)
+                    for (const Image *src : {fresh.get(), wide.get()}) {
+                        out.push_back(pxtest::clone(src));
+                        Image narrow = *out.back();
+                        narrow.width = width;
+                        EXPECT_EQ(Filter_fast(&narrow, size, offset), 1);
+                    }
+                return out;
+            });
+            for (size_t p = 1; p < runs.size(); ++p)
+                for (size_t i = 0; i < runs[0].size(); ++i)
+                    EXPECT_EQ(pxtest::diff(runs[p][i].get(), runs[0][i].get()), "")
+                        << bits << " bits, width " << width << ", size " << kSizes[i / 2] << ", path " << p;
+        }
+}
