@@ -46,8 +46,7 @@ bool plane_stats(const uint8_t *plane, int32_t width, int32_t height, PlaneStats
     if (plane == nullptr || width <= 0 || height <= 0) return false;
     if (checked_size(static_cast<uint64_t>(width), static_cast<uint64_t>(height)) == 0) return false;
     const size_t n = static_cast<size_t>(width) * static_cast<size_t>(height);
-    count_levels(
-        n, [plane](size_t i) { return plane[i]; }, s.hist);
+    count_levels(n, s.hist, [plane](size_t i) { return plane[i]; });
     s.t = otsu_threshold(s.hist);
     s.below = 0;
     for (int32_t i = 0; i < s.t; ++i)

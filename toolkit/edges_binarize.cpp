@@ -60,23 +60,20 @@ int32_t PXImage_GrayToBinarization(PXImage *img) {
     // field of 16-bit ones.
     uint32_t hist[256];
     if (bits == 8) {
-        count_levels(
-            pixels, [d](size_t i) { return d[i]; }, hist);
+        count_levels(pixels, hist, [d](size_t i) { return d[i]; });
         const auto t = static_cast<uint8_t>(otsu_threshold(hist));
         for (size_t i = 0; i < pixels; ++i)
             d[i] = d[i] > t ? 255 : 0;
     } else if (bits == 24) {
-        count_levels(
-            pixels, [d](size_t i) { return d[3 * i + 1]; }, hist);
+        count_levels(pixels, hist, [d](size_t i) { return d[3 * i + 1]; });
         const auto t = static_cast<uint8_t>(otsu_threshold(hist));
         for (size_t i = 0; i < pixels; ++i) {
             const uint8_t v = d[3 * i + 1] > t ? 255 : 0;
             d[3 * i] = d[3 * i + 1] = d[3 * i + 2] = v;
         }
     } else {
-        count_levels(
-            pixels, [d](size_t i) { return word_gray(load16(d + 2 * i)); }, hist);
-        const auto t = static_cast<uint32_t>(otsu_threshold(hist) & 0xFF);
+        count_levels(pixels, hist, [d](size_t i) { return word_gray(load16(d + 2 * i)); });
+        const auto t = static_cast<uint8_t>(otsu_threshold(hist));
         for (size_t i = 0; i < pixels; ++i)
             store16(d + 2 * i, word_gray(load16(d + 2 * i)) > t ? 65535 : 0);
     }

@@ -10,7 +10,7 @@ namespace pxfx::packed {
 // hist[v] = the number of i < n with level(i) == v (modulo 2^32). Four
 // sub-histograms take turns, so that runs of equal levels do not wait on the
 // store of the count before.
-template <class Level> void count_levels(size_t n, Level level, uint32_t (&hist)[256]) {
+template <class Level> void count_levels(size_t n, uint32_t (&hist)[256], Level level) {
     uint32_t sub[4][256] = {};
     size_t i = 0;
     for (; i + 4 <= n; i += 4) {

@@ -124,8 +124,8 @@ extern "C" {
 int32_t ProbabilityDensityValue(const uint8_t *plane, int32_t width, int32_t height) {
     if (plane == nullptr || width <= 0 || height <= 0) return kNoThreshold;
     uint32_t hist[256];
-    count_levels(
-        static_cast<size_t>(width) * static_cast<size_t>(height), [plane](size_t i) { return plane[i]; }, hist);
+    count_levels(static_cast<size_t>(width) * static_cast<size_t>(height), hist,
+                 [plane](size_t i) { return plane[i]; });
     return otsu_threshold(hist);
 }
 
