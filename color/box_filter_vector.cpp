@@ -1,9 +1,8 @@
 // One row of box means of byte samples in vectors of 16-bit sums: the column
 // sums take the entering row and give up the leaving one, then every box sum
 // is added up from its columns, which leaves no running sum along the row to
-// wait on. The mean divides by size^2 through a multiply-shift that is exact
-// over every sum of the box (the proof below) and narrows with saturation,
-// which is the clamp to 0..255.
+// wait on. The mean divides by size^2 through the multiply-shift of
+// byte_sum_divisor and narrows with saturation, which is the clamp to 0..255.
 #ifndef PXFX_PORTABLE_ONLY
 
 #undef HWY_TARGET_INCLUDE
@@ -14,6 +13,7 @@
 #include <algorithm>
 #include <cstring>
 
+#include "core/internal/math.hpp"
 #include "core/internal/vector_kernels.hpp"
 
 HWY_BEFORE_NAMESPACE();
@@ -48,23 +48,13 @@ void box_row(const uint8_t *in, const uint8_t *gone, uint16_t *cols, size_t n, i
     for (size_t k = 0; k < trail; ++k)
         own[n + k] = own[n - c + k % c];
 
-    // floor(s / a) for the area a = size^2 (4 .. 121) and every box sum
-    // s <= 255 a: with 2^p < a <= 2^(p+1), k = 16 + p and
-    // m = ceil(2^k / a) < 2^16, the error e = m a - 2^k is below a, so
-    // s m / 2^k = s / a + s e / (a 2^k) where s e <= 255 a (a - 1)
-    // < 2^15 a <= 2^k: the excess stays below 1 / a and cannot carry past the
-    // next multiple of 1 / a. MulHigh gives floor(s m / 2^16), the shift by p
-    // the rest.
-    const auto area = static_cast<uint32_t>(size * size);
-    int32_t p = 0;
-    while ((2u << p) < area)
-        ++p;
-    const auto m = static_cast<uint16_t>(((1u << (16 + p)) + area - 1) / area);
+    // Exact over the box sums: areas of 4 .. 121.
+    const ByteSumDivisor div = byte_sum_divisor(static_cast<uint32_t>(size * size));
     // Quotients are at most 255: offsets beyond +-256 clamp alike.
     const auto off = hn::Set(di, static_cast<int16_t>(std::clamp(offset, -256, 256)));
-    const auto mul = hn::Set(d, m);
+    const auto mul = hn::Set(d, div.m);
     auto store = [&](hn::Vec<DU> s, uint8_t *to) {
-        const auto q = hn::BitCast(di, hn::ShiftRightSame(hn::MulHigh(s, mul), p));
+        const auto q = hn::BitCast(di, hn::ShiftRightSame(hn::MulHigh(s, mul), div.p));
         hn::StoreU(hn::DemoteTo(d8, hn::Add(q, off)), d8, to);
     };
     auto mean = [&](const uint16_t *col, uint8_t *to) {

@@ -1,7 +1,8 @@
-// Convolution of byte samples with a small integer kernel in vectors of
-// 16-bit sums: each sample is widened once per tap, the taps of weight 1 and
-// -1 are added and subtracted, the others multiplied. The sums are shifted
-// and narrowed with saturation, which is the clamp to 0..255.
+// Window filters of byte samples in vectors of 16-bit sums, narrowed with
+// saturation, which is the clamp to 0..255. The convolution widens each
+// sample once per tap, adds and subtracts the taps of weight 1 and -1 and
+// multiplies the others. The box sums go through strips of column sums on
+// the stack, each box added up from its columns.
 #ifndef PXFX_PORTABLE_ONLY
 
 #undef HWY_TARGET_INCLUDE
@@ -9,6 +10,9 @@
 #include <hwy/foreach_target.h> // IWYU pragma: keep
 #include <hwy/highway.h>
 
+#include <algorithm>
+
+#include "core/internal/math.hpp"
 #include "core/internal/vector_kernels.hpp"
 
 #ifndef PXFX_NEIGHBOURHOOD_VECTOR_TAPS
@@ -41,6 +45,11 @@ struct Taps {
             }
     }
 };
+
+// Samples per strip of box column sums, with room for the box's reach (3
+// pixels of at most 3 channels each side).
+constexpr size_t kStrip = 1024;
+constexpr size_t kStripColumns = kStrip + 2 * 3 * 3;
 
 } // namespace
 } // namespace pxfx
@@ -81,6 +90,51 @@ bool convolve(const uint8_t *const *rows, const int32_t *kernel, int32_t size, i
     return true;
 }
 
+bool window_box(const uint8_t *const *rows, int32_t size, int32_t channels, size_t n, int32_t centre, uint8_t *out) {
+    const D16 d;
+    const D8 d8;
+    using DU = hn::RebindToUnsigned<D16>;
+    const DU du;
+    const size_t lanes = hn::Lanes(d);
+    if (n < lanes) return false;
+    const auto c = static_cast<size_t>(channels);
+    const size_t reach = static_cast<size_t>(size / 2) * c;
+    const ByteSumDivisor div = byte_sum_divisor(static_cast<uint32_t>(size * size));
+    HWY_ALIGN uint16_t cols[kStripColumns];
+    // Whole vectors from `first` to `end`, the last one ending at `end`
+    // (end - first >= lanes); vectors written twice get the same values.
+    auto each_vector = [lanes](size_t first, size_t end, auto body) {
+        size_t i = first;
+        for (; i + lanes <= end; i += lanes)
+            body(i);
+        if (i < end) body(end - lanes);
+    };
+    for (size_t start = 0; start < n; start += kStrip) {
+        // A short last strip starts earlier, so that it holds a vector.
+        const size_t first = n - start < lanes ? n - lanes : start, len = std::min(kStrip, n - first);
+        // cols[k] = the column sum of sample first - reach + k.
+        each_vector(0, len + 2 * reach, [&](size_t k) {
+            const ptrdiff_t at = static_cast<ptrdiff_t>(first + k) - static_cast<ptrdiff_t>(reach);
+            auto s = hn::PromoteTo(du, hn::LoadU(d8, rows[0] + at));
+            for (int32_t ky = 1; ky < size; ++ky)
+                s = hn::Add(s, hn::PromoteTo(du, hn::LoadU(d8, rows[ky] + at)));
+            hn::StoreU(s, du, cols + k);
+        });
+        each_vector(0, len, [&](size_t k) {
+            auto box = hn::LoadU(du, cols + k);
+            for (int32_t kx = 1; kx < size; ++kx)
+                box = hn::Add(box, hn::LoadU(du, cols + k + static_cast<size_t>(kx) * c));
+            const auto r = [&] {
+                if (centre == 0) return hn::BitCast(d, hn::ShiftRightSame(hn::MulHigh(box, hn::Set(du, div.m)), div.p));
+                const auto mid = hn::PromoteTo(d, hn::LoadU(d8, rows[size / 2] + first + k));
+                return hn::Sub(hn::Mul(hn::Set(d, static_cast<int16_t>(centre)), mid), hn::BitCast(d, box));
+            }();
+            hn::StoreU(hn::DemoteTo(d8, r), d8, out + first + k);
+        });
+    }
+    return true;
+}
+
 } // namespace
 } // namespace pxfx::HWY_NAMESPACE
 HWY_AFTER_NAMESPACE();
@@ -91,9 +145,11 @@ HWY_AFTER_NAMESPACE();
 namespace pxfx {
 namespace {
 HWY_EXPORT(convolve);
+HWY_EXPORT(window_box);
 } // namespace
 
 vec::ConvolveBytes vec::convolve_bytes() { return PXFX_VECTOR_COPY(convolve); }
+vec::WindowBoxBytes vec::window_box_bytes() { return PXFX_VECTOR_COPY(window_box); }
 
 } // namespace pxfx
 #endif

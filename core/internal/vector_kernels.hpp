@@ -31,6 +31,16 @@ using ToneBytes = size_t (*)(const uint8_t *in, uint8_t *out, size_t pixels, con
 using ConvolveBytes = bool (*)(const uint8_t *const *rows, const int32_t *kernel, int32_t size, int32_t channels,
                                size_t n, int32_t shift, uint8_t *out);
 
+// Box sums of byte samples over a window of size x size (3, 5 or 7; channels
+// 1 or 3): box(i) = the sum of rows[ky][i + (kx - size / 2) * channels] over
+// the window, rows being the window's padded rows. For i < n, with `centre`
+// 0 out[i] = box(i) / size^2, truncated; else out[i] = centre *
+// rows[size / 2][i] - box(i) clamped to 0..255 (centre at most 128). out is
+// none of the rows. Rows shorter than a vector are left to the plain loop
+// (false, nothing written).
+using WindowBoxBytes = bool (*)(const uint8_t *const *rows, int32_t size, int32_t channels, size_t n, int32_t centre,
+                                uint8_t *out);
+
 // One row of box means of byte samples, for boxes of size x size with size 2
 // .. 11 (kMinBoxBytes .. kMaxBoxBytes). cols holds the 16-bit column sums of
 // the row's boxes, `channels` interleaved, for the pixels -size / 2 ..
@@ -49,6 +59,7 @@ inline Median5Row median5_row() { return nullptr; }
 inline MapBytes map_bytes(int) { return nullptr; }
 inline ToneBytes tone_bytes(int) { return nullptr; }
 inline ConvolveBytes convolve_bytes() { return nullptr; }
+inline WindowBoxBytes window_box_bytes() { return nullptr; }
 inline BoxBytes box_bytes() { return nullptr; }
 #else
 Median5Row median5_row();
@@ -56,6 +67,7 @@ Median5Row median5_row();
 MapBytes map_bytes(int channels);
 ToneBytes tone_bytes(int channels);
 ConvolveBytes convolve_bytes();
+WindowBoxBytes window_box_bytes();
 BoxBytes box_bytes();
 #endif
 

@@ -168,27 +168,36 @@ TEST(Dispatch, MedianMatchesThePlainNetwork) {
             }
 }
 
-// The window convolutions (PXImage_Sharpen's 3 x 3 and 5 x 5 kernels and
-// PXImage_EdgeDetection) at every width up to past two 32-byte vectors, on
-// noise, whose sums leave 0..255 both ways.
-TEST(Dispatch, WindowConvolutionsMatchThePlainLoops) {
+// The window filters (PXImage_Sharpen's three kernels, the mean smoothing
+// of PXImage_Smooth, PXImage_EdgeDetection) at every width up to past two
+// 32-byte vectors and across the strips of the box sums, on noise, whose
+// sums leave 0..255 both ways: on pictures lower than the windows and on
+// pictures past the 7 x 7 kernel's first row.
+TEST(Dispatch, WindowFiltersMatchThePlainLoops) {
     std::mt19937 rng(13);
+    std::vector<int32_t> widths = {345, 1030};
+    for (int32_t width = 1; width <= 70; ++width)
+        widths.push_back(width);
     for (int32_t bits : {8, 16, 24})
-        for (int32_t width = 1; width <= 70; ++width) {
-            const pxtest::PX src = pxtest::px_random(width, 3 + 2 * (width % 3), bits, rng());
-            const auto runs = on_every_path([&] {
-                std::vector<std::vector<uint8_t>> out;
-                for (int32_t strength : {0, 20, 60}) {
-                    const pxtest::PX img = pxtest::px_clone(src.get());
-                    EXPECT_EQ(strength == 0 ? PXImage_EdgeDetection(img.get()) : PXImage_Sharpen(img.get(), strength),
-                              1);
-                    out.push_back(pxtest::bytes(img.get()));
-                }
-                return out;
-            });
-            for (size_t p = 1; p < runs.size(); ++p)
-                EXPECT_EQ(runs[p], runs[0]) << bits << " bits, width " << width << ", path " << p;
-        }
+        for (int32_t width : widths)
+            for (int32_t height : {1 + 2 * (width % 3), 51 + 2 * (width % 2)}) {
+                const pxtest::PX src = pxtest::px_random(width, height, bits, rng());
+                const auto runs = on_every_path([&] {
+                    std::vector<std::vector<uint8_t>> out;
+                    for (int32_t strength : {20, 60, 90, -10, -30, -50, 0}) {
+                        const pxtest::PX img = pxtest::px_clone(src.get());
+                        PXImage *p = img.get();
+                        EXPECT_EQ(strength > 0   ? PXImage_Sharpen(p, strength)
+                                  : strength < 0 ? PXImage_Smooth(p, -strength)
+                                                 : PXImage_EdgeDetection(p),
+                                  1);
+                        out.push_back(pxtest::bytes(p));
+                    }
+                    return out;
+                });
+                for (size_t p = 1; p < runs.size(); ++p)
+                    EXPECT_EQ(runs[p], runs[0]) << bits << " bits, " << width << " x " << height << ", path " << p;
+            }
 }
 
 // Filter_fast at every width up to past four 16-byte and two 32-byte vectors
