@@ -18,6 +18,7 @@
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "core/internal/view.hpp"
 
 using namespace pxfx;
@@ -102,28 +103,57 @@ void row_means(const Sum *col, Sum *diff, int32_t w, const Box &box, const MeanF
 // replaces the source (dst == src), every source row is saved in `ring`
 // (ringRows rows, at least half + 2 or the whole height) before it is
 // overwritten, and the rows leaving the box are read back from there.
-template <class Sum, int Bpp, class MeanFn>
-void running_box(const View &src, const View &dst, const Box &box, const MeanFn &mean, Sum *col, uint8_t *ring,
+// `sums` holds the column sums: sums.set(j, s) starts sum j (of width x
+// channels) at the top row's box, sums.row(in, gone, out) adds the entering
+// row, subtracts the leaving one (both null for row 0) and writes the means.
+template <class Sum, class Sums>
+void running_box(const View &src, const View &dst, const Box &box, size_t n, Sums &sums, uint8_t *ring,
                  int32_t ringRows) {
-    const int32_t w = src.width, h = src.height;
-    const size_t n = static_cast<size_t>(w) * Bpp;
-    for (size_t j = 0; j < n; ++j) {
-        col[j] =
-            clamped_sum<Sum>(box.first(0), box.last(0), h, [&](int32_t r) { return static_cast<Sum>(src.row(r)[j]); });
-    }
+    const int32_t h = src.height;
+    for (size_t j = 0; j < n; ++j)
+        sums.set(j, clamped_sum<Sum>(box.first(0), box.last(0), h,
+                                     [&](int32_t r) { return static_cast<Sum>(src.row(r)[j]); }));
     for (int32_t y = 0; y < h; ++y) {
         if (ring != nullptr) std::memcpy(ring + static_cast<size_t>(y % ringRows) * n, src.row(y), n);
+        const uint8_t *in = nullptr, *gone = nullptr;
         if (y > 0) {
             // The entering row is at or below y, so it still holds source pixels.
-            const uint8_t *in = src.row(clamp_coord(box.last(y), h));
+            in = src.row(clamp_coord(box.last(y), h));
             const int32_t r = clamp_coord(box.first(y) - 1, h);
-            const uint8_t *gone = ring != nullptr ? ring + static_cast<size_t>(r % ringRows) * n : src.row(r);
-            for (size_t j = 0; j < n; ++j)
-                col[j] += static_cast<Sum>(in[j]) - static_cast<Sum>(gone[j]);
+            gone = ring != nullptr ? ring + static_cast<size_t>(r % ringRows) * n : src.row(r);
         }
-        row_means<Sum, Bpp>(col, col + n, w, box, mean, dst.row(y));
+        sums.row(in, gone, dst.row(y));
     }
 }
+
+// Column sums of Sum with the row means of row_means.
+template <class Sum, int Bpp, class MeanFn> struct PlainSums {
+    Sum *col; // n sums, then room for a row of their differences
+    size_t n;
+    int32_t width;
+    Box box;
+    MeanFn mean;
+    void set(size_t j, Sum s) { col[j] = s; }
+    void row(const uint8_t *in, const uint8_t *gone, uint8_t *out) {
+        if (in != nullptr)
+            for (size_t j = 0; j < n; ++j)
+                col[j] += static_cast<Sum>(in[j]) - static_cast<Sum>(gone[j]);
+        row_means<Sum, Bpp>(col, col + n, width, box, mean, out);
+    }
+};
+
+// 16-bit column sums padded with the edge pixels' for vec::BoxBytes.
+struct VectorSums {
+    vec::BoxBytes kernel;
+    uint16_t *cols;
+    size_t n;
+    Box box;
+    int32_t channels, offset;
+    void set(size_t j, int32_t s) { cols[static_cast<size_t>(box.half * channels) + j] = static_cast<uint16_t>(s); }
+    void row(const uint8_t *in, const uint8_t *gone, uint8_t *out) {
+        kernel(in, gone, cols, n, box.size, channels, offset, out);
+    }
+};
 
 // Every box summed in full, for when the column sums cannot be had.
 template <class Sum, int Bpp> void full_box(const View &src, const View &dst, const Box &box, const Mean<Sum> &mean) {
@@ -147,6 +177,19 @@ template <class Sum, int Bpp>
 bool smooth(const View &src, const View &dst, int32_t size, int32_t offset, bool running, uint8_t *ring,
             int32_t ringRows) {
     const Box box{size, size / 2};
+    const size_t n = static_cast<size_t>(src.width) * Bpp;
+    if (running && size >= vec::kMinBoxBytes && size <= vec::kMaxBoxBytes) {
+        // Sums of at most 255 x 11^2 fit 16 bits.
+        if (const vec::BoxBytes kernel = vec::box_bytes()) {
+            Buffer<uint16_t> cols =
+                alloc_buffer<uint16_t>(checked_size(static_cast<uint64_t>(src.width) + size - 1, Bpp));
+            if (cols) {
+                VectorSums sums{kernel, cols.get(), n, box, Bpp, offset};
+                running_box<int32_t>(src, dst, box, n, sums, ring, ringRows);
+                return true;
+            }
+        }
+    }
     const Mean<Sum> mean(size, offset);
     // Column sums and a row of their differences.
     Buffer<Sum> col =
@@ -155,11 +198,13 @@ bool smooth(const View &src, const View &dst, int32_t size, int32_t offset, bool
         // The table through a local pointer: stores to the result rows cannot
         // alias it, so the loop keeps it in a register.
         const uint8_t *table = mean.table.get();
-        running_box<Sum, Bpp>(
-            src, dst, box, [table](Sum v) { return table[static_cast<size_t>(v)]; }, col.get(), ring, ringRows);
+        auto lookup = [table](Sum v) { return table[static_cast<size_t>(v)]; };
+        PlainSums<Sum, Bpp, decltype(lookup)> sums{col.get(), n, src.width, box, lookup};
+        running_box<Sum>(src, dst, box, n, sums, ring, ringRows);
     } else if (col) {
-        running_box<Sum, Bpp>(
-            src, dst, box, [&mean](Sum v) { return mean.slow(v); }, col.get(), ring, ringRows);
+        auto slow = [&mean](Sum v) { return mean.slow(v); };
+        PlainSums<Sum, Bpp, decltype(slow)> sums{col.get(), n, src.width, box, slow};
+        running_box<Sum>(src, dst, box, n, sums, ring, ringRows);
     } else if (ring == nullptr) {
         full_box<Sum, Bpp>(src, dst, box, mean);
     } else {

@@ -8,6 +8,7 @@
 #include "core/internal/byte_map.hpp"
 #include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
+#include "toolkit/otsu.hpp"
 #include "toolkit/pximage_check.hpp"
 
 using namespace pxfx;
@@ -45,10 +46,8 @@ bool plane_stats(const uint8_t *plane, int32_t width, int32_t height, PlaneStats
     if (plane == nullptr || width <= 0 || height <= 0) return false;
     if (checked_size(static_cast<uint64_t>(width), static_cast<uint64_t>(height)) == 0) return false;
     const size_t n = static_cast<size_t>(width) * static_cast<size_t>(height);
-    std::memset(s.hist, 0, sizeof s.hist);
-    for (size_t i = 0; i < n; ++i)
-        ++s.hist[plane[i]];
-    s.t = ProbabilityDensityValue(plane, width, height) & 0xFF;
+    count_levels(n, s.hist, [plane](size_t i) { return plane[i]; });
+    s.t = otsu_threshold(s.hist);
     s.below = 0;
     for (int32_t i = 0; i < s.t; ++i)
         s.below += s.hist[i];

@@ -3,6 +3,7 @@
 
 #include "core/internal/memory.hpp"
 #include "toolkit/neighbourhood.hpp"
+#include "toolkit/otsu.hpp"
 #include "toolkit/pximage_check.hpp"
 
 using namespace pxfx;
@@ -19,10 +20,10 @@ template <class F> bool edge_filter(const View &v) {
     Buffer<int32_t> acc = alloc_buffer<int32_t>(n);
     if (!win.ok() || !acc) return false;
     const typename F::T *rows[3];
+    const vec::ConvolveBytes vector = vec::convolve_bytes();
     for (int32_t y = 0; y < v.height; ++y) {
         win.rows_for(y, rows);
-        convolve_row(rows, kEdge, 3, F::kChannels, n, acc.get());
-        store_row<F>(v, y, acc.get(), n, [](int32_t s) { return s >> 2; });
+        convolve_store<F>(v, y, rows, kEdge, 3, 2, vector, acc.get());
     }
     return true;
 }
@@ -47,27 +48,32 @@ int32_t PXImage_GrayToBinarization(PXImage *img) {
     if (!filter_input_ok(img)) return 0;
     const int32_t bits = img->bitcount;
     if (bits != 8 && bits != 16 && bits != 24) return 0;
-    // Without pixel rows: the grey plane of width x height bytes gets no
-    // block for a count of 0 or below (0). With both sizes negative it does,
-    // and no sample is read or mapped (1).
+    // Without pixel rows: 0 when width x height bytes make no block (a count
+    // of 0 or below); with both sizes negative they do, and no sample is read
+    // or mapped (1).
     const std::optional<View> v = view_of(img);
     if (!v) return buffer_size_ok(block_size(img->width, img->height, 1)) ? 1 : 0;
     const size_t pixels = static_cast<size_t>(v->width) * static_cast<size_t>(v->height);
     uint8_t *d = v->bits;
-    Buffer<uint8_t> plane = alloc_buffer<uint8_t>(pixels);
-    if (!plane) return 0;
-    for (size_t i = 0; i < pixels; ++i)
-        plane[i] = bits == 8 ? d[i] : (bits == 24 ? d[3 * i + 1] : static_cast<uint8_t>(word_gray(load16(d + 2 * i))));
-    const auto t = static_cast<uint32_t>(ProbabilityDensityValue(plane.get(), v->width, v->height) & 0xFF);
+    // The threshold of the grey plane, counted straight from the pixels: the
+    // byte of 8-bit pixels, the green byte of 24-bit ones, the scaled middle
+    // field of 16-bit ones.
+    uint32_t hist[256];
     if (bits == 8) {
+        count_levels(pixels, hist, [d](size_t i) { return d[i]; });
+        const auto t = static_cast<uint8_t>(otsu_threshold(hist));
         for (size_t i = 0; i < pixels; ++i)
             d[i] = d[i] > t ? 255 : 0;
     } else if (bits == 24) {
+        count_levels(pixels, hist, [d](size_t i) { return d[3 * i + 1]; });
+        const auto t = static_cast<uint8_t>(otsu_threshold(hist));
         for (size_t i = 0; i < pixels; ++i) {
             const uint8_t v = d[3 * i + 1] > t ? 255 : 0;
             d[3 * i] = d[3 * i + 1] = d[3 * i + 2] = v;
         }
     } else {
+        count_levels(pixels, hist, [d](size_t i) { return word_gray(load16(d + 2 * i)); });
+        const auto t = static_cast<uint8_t>(otsu_threshold(hist));
         for (size_t i = 0; i < pixels; ++i)
             store16(d + 2 * i, word_gray(load16(d + 2 * i)) > t ? 65535 : 0);
     }

@@ -11,6 +11,7 @@
 
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "toolkit/pximage_check.hpp"
 
 namespace pxfx::packed {
@@ -153,6 +154,21 @@ void convolve_row(const T *const *rows, const int32_t *kernel, int32_t size, int
         }
 }
 
+// Row y of the view from its window rows convolved with `kernel` (size x size
+// weights whose magnitudes sum to at most 128), each sum shifted right by
+// `shift` and clamped to the format's range. Byte samples go through
+// `vector` (vec::convolve_bytes(), picked once per call) where it takes the
+// row; `acc` has room for a row of sums.
+template <class F>
+void convolve_store(const View &v, int32_t y, const typename F::T *const *rows, const int32_t *kernel, int32_t size,
+                    int32_t shift, vec::ConvolveBytes vector, int32_t *acc) {
+    const size_t n = static_cast<size_t>(v.width) * F::kChannels;
+    if constexpr (sizeof(typename F::T) == 1)
+        if (vector != nullptr && vector(rows, kernel, size, F::kChannels, n, shift, v.row(y))) return;
+    convolve_row(rows, kernel, size, F::kChannels, n, acc);
+    store_row<F>(v, y, acc, n, [shift](int32_t s) { return s >> shift; });
+}
+
 // acc[i] = sum of the size x size window around sample i; `cols` holds
 // n + (size - 1) * channels column sums.
 template <class T>
@@ -174,6 +190,30 @@ void box_row(const T *const *rows, int32_t size, int32_t channels, size_t n, int
         for (size_t i = 0; i < n; ++i)
             acc[i] += c[i];
     }
+}
+
+// Row `row` of the view from the box sums of the window rows (size 3, 5 or
+// 7): with `centre` 0 their means (sum / size^2, truncated), else centre
+// times the window's centre sample minus the sum, clamped to the format's
+// range. Byte samples go through `vector` (vec::window_box_bytes(), picked
+// once per call) where it takes the row; `cols` and `acc` are box_row's.
+template <class F>
+void box_store(const View &v, int32_t row, const typename F::T *const *rows, int32_t size, int32_t centre,
+               vec::WindowBoxBytes vector, int32_t *cols, int32_t *acc) {
+    const size_t n = static_cast<size_t>(v.width) * F::kChannels;
+    if constexpr (sizeof(typename F::T) == 1)
+        if (vector != nullptr && vector(rows, size, F::kChannels, n, centre, v.row(row))) return;
+    box_row(rows, size, F::kChannels, n, cols, acc);
+    if (centre == 0) {
+        const auto area = static_cast<uint32_t>(size * size);
+        store_row<F>(v, row, acc, n,
+                     [area](int32_t s) { return static_cast<int32_t>(static_cast<uint32_t>(s) / area); });
+        return;
+    }
+    const typename F::T *mid = rows[size / 2];
+    for (size_t i = 0; i < n; ++i)
+        acc[i] = centre * static_cast<int32_t>(mid[i]) - acc[i];
+    store_row<F>(v, row, acc, n, [](int32_t s) { return s; });
 }
 
 } // namespace pxfx::packed

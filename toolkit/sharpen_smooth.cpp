@@ -37,17 +37,14 @@ template <class F> bool sharpen(const View &v, int32_t size) {
     if (!win.ok() || !acc || !cols) return false;
     const typename F::T *rows[7];
     const int32_t first = size == 7 ? kSharpen7FirstRow : 0;
+    const vec::ConvolveBytes convolve = vec::convolve_bytes();
+    const vec::WindowBoxBytes box = vec::window_box_bytes();
     for (int32_t y = first; y < v.height; ++y) {
         win.rows_for(y, rows);
-        if (size == 7) {
-            box_row(rows, 7, F::kChannels, n, cols.get(), acc.get());
-            const typename F::T *centre = rows[3];
-            for (size_t i = 0; i < n; ++i)
-                acc[i] = 50 * static_cast<int32_t>(centre[i]) - acc[i];
-        } else {
-            convolve_row(rows, size == 3 ? kSharpen3 : kSharpen5, size, F::kChannels, n, acc.get());
-        }
-        store_row<F>(v, y - first, acc.get(), n, [](int32_t s) { return s; });
+        if (size == 7)
+            box_store<F>(v, y - first, rows, 7, 50, box, cols.get(), acc.get());
+        else
+            convolve_store<F>(v, y, rows, size == 3 ? kSharpen3 : kSharpen5, size, 0, convolve, acc.get());
     }
     return true;
 }
@@ -59,12 +56,10 @@ template <class F> bool mean_smooth(const View &v, int32_t size) {
     Buffer<int32_t> cols = alloc_buffer<int32_t>(n + static_cast<size_t>(size - 1) * F::kChannels);
     if (!win.ok() || !acc || !cols) return false;
     const typename F::T *rows[7];
-    const auto area = static_cast<uint32_t>(size * size);
+    const vec::WindowBoxBytes box = vec::window_box_bytes();
     for (int32_t y = 0; y < v.height; ++y) {
         win.rows_for(y, rows);
-        box_row(rows, size, F::kChannels, n, cols.get(), acc.get());
-        store_row<F>(v, y, acc.get(), n,
-                     [area](int32_t v) { return static_cast<int32_t>(static_cast<uint32_t>(v) / area); });
+        box_store<F>(v, y, rows, size, 0, box, cols.get(), acc.get());
     }
     return true;
 }

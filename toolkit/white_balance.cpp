@@ -4,6 +4,7 @@
 
 #include "core/internal/byte_map.hpp"
 #include "core/internal/memory.hpp"
+#include "toolkit/otsu.hpp"
 #include "toolkit/pximage_check.hpp"
 
 using namespace pxfx;
@@ -85,14 +86,7 @@ int32_t balance_gray(const View &v, const PXPoint *pt) {
 
 } // namespace
 
-extern "C" {
-
-int32_t ProbabilityDensityValue(const uint8_t *plane, int32_t width, int32_t height) {
-    if (plane == nullptr || width <= 0 || height <= 0) return kNoThreshold;
-    const size_t n = static_cast<size_t>(width) * static_cast<size_t>(height);
-    uint32_t hist[256] = {};
-    for (size_t i = 0; i < n; ++i)
-        ++hist[plane[i]];
+int32_t pxfx::packed::otsu_threshold(const uint32_t (&hist)[256]) {
     uint64_t total = 0;
     for (uint32_t c : hist)
         total += c;
@@ -123,6 +117,16 @@ int32_t ProbabilityDensityValue(const uint8_t *plane, int32_t width, int32_t hei
         }
     }
     return bestT;
+}
+
+extern "C" {
+
+int32_t ProbabilityDensityValue(const uint8_t *plane, int32_t width, int32_t height) {
+    if (plane == nullptr || width <= 0 || height <= 0) return kNoThreshold;
+    uint32_t hist[256];
+    count_levels(static_cast<size_t>(width) * static_cast<size_t>(height), hist,
+                 [plane](size_t i) { return plane[i]; });
+    return otsu_threshold(hist);
 }
 
 int32_t PXImage_AutoWhiteBalance(PXImage *img, const PXPoint *pt) {

@@ -27,6 +27,23 @@ template <class T, class F> inline T trunc_sat(F v) {
     return static_cast<T>(v);
 }
 
+// floor(s / a) for 2 <= a <= 129 and every s <= 255 a as a 16-bit
+// multiply-high and a shift: floor(floor(s m / 2^16) / 2^p). With
+// 2^p < a <= 2^(p+1), k = 16 + p and m = ceil(2^k / a) < 2^16, the error
+// e = m a - 2^k is below a, so s m / 2^k = s / a + s e / (a 2^k) where
+// s e <= 255 a (a - 1) < 2^15 a <= 2^k: the excess stays below 1 / a and
+// cannot carry past the next multiple of 1 / a.
+struct ByteSumDivisor {
+    uint16_t m;
+    int32_t p;
+};
+constexpr ByteSumDivisor byte_sum_divisor(uint32_t a) {
+    int32_t p = 0;
+    while ((2u << p) < a)
+        ++p;
+    return {static_cast<uint16_t>(((1u << (16 + p)) + a - 1) / a), p};
+}
+
 // Bit-by-bit square root over 32 bits, rounded to the nearest integer.
 constexpr uint32_t isqrt_round(uint32_t x) {
     uint32_t root = 0;

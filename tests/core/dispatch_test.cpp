@@ -281,3 +281,64 @@ TEST(Dispatch, LineMediansMatchTheHistograms) {
                 }
             }
 }
+
+// The window filters (PXImage_Sharpen's three kernels, the mean smoothing
+// of PXImage_Smooth, PXImage_EdgeDetection) at every width up to past two
+// 32-byte vectors and across the strips of the box sums, on noise, whose
+// sums leave 0..255 both ways: on pictures lower than the windows and on
+// pictures past the 7 x 7 kernel's first row.
+TEST(Dispatch, WindowFiltersMatchThePlainLoops) {
+    std::mt19937 rng(13);
+    std::vector<int32_t> widths = {345, 1030};
+    for (int32_t width = 1; width <= 70; ++width)
+        widths.push_back(width);
+    for (int32_t bits : {8, 16, 24})
+        for (int32_t width : widths)
+            for (int32_t height : {1 + 2 * (width % 3), 51 + 2 * (width % 2)}) {
+                const pxtest::PX src = pxtest::px_random(width, height, bits, rng());
+                const auto runs = on_every_path([&] {
+                    std::vector<std::vector<uint8_t>> out;
+                    for (int32_t strength : {20, 60, 90, -10, -30, -50, 0}) {
+                        const pxtest::PX img = pxtest::px_clone(src.get());
+                        PXImage *p = img.get();
+                        EXPECT_EQ(strength > 0   ? PXImage_Sharpen(p, strength)
+                                  : strength < 0 ? PXImage_Smooth(p, -strength)
+                                                 : PXImage_EdgeDetection(p),
+                                  1);
+                        out.push_back(pxtest::bytes(p));
+                    }
+                    return out;
+                });
+                for (size_t p = 1; p < runs.size(); ++p)
+                    EXPECT_EQ(runs[p], runs[0]) << bits << " bits, " << width << " x " << height << ", path " << p;
+            }
+}
+
+// Filter_fast at every width up to past four 16-byte and two 32-byte vectors
+// of sums, odd heights, box sizes around those the vector sums take and a
+// large one, in place and through the working image (a record narrower than
+// its pitch), offsets that move the means both ways.
+TEST(Dispatch, BoxMeansMatchThePlainLoops) {
+    constexpr int32_t kSizes[] = {1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 31};
+    for (int32_t bits : {8, 24, 32})
+        for (int32_t width = 1; width <= 70; ++width) {
+            const int32_t height = 1 + 2 * (width % 4), offset = (width % 3 - 1) * 40;
+            const Owned fresh = pxtest::random_image(width, height, bits, static_cast<uint32_t>(width * bits));
+            const Owned wide = pxtest::random_image(width + 4, height, bits, static_cast<uint32_t>(width + bits));
+            const auto runs = on_every_path([&] {
+                std::vector<Owned> out;
+                for (int32_t size : kSizes)
+                    for (const Image *src : {fresh.get(), wide.get()}) {
+                        out.push_back(pxtest::clone(src));
+                        Image narrow = *out.back();
+                        narrow.width = width;
+                        EXPECT_EQ(Filter_fast(&narrow, size, offset), 1);
+                    }
+                return out;
+            });
+            for (size_t p = 1; p < runs.size(); ++p)
+                for (size_t i = 0; i < runs[0].size(); ++i)
+                    EXPECT_EQ(pxtest::diff(runs[p][i].get(), runs[0][i].get()), "")
+                        << bits << " bits, width " << width << ", size " << kSizes[i / 2] << ", path " << p;
+        }
+}
