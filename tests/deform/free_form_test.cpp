@@ -20,6 +20,18 @@ TEST(WeightedCentroid, RoundsTruncatesAndVanishes) {
     EXPECT_EQ(at(WeightedCentroid(pts, w + 4, 1)), std::pair(0, 0));
 }
 
+TEST(FreeForm, RowWeightsOnEitherSideOfThePoint) {
+    double row[9];
+    for (int px : {0, 2, 4, 7, 8})
+        for (int y : {1, 3}) {
+            pxfx::warp_row_weights(row, 9, y, px, 3);
+            for (int x = 0; x < 9; ++x) {
+                const int d2 = (x - px) * (x - px) + (y - 3) * (y - 3);
+                EXPECT_EQ(row[x], d2 ? 1.0 / std::exp(std::log(double(d2))) : 0.0) << px << " " << x << " " << y;
+            }
+        }
+}
+
 TEST(FreeForm, HoleFillingReachAndOrder) {
     // One row, 0 and 200 known at x = 0 and 4, and 200 at x = 12: the gap
     // fills left to right (a tie takes the left alpha); x = 5 and 6 see

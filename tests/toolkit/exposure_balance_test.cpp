@@ -47,17 +47,6 @@ TEST(Exposure, PercentileStretchAndBrightRefusal) {
     EXPECT_EQ(bytes(flat.get()), std::vector<uint8_t>(36, 0));
 }
 
-TEST(Exposure, SixteenBitTableCoversOnlyLowLevels) {
-    PX img = px_make(50, 2, 16);
-    for (int i = 0; i < 100; ++i) // samples 0..99, then 40 of them lifted past 255
-        put_sample(img.get(), i / 50, i % 50, 0, i < 60 ? i : 256 + i);
-    ASSERT_EQ(PXImage_AutoExposure(img.get()), 1);
-    for (int i = 0; i < 100; ++i) // low = 0; high = 256 + 99 = 355, kept as 99.
-        EXPECT_EQ(neighbour(img.get(), i / 50, i % 50, 0, 0, 0),
-                  i < 60 ? std::min(65535, int(std::pow(i / 99.0, 0.4) * 65535.0)) : 0)
-            << i;
-}
-
 // Otsu's split with level 255 left out of the upper mean; 120 when there is nothing to split.
 TEST(Otsu, TopLevelAndDegenerateInputs) {
     const uint8_t top[16] = {10, 10, 10, 10, 240, 240, 240, 240, 255, 255, 255, 255, 255, 255, 255, 255},
