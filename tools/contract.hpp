@@ -64,13 +64,15 @@ inline const Accepted *find_kind(const std::vector<Accepted> &kinds, const std::
 }
 
 // A record of another size over a noise block of the first accepted bit
-// count (or over none), called with the typical parameter: what it returns
-// and, where pinned, the shape of the result. A failure result means refused.
+// count (or of `bits` when set; or over none), called with the typical
+// parameter: what it returns and, where pinned, the shape of the result. A
+// failure result means refused.
 struct Sized {
     int32_t w, h;
     bool pixels;
     int64_t result;
     const char *shape = nullptr;
+    int32_t bits = 0;
 };
 
 // A function "refuses" when it returns its failure result, leaves its result

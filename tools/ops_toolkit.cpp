@@ -62,6 +62,13 @@ const std::vector<int32_t> kGeometry = {8, 16, 24};
 // computed (1).
 const std::vector<int32_t> kEveryBits = {8, 0, 1, 4, 12, 16, 24, 32, 48};
 const std::vector<Accepted> kFilterSizes = {"negative sizes"};
+// At bit counts the filters leave alone (12, 32), pictures, also without
+// pixel rows, are done and nothing is written; binarisation refuses those
+// without rows.
+const std::vector<Sized> kRowlessLeftAlone = {{0, 7, true, 1, "kept", 12},
+                                              {-3, -2, true, 1, "kept", 12},
+                                              {9, 7, true, 1, "kept", 32}},
+                         kRowlessRefused = {{0, 7, true, 0, nullptr, 12}, {-3, -2, true, 0, nullptr, 12}};
 // Records without pixel rows.
 const std::vector<Accepted> kRowless = kEmptySizes;
 
@@ -83,12 +90,13 @@ Contract<PXImage> made(std::vector<int32_t> formats, std::function<PXImage *(PXI
 }
 template <class R>
 Contract<R> changed(std::vector<int32_t> formats, std::function<int64_t(R *, int32_t)> f,
-                    std::vector<Accepted> accepts = {}, int64_t failure = 0) {
+                    std::vector<Accepted> accepts = {}, int64_t failure = 0, std::vector<Sized> sizes = {}) {
     return {.formats = std::move(formats),
             .call = [f](Call<R> &c) { return f(c.a, c.p); },
             .failure = failure,
             .slot = false,
-            .accepts = std::move(accepts)};
+            .accepts = std::move(accepts),
+            .sizes = std::move(sizes)};
 }
 Contract<PXImage> two(std::vector<int32_t> formats, std::function<int64_t(PXImage *, PXImage *, int32_t)> f,
                       std::vector<Accepted> accepts = {}) {
@@ -304,7 +312,7 @@ void add_toolkit(std::vector<Operation> &t) {
                  [](const Image *in, const Args &a) {
                      return packed_in_place(in, [&](PXImage *p) { return PXImage_Sharpen(p, a.i(0)) == 1; });
                  },
-                 changed<PXImage>(kEveryBits, PXImage_Sharpen, kFilterSizes)});
+                 changed<PXImage>(kEveryBits, PXImage_Sharpen, kFilterSizes, 0, kRowlessLeftAlone)});
     t.push_back({"px-smooth",
                  PXOP_FN(PXImage_Smooth),
                  "Toolkit filters",
@@ -314,7 +322,7 @@ void add_toolkit(std::vector<Operation> &t) {
                  [](const Image *in, const Args &a) {
                      return packed_in_place(in, [&](PXImage *p) { return PXImage_Smooth(p, a.i(0)) == 1; });
                  },
-                 changed<PXImage>(kEveryBits, PXImage_Smooth, kFilterSizes)});
+                 changed<PXImage>(kEveryBits, PXImage_Smooth, kFilterSizes, 0, kRowlessLeftAlone)});
     t.push_back({"edges",
                  PXOP_FN(PXImage_EdgeDetection),
                  "Toolkit filters",
@@ -325,7 +333,8 @@ void add_toolkit(std::vector<Operation> &t) {
                      return packed_in_place(in, [](PXImage *p) { return PXImage_EdgeDetection(p) == 1; });
                  },
                  changed<PXImage>(
-                     kEveryBits, [](PXImage *a, int32_t) { return PXImage_EdgeDetection(a); }, kFilterSizes)});
+                     kEveryBits, [](PXImage *a, int32_t) { return PXImage_EdgeDetection(a); }, kFilterSizes, 0,
+                     kRowlessLeftAlone)});
     t.push_back({"binarize",
                  PXOP_FN(PXImage_GrayToBinarization),
                  "Toolkit filters",
@@ -335,8 +344,9 @@ void add_toolkit(std::vector<Operation> &t) {
                  [](const Image *in, const Args &) {
                      return packed_in_place(in, [](PXImage *p) { return PXImage_GrayToBinarization(p) == 1; });
                  },
-                 changed<PXImage>(kGeometry, [](PXImage *a, int32_t) { return PXImage_GrayToBinarization(a); },
-                                  {"negative sizes"})});
+                 changed<PXImage>(
+                     kGeometry, [](PXImage *a, int32_t) { return PXImage_GrayToBinarization(a); }, {"negative sizes"},
+                     0, kRowlessRefused)});
     t.push_back({"frame",
                  PXOP_FN(PXImage_Effect_Clip),
                  "Toolkit filters",

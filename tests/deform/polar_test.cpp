@@ -36,20 +36,16 @@ Owned reference_circle(const Image *src, int mode, int radius, float factor) {
 } // namespace
 
 TEST(Polar, MatchesAccessorVersion) {
-    uint32_t (*entries[])(Image *, Image **) = {Punch_Transform, Pinch_Transform, Swirl_Transform, Cylinder_Transform,
-                                                Bathroom_Transform};
-    // Mode, radius and factor of CircleTransform; a negative mode behaves as
-    // the punch. The last five cases are the named entry points.
-    const float cases[][3] = {{9, 0, 1},  {-3, 0, 1},  {2, 0, 0},   {2, 7, -3.5f}, {0, 500, 1}, {1, 500, 1}, {3, 9, 1},
-                              {4, -5, 1}, {0, 0, 100}, {1, 0, 100}, {2, 0, 100},   {3, 0, 100}, {4, 0, 1}};
-    for (int i = 0; i < 13; ++i) {
-        const float mode = cases[i][0], radius = cases[i][1], factor = cases[i][2];
-        expect_like_reference(
-            [&](Image *s, Image **d) {
-                return i < 8 ? CircleTransform(s, d, int(mode), int(radius), factor) : entries[i - 8](s, d);
-            },
-            [&](const Image *s) { return reference_circle(s, std::max(0, int(mode)), int(radius), factor); },
-            uint32_t(100 * i));
+    // Mode, radius and factor; a negative mode behaves as the punch (the
+    // named entry points, whose outputs the golden hashes pin, pass fixed ones).
+    const float cases[][3] = {{9, 0, 1},   {-3, 0, 1}, {2, 0, 0},  {2, 7, -3.5f}, {0, 500, 1},
+                              {1, 500, 1}, {3, 9, 1},  {4, -5, 1}, {3, 0, 100}};
+    for (int i = 0; i < 9; ++i) {
+        const int mode = int(cases[i][0]), radius = int(cases[i][1]);
+        const float factor = cases[i][2];
+        expect_like_reference([&](Image *s, Image **d) { return CircleTransform(s, d, mode, radius, factor); },
+                              [&](const Image *s) { return reference_circle(s, std::max(0, mode), radius, factor); },
+                              uint32_t(100 * i));
     }
 }
 

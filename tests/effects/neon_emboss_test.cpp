@@ -43,7 +43,7 @@ Owned reference_emboss(const Image *s) {
 
 } // namespace
 
-// Through the dispatcher: 0 neon, 1 emboss (2 photocopy and 3 sketch beside their references).
+// Through the dispatcher: 0 neon, 1 emboss.
 TEST(NeonEmboss, MatchAccessorVersionsOnEveryFormat) {
     expect_like_reference([](Image *s, Image **d) { return PX_ProcessImage(s, d, 0); }, reference_neon, 1);
     expect_like_reference([](Image *s, Image **d) { return PX_ProcessImage(s, d, 1); }, reference_emboss, 100);

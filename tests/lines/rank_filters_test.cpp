@@ -1,5 +1,5 @@
 // Medians and the edge marker against straightforward versions on random
-// planes, and the red/blue exchange.
+// planes.
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -99,13 +99,5 @@ TEST(RankFilters, DeliveryIntoTheSlotsImage) {
         EXPECT_TRUE(slot == &hollow && hollow.bits == nullptr && hollow.width == kept.width &&
                     hollow.height == kept.height && hollow.bitCount == kept.bitCount && hollow.pitch == kept.pitch &&
                     hollow.tag == kept.tag);
-    }
-}
-
-TEST(RGB_Reverse, SwapsRedAndBlueOfColourPixelsOnly) {
-    for (int32_t bc : kBitCounts) {
-        Owned im = filled(3, 2, bc, 0x80112233u);
-        ASSERT_EQ(RGB_Reverse(im.get()), 1);
-        EXPECT_EQ(diff(im.get(), filled(3, 2, bc, bc < 24 ? 0x80112233u : 0x80332211u).get()), "") << bc;
     }
 }

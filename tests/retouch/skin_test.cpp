@@ -53,10 +53,6 @@ TEST(SkinMask, MaskAndSpotBrighteningMatchAccessorVersions) {
         EXPECT_EQ(alg_Img_Skin(portrait, &skin, lighten), 1);
         EXPECT_EQ(diff(skin.get(), want.get()), "") << lighten;
     }
-    // LightUP on the 16-bit words.
-    Owned deep = random_image(9, 5, 16, 70), want = mapped(deep.get(), [](int v) { return ZANTOMOPI[v]; });
-    ASSERT_EQ(LightUP(deep.get()), 1);
-    EXPECT_EQ(diff(deep.get(), want.get()), "");
 }
 
 TEST(RankFilters, BestColorAndMoreLightMatchSortedWindows) {

@@ -342,7 +342,7 @@ template <class R> void expect_sizes(const std::string &name, const Contract<R> 
     auto side = [](int32_t n) { return int32_t(std::clamp<int64_t>(std::llabs(n), 1, 1024)); };
     for (const pxop::Sized &k : c.sizes) {
         const std::string why = name + ": " + std::to_string(k.w) + "x" + std::to_string(k.h);
-        auto held = good<R>(side(k.w), side(k.h), c.formats.front(), 51);
+        auto held = good<R>(side(k.w), side(k.h), k.bits ? k.bits : c.formats.front(), 51);
         held->record.width = k.w, held->record.height = k.h;
         if (!k.pixels) held->record = without_pixels(held->record);
         R *second = c.pictures > 1 ? &b->record : nullptr;
