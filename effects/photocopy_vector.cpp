@@ -125,8 +125,11 @@ HWY_EXPORT(photocopy_means);
 HWY_EXPORT(photocopy_tone);
 } // namespace
 
-vec::PhotocopyMeans vec::photocopy_means() { return PXFX_VECTOR_COPY(photocopy_means); }
-vec::PhotocopyTone vec::photocopy_tone() { return PXFX_VECTOR_COPY(photocopy_tone); }
+// 32-bit ARM divides floats through a refined reciprocal estimate, which is
+// not correctly rounded, and the quotients above rely on that rounding: the
+// plain loops run there.
+vec::PhotocopyMeans vec::photocopy_means() { return HWY_ARCH_ARM_V7 ? nullptr : PXFX_VECTOR_COPY(photocopy_means); }
+vec::PhotocopyTone vec::photocopy_tone() { return HWY_ARCH_ARM_V7 ? nullptr : PXFX_VECTOR_COPY(photocopy_tone); }
 
 } // namespace pxfx
 #endif
