@@ -150,8 +150,11 @@ inline void note_reach(int32_t width, int32_t height) {
         reach.width = width, reach.height = height;
 }
 
-// Width and height 1..maxW x 1..maxH, sometimes 0 or negative.
+// Width and height 1..maxW x 1..maxH; about one in 48 shapes may be five
+// times as large each way (several hundred pixels a side); sometimes 0 or
+// negative.
 inline Shape pick_shape(Input &in, int32_t maxW = 64, int32_t maxH = 64) {
+    if (in.one_in(48)) maxW *= 5, maxH *= 5;
     Shape s{in.range(1, maxW), in.range(1, maxH), pick_bit_count(in)};
     if (in.one_in(32)) s.width = in.one_in(2) ? 0 : -in.range(1, 3);
     if (in.one_in(32)) s.height = in.one_in(2) ? 0 : -in.range(1, 3);
