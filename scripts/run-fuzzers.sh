@@ -32,7 +32,7 @@ fi
 bash scripts/install-deps.sh clang-14 libclang-rt-14-dev
 cmake -S . -B build-fuzz -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo \
   -DCMAKE_C_COMPILER=clang-14 -DCMAKE_CXX_COMPILER=clang++-14 \
-  -DPXFX_BUILD_FUZZERS=ON -DPXFX_BUILD_TESTS=OFF -DPXFX_BUILD_BENCH=OFF -DPXFX_WERROR=ON
+  -DPXFX_BUILD_FUZZERS=ON -DPXFX_BUILD_TESTS=OFF -DPXFX_BUILD_BENCH=OFF -DPXFX_WERROR=ON -DPXFX_SKIP_TARGETS="${PXFX_SKIP_TARGETS:-}"
 cmake --build build-fuzz -j "$(nproc)" --target "${targets[@]/#/pxfx_fuzz_}"
 
 mkdir -p fuzz/findings

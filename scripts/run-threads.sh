@@ -10,7 +10,7 @@ cmake -S . -B build-tsan -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo \
   -DCMAKE_C_COMPILER=gcc -DCMAKE_CXX_COMPILER=g++ \
   -DCMAKE_C_FLAGS="$SAN" -DCMAKE_CXX_FLAGS="$SAN" \
   -DCMAKE_EXE_LINKER_FLAGS="-fsanitize=thread" -DCMAKE_SHARED_LINKER_FLAGS="-fsanitize=thread" \
-  -DPXFX_BUILD_BENCH=OFF -DPXFX_WERROR=ON
+  -DPXFX_BUILD_BENCH=OFF -DPXFX_WERROR=ON -DPXFX_SKIP_TARGETS="${PXFX_SKIP_TARGETS:-}"
 cmake --build build-tsan -j "$(nproc)" --target pxfx_tests_registry
 for path in scalar 128 best; do
   echo "== Threads on path $path"

@@ -43,9 +43,18 @@ TEST(Files, ReadMemFileAppendsThreeZeroBytesOrFails) {
     EXPECT_EQ(PX_ReadMemFile(nullptr, &size), nullptr);
     EXPECT_EQ(PX_fopen(nullptr, "rb"), nullptr);
     const std::string edge = "/tmp/" + std::string(250, 'b'); // 255 bytes are accepted, 256 refused
-    FILE *f = PX_fopen(edge.c_str(), "wb");
+    FILE *f = PX_fopen(edge.c_str(), "wb+");
     ASSERT_NE(f, nullptr);
-    PX_fclose(f);
+    // The stream services pass through: write, seek, tell, read back.
+    char got[4] = {};
+    EXPECT_EQ(PX_fwrite("abcdef", 1, 6, f), 6u);
+    EXPECT_EQ(PX_fseek(f, -4, SEEK_END), 0);
+    EXPECT_EQ(PX_ftell(f), 2);
+    EXPECT_EQ(PX_fread(got, 1, 4, f), 4u);
+    EXPECT_EQ(std::memcmp(got, "cdef", 4), 0);
+    EXPECT_EQ(PX_fread(got, 1, 4, f), 0u);
+    EXPECT_NE(PX_fseek(f, -7, SEEK_END), 0);
+    EXPECT_EQ(PX_fclose(f), 0);
     EXPECT_EQ(PX_fopen((edge + "b").c_str(), "wb"), nullptr);
     for (const std::string &p : {edge, path("five"), path("empty")})
         std::remove(p.c_str());

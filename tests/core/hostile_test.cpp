@@ -17,6 +17,14 @@ TEST(Hostile, RecordsMemoryAndMath) {
     PX_free(nullptr);
     EXPECT_EQ(PX_memcpy(nullptr, nullptr, 0), nullptr);
     EXPECT_EQ(PX_memset(nullptr, 0, 0), nullptr);
+    char text[] = "abcd";
+    EXPECT_EQ(PX_memcpy(text, nullptr, 4), text);
+    EXPECT_EQ(PX_memcpy(text, "xy", 0), text);
+    EXPECT_EQ(PX_memset(text, 'z', 0), text);
+    EXPECT_STREQ(text, "abcd");
+    EXPECT_EQ(PX_memcpy(text, "xy", 2), text);
+    EXPECT_EQ(PX_memset(text + 3, 0x100 + 'w', 1), text + 3); // the value's low byte
+    EXPECT_STREQ(text, "xycw");
     for (int32_t v : kExtremes) {
         EXPECT_LE(xxgluSqrtFx(uint32_t(v)), 65536u);
         EXPECT_EQ(ltouc(v), std::clamp(v, 0, 255));

@@ -95,6 +95,12 @@ TEST(Texture, OilMatchesWindowRescanAndCopiesTheBorder) {
                     EXPECT_EQ(diff(dst.get(), ref_oil(src.get(), r).get()), "") << w << "x" << h << "@" << bc;
                 }
             }
+    // A window of 4105^2 white pixels sums 255 * 4105^2 > 2^32 per channel:
+    // the one interior pixel stays white only with 64-bit sums.
+    Owned white = filled(4105, 4105, 24, 0xFFFFFF);
+    Slot dst;
+    ASSERT_EQ(imOil(white.get(), &dst, 2052), 1u);
+    EXPECT_EQ(GetPixelColor(dst.get(), 2052, 2052) & 0xFFFFFFu, 0xFFFFFFu);
 }
 
 // 3 levels: groups 0..85, 86..171, 172..255; 12 levels: groups of 22, the last

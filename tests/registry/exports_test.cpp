@@ -9,6 +9,9 @@
 #include "operations.hpp"
 
 TEST(Registry, SharedLibraryExportsExactlyTheRegistry) {
+#ifdef PXFX_COVERAGE_BUILD
+    GTEST_SKIP() << "the gcov runtime adds its own symbols to a coverage build";
+#endif
     std::ifstream in(PXFX_EXPORTS_FILE);
     ASSERT_TRUE(in) << PXFX_EXPORTS_FILE;
     std::set<std::string> exported, expected;
