@@ -1,10 +1,4 @@
 // Whole-file reading, name limits and BMP output.
-#include <gtest/gtest.h>
-
-#include <cstdio>
-#include <cstring>
-#include <fstream>
-#include <vector>
 
 #include <sys/stat.h>
 #include <unistd.h>

@@ -1,10 +1,4 @@
 // Integer math: square root, distances, table trigonometry, random sign rule.
-#include <gtest/gtest.h>
-
-#include <cmath>
-#include <cstdlib>
-#include <random>
-
 #include "support/test_images.hpp"
 
 namespace {

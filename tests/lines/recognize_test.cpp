@@ -1,12 +1,6 @@
 // Straightening along tilted boundaries, RecognizeYUV's limits and delivery,
 // the vertical resampler against its formula, and the run finder and the
 // interval helpers on hand-made lists.
-#include <gtest/gtest.h>
-
-#include <algorithm>
-#include <climits>
-#include <vector>
-
 #include "lines/lines_internal.hpp"
 #include "support/test_images.hpp"
 

@@ -1,11 +1,5 @@
 // Brush pastes, the cached brushes and their slot rules, blemish removal and
 // the Bezier helpers.
-#include <gtest/gtest.h>
-
-#include <algorithm>
-#include <array>
-#include <vector>
-
 #include "retouch/reference.hpp"
 
 using namespace pxtest;

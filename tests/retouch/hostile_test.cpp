@@ -1,7 +1,5 @@
 // Hostile input beyond the registry's contracts: point lists, curves and
 // caches at their extremes, and sources of empty sizes.
-#include <climits>
-
 #include "support/hostile.hpp"
 
 using namespace pxtest::hostile;

@@ -1,9 +1,5 @@
 // Skin mask, skin smoothing and the rank filters, against accessor versions
 // on portrait-like pictures of every format and on the bundled portrait.
-#include <gtest/gtest.h>
-
-#include <vector>
-
 #include "retouch/reference.hpp"
 
 using namespace pxtest;

@@ -10,22 +10,8 @@
 // without checking is caught by the sanitizers.
 #pragma once
 
-#include <gtest/gtest.h>
-
-#include <algorithm>
-#include <climits>
-#include <cstddef>
-#include <cstdlib>
-#include <cstring>
-#include <functional>
-#include <memory>
-#include <random>
-#include <string>
-#include <vector>
-
 #include "support/alloc_failures.hpp"
 #include "support/slot_rule.hpp"
-#include "support/test_images.hpp"
 #include "tools/contract.hpp"
 
 namespace pxtest::hostile {

@@ -1,7 +1,5 @@
 // Hostile input beyond the registry's contracts: curve-filter masks, planes,
 // rectangles, points and sorts at their extremes.
-#include <climits>
-
 #include "support/hostile.hpp"
 
 using namespace pxtest::hostile;
