@@ -68,10 +68,11 @@ struct Slot {
     Image *get() const { return image; }
 };
 
-// A record over held's pixels that claims another size.
-inline Image reshaped(const Image *held, int32_t w, int32_t h) {
+// A record over held's pixels (or none) that claims another size.
+inline Image reshaped(const Image *held, int32_t w, int32_t h, bool pixels = true) {
     Image r = *held;
     r.width = w, r.height = h;
+    if (!pixels) r.bits = nullptr;
     return r;
 }
 
