@@ -48,15 +48,10 @@ template <class Make> void expect_same_on_every_path(const testing::Message &wha
         EXPECT_EQ(differs(runs[p], runs[0]), "") << what << ", path " << p;
 }
 
-// The target name of each path.
-std::vector<std::string> path_names() {
-    return on_every_path([] { return std::string(pxfx::cpu::target_name()); });
-}
-
 } // namespace
 
 TEST(Dispatch, PathsNameTheirTargets) {
-    const std::vector<std::string> names = path_names();
+    const auto names = on_every_path([] { return std::string(pxfx::cpu::target_name()); });
     EXPECT_EQ(names[0], "scalar");
 #ifndef PXFX_PORTABLE_ONLY
 #if defined(__aarch64__) || defined(__ARM_NEON)
