@@ -3,6 +3,7 @@
 // the tones without parameters), references where a short one exists, every
 // format, the result-image rule.
 #include "support/reference_check.hpp"
+#include "support/slot_rule.hpp"
 
 using namespace pxtest;
 
@@ -42,14 +43,11 @@ Owned ref_lambency(const Image *src) {
 } // namespace
 
 TEST(Tones, HandComputedPixelsInEveryFormat) {
-    using Run = std::function<uint32_t(Image *, Image **)>;
-    const auto light = [](uint32_t p, uint32_t ch) {
-        return Run([=](Image *s, Image **d) { return PX_IMG_Light_Alter(s, d, p, ch); });
-    };
-    const auto contrast = [](int32_t c) { return Run([=](Image *s, Image **d) { return PX_IMG_Ballance(s, d, c); }); };
+    const auto light = [](uint32_t p, uint32_t ch) { return bind_slot(PX_IMG_Light_Alter, p, ch); };
+    const auto contrast = [](int32_t c) { return bind_slot(PX_IMG_Ballance, c); };
     const uint32_t in = rgba(10, 200, 30, 77);
     const struct {
-        Run effect;
+        SlotCall effect;
         uint32_t in, out;
     } cases[] = {
         {light(50, 0), in, rgba(10, 200, 15, 77)},
