@@ -107,6 +107,12 @@ template <class R> struct Contract {
     const Accepted *accepted(const std::string &what) const { return find_kind(accepts, what); }
 };
 
+// A rectangle and a point following the parameter, and the address of such a
+// value for the duration of a call.
+inline PXRect rect(int32_t p) { return {1, p, p, 0}; }
+inline PXPoint point(int32_t p) { return {p, p}; }
+template <class T> const T *ptr(const T &v) { return &v; }
+
 // Bit counts the pixel readers take: any (unknown ones read as opaque black).
 inline const std::vector<int32_t> kAnyBits = {8, 16, 24, 32, 0, 1, 4, 12, 48};
 // Records of no pixel rows that a function with nothing to visit takes as

@@ -72,12 +72,6 @@ const std::vector<Sized> kRowlessLeftAlone = {{0, 7, true, 1, "kept", 12},
 // Records without pixel rows.
 const std::vector<Accepted> kRowless = kEmptySizes;
 
-// A rectangle and a point following the parameter, and the address of such a
-// value for the duration of a call.
-PXRect rect(int32_t p) { return {1, p, p, 0}; }
-PXPoint point(int32_t p) { return {p, p}; }
-template <class T> const T *ptr(const T &v) { return &v; }
-
 // Contracts of functions taking the parameter and one picture, returning a
 // new record or changing the picture in place, or two pictures (no result slot).
 Contract<PXImage> made(std::vector<int32_t> formats, std::function<PXImage *(PXImage *, int32_t)> f,

@@ -3,10 +3,6 @@
 // straightforward accessor versions; hue, saturation and lightness shifts:
 // the plane maps, and the picture pass against the plane route (Split, shift
 // one plane, Combine, copy).
-#include <gtest/gtest.h>
-
-#include <climits>
-
 #include "color/colorspace.hpp"
 #include "support/test_images.hpp"
 

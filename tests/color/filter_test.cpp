@@ -1,14 +1,5 @@
 // Kernel convolution and box smoothing against a straightforward accessor
 // version on random pictures of every format.
-#include <gtest/gtest.h>
-
-#include <algorithm>
-#include <climits>
-#include <cstring>
-#include <functional>
-#include <random>
-#include <vector>
-
 #include "color/box_filter.hpp"
 
 #include "support/test_images.hpp"
@@ -253,14 +244,9 @@ TEST(FilterFast, MatchesFullBoxSumsAndRefusesBadSizesAsDoesSmooth) {
     EXPECT_EQ(gray.get(), kept);
     ASSERT_EQ(PX_IMG_Smooth(src.get(), nullptr, 150), 1); // in place
     EXPECT_EQ(diff(src.get(), want.get()), "");
-    Image hollow = *src, *hp = &hollow; // an existing result without pixels takes nothing
-    hollow.bits = nullptr;
-    EXPECT_EQ(PX_IMG_Smooth(src.get(), &hp, 50), 1);
-    EXPECT_EQ(hp, &hollow);
     // A source of an empty size: smoothed in place it is left as it is (1); a
     // new result of its size cannot be made (0).
-    Image empty = *src, *none = nullptr;
-    empty.width = 0;
+    Image empty = reshaped(src.get(), 0, 8), *none = nullptr;
     EXPECT_EQ(PX_IMG_Smooth(&empty, nullptr, 50) + PX_IMG_Smooth(&empty, &none, 50) + Filter_fast(&empty, 3, 0), 1);
     EXPECT_EQ(none, nullptr);
     EXPECT_EQ(diff(src.get(), want.get()), "");

@@ -1,7 +1,5 @@
 // Failed allocations: every function returns its failure result, leaves its
 // inputs intact and (checked by the leak sanitizer) releases what it made.
-#include <gtest/gtest.h>
-
 #include "support/alloc_failures.hpp"
 #include "support/test_images.hpp"
 

@@ -3,11 +3,6 @@
 // bit count the accessors know, into a record of the same or another bit
 // count and in place, with padded rows and a different map on each of three
 // rows (which changes the 16-bit field tables from row to row).
-#include <gtest/gtest.h>
-
-#include <random>
-#include <vector>
-
 #include "core/internal/channel_map.hpp"
 #include "support/test_images.hpp"
 

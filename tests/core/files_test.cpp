@@ -1,10 +1,4 @@
 // Whole-file reading, name limits and BMP output.
-#include <gtest/gtest.h>
-
-#include <cstdio>
-#include <cstring>
-#include <fstream>
-#include <vector>
 
 #include <sys/stat.h>
 #include <unistd.h>
@@ -76,18 +70,13 @@ TEST(Files, SaveBmpWritesHeadersPaletteAndRowsAsStored) {
         EXPECT_EQ(std::memcmp(v.data() + off, im->bits, data), 0) << bc; // padding bytes included
     }
     Owned im = make(2, 2, 32);
-    Image hollow = *im;
-    hollow.bits = nullptr;
-    Image upsideDown = *im;
-    upsideDown.height = -2;
+    Image hollow = reshaped(im.get(), 2, 2, false), upsideDown = reshaped(im.get(), 2, -2);
     EXPECT_EQ(saveBmp(path("h.bmp").c_str(), &hollow) + saveBmp(path("h.bmp").c_str(), nullptr) +
                   saveBmp(path("h.bmp").c_str(), &upsideDown),
               0);
     EXPECT_TRUE(file_bytes(path("h.bmp")).empty());
     // No rows, or rows of no pixels: the headers and the pitch x height bytes claimed.
-    Image noRows = *im, noColumns = *im;
-    noRows.height = 0;
-    noColumns.width = 0;
+    Image noRows = reshaped(im.get(), 2, 0), noColumns = reshaped(im.get(), 0, 2);
     ASSERT_EQ(saveBmp(path("h.bmp").c_str(), &noRows), 1);
     EXPECT_EQ(file_bytes(path("h.bmp")).size(), 54u);
     ASSERT_EQ(saveBmp(path("h.bmp").c_str(), &noColumns), 1);

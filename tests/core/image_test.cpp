@@ -1,9 +1,4 @@
 // Image record: creation rules, accessors against the stored bytes, copies.
-#include <gtest/gtest.h>
-
-#include <algorithm>
-#include <cstring>
-
 #include "support/test_images.hpp"
 
 using namespace pxtest;

@@ -1,10 +1,5 @@
 // Free-form warp: weighted centres, hole filling on hand-made masks, and
 // warps whose result is known: one pair, no pair, identity and translation.
-#include <gtest/gtest.h>
-
-#include <cmath>
-#include <vector>
-
 #include "deform/free_form.hpp"
 #include "support/test_images.hpp"
 
@@ -18,18 +13,6 @@ TEST(WeightedCentroid, RoundsTruncatesAndVanishes) {
     EXPECT_EQ(at(WeightedCentroid(pts + 4, w + 2, 1)), std::pair(-2, -3)); // -2.5, -3.5 toward zero
     EXPECT_EQ(at(WeightedCentroid(pts, w + 3, 1)), std::pair(0, 0));       // weights below 1e-6
     EXPECT_EQ(at(WeightedCentroid(pts, w + 4, 1)), std::pair(0, 0));
-}
-
-TEST(FreeForm, RowWeightsOnEitherSideOfThePoint) {
-    double row[9];
-    for (int px : {0, 2, 4, 7, 8})
-        for (int y : {1, 3}) {
-            pxfx::warp_row_weights(row, 9, y, px, 3);
-            for (int x = 0; x < 9; ++x) {
-                const int d2 = (x - px) * (x - px) + (y - 3) * (y - 3);
-                EXPECT_EQ(row[x], d2 ? 1.0 / std::exp(std::log(double(d2))) : 0.0) << px << " " << x << " " << y;
-            }
-        }
 }
 
 TEST(FreeForm, HoleFillingReachAndOrder) {

@@ -1,8 +1,5 @@
 // Hostile input beyond the registry's contracts: pair lists, counts and wave
 // maps at their extremes.
-#include <climits>
-#include <cmath>
-
 #include "support/hostile.hpp"
 
 using namespace pxtest::hostile;

@@ -1,9 +1,5 @@
-// Polar transforms against a straightforward accessor version, and the
-// mirrored identity, the outside colour and the bathroom ribs.
-#include <gtest/gtest.h>
-
-#include <cmath>
-
+// Polar transforms against a straightforward accessor version (the bathroom
+// ribs among them), and the mirrored identity and the outside colour.
 #include "support/reference_check.hpp"
 
 using namespace pxtest;
@@ -49,7 +45,7 @@ TEST(Polar, MatchesAccessorVersion) {
     }
 }
 
-TEST(Polar, MirroredIdentityRibsAndOutsideColour) {
+TEST(Polar, MirroredIdentityAndOutsideColour) {
     Owned src = make(100, 31, 32); // pixel (x, y) holds x in blue and y in green
     for (int y = 0; y < 31; ++y)
         for (int x = 0; x < 100; ++x)
@@ -64,7 +60,4 @@ TEST(Polar, MirroredIdentityRibsAndOutsideColour) {
             EXPECT_NEAR(int(c & 255), in * (100 - x), x == 50 || y == 15 ? 0 : 1) << x << "," << y;
             EXPECT_NEAR(int(c >> 8 & 255), in * y, x == 50 || y == 15 ? 0 : 1) << x << "," << y;
         }
-    ASSERT_EQ(CircleTransform(src.get(), &dst, 4, 1000, 1), 1u);
-    for (auto [x, sx] : {std::pair{0, 0}, {15, 14}, {16, 16}, {31, 46}, {32, 16}, {63, 78}, {99, 86}})
-        EXPECT_EQ(GetPixelColor(dst.get(), x, 1), GetPixelColor(src.get(), sx, 1)) << x;
 }

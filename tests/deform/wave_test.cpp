@@ -1,10 +1,5 @@
 // The wave's height map and render against straightforward versions built on
 // Distance2D, tsin and the pixel accessors, including wrapping products.
-#include <gtest/gtest.h>
-
-#include <algorithm>
-#include <vector>
-
 #include "support/reference_check.hpp"
 
 using namespace pxtest;

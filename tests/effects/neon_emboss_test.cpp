@@ -1,9 +1,5 @@
 // Neon, emboss and the dispatcher against straightforward accessor versions,
 // plus the result-image rule on the branches the registry does not reach.
-#include <gtest/gtest.h>
-
-#include <cstdlib>
-
 #include "support/reference_check.hpp"
 #include "support/slot_rule.hpp"
 

@@ -1,10 +1,5 @@
 // Sketch and photocopy against straightforward versions that follow the
 // plane-by-plane recipe literally.
-#include <gtest/gtest.h>
-
-#include <array>
-#include <vector>
-
 #include "support/reference_check.hpp"
 
 using namespace pxtest;

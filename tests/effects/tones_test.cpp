@@ -1,14 +1,9 @@
-// Colour tones, channel shift, channel scaling, contrast and the soft glow:
-// hand-computed pixels for the formulas (with the quirks of their tables),
-// references where a short one exists, every format, the result-image rule.
-#include <gtest/gtest.h>
-
-#include <cstring>
-#include <functional>
-#include <numeric>
-#include <vector>
-
+// Channel shift, channel scaling, contrast and the soft glow: hand-computed
+// pixels for the formulas at parameters beside the golden hashes' (which pin
+// the tones without parameters), references where a short one exists, every
+// format, the result-image rule.
 #include "support/reference_check.hpp"
+#include "support/slot_rule.hpp"
 
 using namespace pxtest;
 
@@ -48,30 +43,13 @@ Owned ref_lambency(const Image *src) {
 } // namespace
 
 TEST(Tones, HandComputedPixelsInEveryFormat) {
-    using Run = std::function<uint32_t(Image *, Image **)>;
-    const auto light = [](uint32_t p, uint32_t ch) {
-        return Run([=](Image *s, Image **d) { return PX_IMG_Light_Alter(s, d, p, ch); });
-    };
-    const auto contrast = [](int32_t c) { return Run([=](Image *s, Image **d) { return PX_IMG_Ballance(s, d, c); }); };
+    const auto light = [](uint32_t p, uint32_t ch) { return bind_slot(PX_IMG_Light_Alter, p, ch); };
+    const auto contrast = [](int32_t c) { return bind_slot(PX_IMG_Ballance, c); };
     const uint32_t in = rgba(10, 200, 30, 77);
     const struct {
-        Run effect;
+        SlotCall effect;
         uint32_t in, out;
     } cases[] = {
-        {PX_IMG_Negative, rgba(0, 100, 255, 7), rgba(255, 155, 0, 7)},
-        {PX_IMG_WARM_YELLOW, rgba(160, 100, 255, 9), rgba(150, 69, 255, 9)}, // green - (255 >> 3)
-        {PX_IMG_WARM_YELLOW, rgba(0, 3, 80, 9), rgba(0, 0, 100, 9)},         // green floors at 0
-        {PX_IMG_COLD_PUPRLE, rgba(100, 50, 200, 9), rgba(125, 59, 150, 9)},
-        {PX_IMG_Repristination, rgba(0, 0, 0, 9), rgba(20, 0, 0, 9)},
-        {PX_IMG_Repristination, rgba(10, 20, 31, 9), rgba(40, 20, 0, 9)},
-        // Old photograph: red sums clamp, green and blue wrap; tables are not monotone.
-        {PX_IMG_Classical_Photograph, rgba(1, 1, 1, 9), rgba(0, 0, 255, 9)},
-        {PX_IMG_Classical_Photograph, rgba(40, 41, 40, 9), rgba(34, 11, 255, 9)},
-        {PX_IMG_Classical_Photograph, rgba(58, 149, 41, 9), rgba(58, 148, 41, 9)},
-        {PX_IMG_Classical_Photograph, rgba(254, 254, 254, 9), rgba(253, 252, 255, 9)},
-        {PX_IMG_Classical_Photograph, rgba(255, 255, 255, 9), rgba(253, 253, 255, 9)},
-        {PX_IMG_Classical_Photograph, rgba(102, 139, 10, 9), rgba(118, 132, 255, 9)},
-        {PX_IMG_Classical_Photograph, rgba(101, 138, 200, 9), rgba(118, 132, 232, 9)},
         {light(50, 0), in, rgba(10, 200, 15, 77)},
         {light(200, 1), in, rgba(10, 255, 30, 77)},
         {light(37, 2), in, rgba(3, 200, 30, 77)},

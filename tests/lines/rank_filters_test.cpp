@@ -1,11 +1,6 @@
 // Medians and the edge marker against straightforward versions on random
 // planes.
-#include <gtest/gtest.h>
-
-#include <algorithm>
-#include <cstring>
 #include <tuple>
-#include <vector>
 
 #include "support/test_images.hpp"
 

@@ -1,12 +1,6 @@
 // Straightening along tilted boundaries, RecognizeYUV's limits and delivery,
 // the vertical resampler against its formula, and the run finder and the
 // interval helpers on hand-made lists.
-#include <gtest/gtest.h>
-
-#include <algorithm>
-#include <climits>
-#include <vector>
-
 #include "lines/lines_internal.hpp"
 #include "support/test_images.hpp"
 
@@ -99,8 +93,7 @@ TEST(MyResample2, InterpolatesRowsWithRounding) {
     EXPECT_EQ(MyResample2(src.get(), 1), nullptr);
     EXPECT_EQ(MyResample2(src.get(), 50), nullptr);
     // One row is only copied.
-    Image row = *src;
-    row.height = 1;
+    Image row = reshaped(src.get(), 17, 1);
     Owned copied(MyResample2(&row, 7));
     ASSERT_NE(copied, nullptr);
     EXPECT_TRUE(std::equal(src->bits, src->bits + 17, copied->bits) && copied->height == 1);

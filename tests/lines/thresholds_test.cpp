@@ -1,9 +1,5 @@
 // Thresholds with and without spread, band binarisation, dot removal, and
 // the band codes written on synthetic binarised pages of horizontal lines.
-#include <gtest/gtest.h>
-
-#include <vector>
-
 #include "lines/lines_internal.hpp"
 #include "support/test_images.hpp"
 

@@ -1,7 +1,6 @@
 // Every row of the registry held to its hostile-input contract: broken
 // records refused, extremes survived, failing allocations handled.
 #include <set>
-#include <string>
 #include <variant>
 
 #include "operations.hpp"

@@ -1,12 +1,9 @@
 // The shared library exports exactly the functions of the registry and the
 // service functions beside it: nothing missing, nothing else.
-#include <gtest/gtest.h>
-
-#include <fstream>
 #include <set>
-#include <string>
 
 #include "operations.hpp"
+#include "support/test_images.hpp"
 
 TEST(Registry, SharedLibraryExportsExactlyTheRegistry) {
 #ifdef PXFX_COVERAGE_BUILD

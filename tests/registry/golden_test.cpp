@@ -2,10 +2,6 @@
 // count it accepts, runs on fixed pictures and the hashes of its outputs must
 // equal the checked-in golden file, on x86-64, arm64 and 32-bit ARM alike.
 // PXFX_UPDATE_GOLDEN=1 rewrites the file (only after a deliberate change).
-#include <gtest/gtest.h>
-
-#include <cstdlib>
-#include <fstream>
 #include <map>
 #include <sstream>
 

@@ -4,13 +4,8 @@
 // stream (found by running them under two seeds) share that stream: they run
 // one at a time under a lock and reseeded, as callers on several threads must
 // run them. The ThreadSanitizer build of .ci/run runs this test too.
-#include <gtest/gtest.h>
-
-#include <cstdlib>
 #include <mutex>
-#include <string>
 #include <thread>
-#include <vector>
 
 #include "operations.hpp"
 #include "support/test_images.hpp"

@@ -1,10 +1,5 @@
 // Eye enlargement, eye contrast and the dark-circle correction against
 // accessor versions, and the automatic eye search on a synthetic face.
-#include <gtest/gtest.h>
-
-#include <algorithm>
-#include <array>
-
 #include "retouch/reference.hpp"
 
 using namespace pxtest;

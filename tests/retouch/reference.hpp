@@ -2,10 +2,6 @@
 // test pictures, shared by the retouch tests.
 #pragma once
 
-#include <algorithm>
-#include <cstdlib>
-#include <random>
-
 #include "support/reference_check.hpp"
 
 namespace rtest {

@@ -1,9 +1,7 @@
 // Skin mask, skin smoothing and the rank filters, against accessor versions
-// on portrait-like pictures of every format and on the bundled portrait.
-#include <gtest/gtest.h>
-
-#include <vector>
-
+// on portrait-like pictures of every format and on the bundled portrait (the
+// mask in the picture's own format, SmileDetect, is pinned by the golden
+// hashes).
 #include "retouch/reference.hpp"
 
 using namespace pxtest;
@@ -38,13 +36,7 @@ TEST(SkinMask, MaskAndSpotBrighteningMatchAccessorVersions) {
         ASSERT_EQ(alg_Img_smooth_1(src.get(), &dst), 1);
         EXPECT_EQ(diff(dst.get(), ref_smooth_1(src.get()).get()), "") << src->width << "x" << src->height;
     }
-    // SmileDetect hands the mask out in the source's format.
     const Image *portrait = pics.back().get();
-    Slot shown;
-    ASSERT_EQ(SmileDetect(portrait, &shown, 0), 1);
-    Owned expected = make(128, 128, 24);
-    PX_Img_Copy(expected.get(), ref_mask(portrait).get());
-    EXPECT_EQ(diff(shown.get(), expected.get()), "");
     // Skin tone: LightUP once without lighten, twice with, then the 52:75 blend.
     for (int32_t lighten : {0, 1}) {
         Owned want = mapped(ref_smooth_1(portrait).get(),

@@ -1,10 +1,4 @@
 // Tone curves, automatic levels, exposure and the cross median filter.
-#include <gtest/gtest.h>
-
-#include <algorithm>
-#include <cmath>
-#include <vector>
-
 #include "retouch/reference.hpp"
 
 using namespace pxtest;

@@ -10,22 +10,8 @@
 // without checking is caught by the sanitizers.
 #pragma once
 
-#include <gtest/gtest.h>
-
-#include <algorithm>
-#include <climits>
-#include <cstddef>
-#include <cstdlib>
-#include <cstring>
-#include <functional>
-#include <memory>
-#include <random>
-#include <string>
-#include <vector>
-
 #include "support/alloc_failures.hpp"
 #include "support/slot_rule.hpp"
-#include "support/test_images.hpp"
 #include "tools/contract.hpp"
 
 namespace pxtest::hostile {
@@ -46,10 +32,9 @@ template <class R> struct Held {
 template <class R> using HeldPtr = std::unique_ptr<Held<R>>;
 
 inline std::vector<uint8_t> noise(size_t bytes, uint32_t seed) {
-    std::vector<uint8_t> v(bytes);
     std::mt19937 rng(seed);
-    for (auto &b : v)
-        b = static_cast<uint8_t>(rng() >> 24);
+    std::vector<uint8_t> v(bytes);
+    std::generate(v.begin(), v.end(), [&rng] { return static_cast<uint8_t>(rng() >> 24); });
     return v;
 }
 
@@ -126,15 +111,6 @@ using pxop::kNoResult;
 
 inline constexpr int32_t kExtremes[] = {INT_MIN, -70000, -256, -1, 0, 1, 2, 255, 256, 70000, INT_MAX};
 
-template <class R> void release(R *&im) {
-    if constexpr (std::is_same_v<R, Image>) {
-        free_Image(&im, 0);
-    } else {
-        PXImage_Free(im);
-        im = nullptr;
-    }
-}
-
 // Size, bit count and pixel block of a picture (empty for none), field by
 // field: the padding between a record's fields holds nothing to compare.
 template <class R> std::vector<uint8_t> picture_bytes(const R *im) {
@@ -179,7 +155,10 @@ template <class R> struct Runner {
         if (nullSlot) call.slot = nullptr;
         const int64_t r = c.call(call);
         Outcome o{r, picture_bytes(call.out), shape_of(call.out)};
-        release(call.out);
+        if constexpr (std::is_same_v<R, Image>)
+            free_Image(&call.out, 0);
+        else
+            PXImage_Free(call.out);
         return o;
     }
     void expect_refused(R *a, R *b, bool nullSlot, const std::vector<const Held<R> *> &inputs, const std::string &why) {

@@ -2,10 +2,6 @@
 // pictures of every format and awkward size.
 #pragma once
 
-#include <gtest/gtest.h>
-
-#include <cstdint>
-
 #include "support/test_images.hpp"
 
 namespace pxtest {

@@ -4,12 +4,6 @@
 // branch.
 #pragma once
 
-#include <gtest/gtest.h>
-
-#include <cstring>
-#include <functional>
-#include <vector>
-
 #include "support/test_images.hpp"
 
 namespace pxtest {

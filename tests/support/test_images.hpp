@@ -1,18 +1,27 @@
 // Helpers shared by the test programs: owned images, seeded random pictures
-// and pixel comparisons.
+// and pixel comparisons; with the headers every test file uses.
 #pragma once
 
+#include <gtest/gtest.h>
 #include <pxfx/pxfx.h>
 
 #include <algorithm>
+#include <array>
+#include <climits>
+#include <cmath>
 #include <cstdint>
+#include <cstdio>
 #include <cstdlib>
+#include <cstring>
 #include <fstream>
+#include <functional>
 #include <iterator>
 #include <memory>
+#include <numeric>
 #include <random>
 #include <string>
 #include <type_traits>
+#include <utility>
 #include <vector>
 
 namespace pxtest {
@@ -59,19 +68,13 @@ struct Slot {
     Image *get() const { return image; }
 };
 
-// A record over held's pixels (or none) that claims another size, and a
-// table row of such a shape with the result a function gives for it.
+// A record over held's pixels (or none) that claims another size.
 inline Image reshaped(const Image *held, int32_t w, int32_t h, bool pixels = true) {
     Image r = *held;
     r.width = w, r.height = h;
     if (!pixels) r.bits = nullptr;
     return r;
 }
-struct ShapeCase {
-    int32_t w, h;
-    bool pixels;
-    int32_t result;
-};
 
 // The shape of a result picture, as a contract pins it (pxop::Accepted).
 template <class R> std::string shape_of(const R *im) {

@@ -1,12 +1,5 @@
 // Exposure, Otsu threshold and white balance; the curve-table colour filters
 // against per-sample maps written straight from their rules.
-#include <gtest/gtest.h>
-
-#include <cmath>
-#include <functional>
-#include <vector>
-
-#include "support/test_images.hpp"
 #include "toolkit/px_images.hpp"
 
 using namespace pxtest;

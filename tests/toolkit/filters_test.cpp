@@ -1,12 +1,5 @@
 // Sharpening, smoothing, edges, the sort and the two effects against
 // brute-force versions on awkward sizes of every supported format.
-#include <gtest/gtest.h>
-
-#include <algorithm>
-#include <array>
-#include <cmath>
-#include <numeric>
-
 #include "toolkit/px_images.hpp"
 
 using namespace pxtest;

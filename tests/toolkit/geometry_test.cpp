@@ -1,12 +1,5 @@
 // Resize, crop, the region zoom on degenerate input and the small record
 // helpers against straightforward per-pixel versions.
-#include <gtest/gtest.h>
-
-#include <climits>
-#include <cmath>
-#include <functional>
-#include <utility>
-
 #include "toolkit/px_images.hpp"
 
 using namespace pxtest;

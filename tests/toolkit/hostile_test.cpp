@@ -1,20 +1,9 @@
 // Hostile input beyond the registry's contracts: curve-filter masks, planes,
 // rectangles, points and sorts at their extremes.
-#include <climits>
-
 #include "support/hostile.hpp"
 
 using namespace pxtest::hostile;
-
-namespace {
-
-// A rectangle and a point following the parameter, and the address of such a
-// value for the duration of a call.
-PXRect rect(int32_t p) { return {1, p, p, 0}; }
-PXPoint point(int32_t p) { return {p, p}; }
-template <class T> const T *ptr(const T &v) { return &v; }
-
-} // namespace
+using pxop::point, pxop::ptr, pxop::rect;
 
 TEST(Hostile, CurveFilterMasks) {
     // Masks without pixels or area select nothing; the others are refused.

@@ -4,12 +4,6 @@
 
 #include <pxfx/pxfx.h>
 
-#include <cstdint>
-#include <cstring>
-#include <memory>
-#include <random>
-#include <vector>
-
 #include "support/test_images.hpp"
 
 namespace pxtest {

@@ -1,12 +1,6 @@
 // The pxfx tool end to end: every operation of the table through `pxfx apply`,
 // batches, and the error cases (exit status, no output left behind).
-#include <gtest/gtest.h>
-
-#include <cstdio>
-#include <cstdlib>
 #include <filesystem>
-#include <fstream>
-#include <string>
 
 #include "image_io.hpp"
 #include "operations.hpp"
@@ -33,6 +27,13 @@ class Cli : public InTempDir {
         return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
     }
     std::string p(const char *name) const { return (dir / name).string(); }
+    // The picture in dir/name, which must read.
+    Owned read(const char *name) const {
+        std::string error;
+        Owned im(pxio::read_image(p(name), &error));
+        EXPECT_TRUE(im) << name << ": " << error;
+        return im;
+    }
 };
 
 } // namespace
@@ -42,9 +43,8 @@ TEST_F(Cli, EveryOperationProducesADecodablePicture) {
         for (const char *input : {"colour.png", "alpha.png"}) {
             const std::string out = p("out.png");
             ASSERT_EQ(run("apply " + std::string(op.name) + " " + p(input) + " " + out), 0) << op.name << " " << input;
-            std::string error;
-            Owned in(pxio::read_image(p(input), &error)), result(pxio::read_image(out, &error));
-            ASSERT_TRUE(result) << op.name << ": " << error;
+            Owned in = read(input), result = read("out.png");
+            ASSERT_TRUE(result) << op.name;
             if (op.sameSize) {
                 EXPECT_EQ(result->width, in->width) << op.name;
                 EXPECT_EQ(result->height, in->height) << op.name;
@@ -55,14 +55,11 @@ TEST_F(Cli, EveryOperationProducesADecodablePicture) {
 }
 
 TEST_F(Cli, FormatsAndBatches) {
-    EXPECT_EQ(run("apply sketch " + p("colour.png") + " " + p("a.bmp")), 0);
-    std::string error;
-    Owned bmp(pxio::read_image(p("a.bmp"), &error));
-    ASSERT_TRUE(bmp) << error;
     // BMP output stands upright: it reads back as the PNG path's result.
-    EXPECT_EQ(run("apply sketch " + p("colour.png") + " " + p("a.png")), 0);
-    Owned png(pxio::read_image(p("a.png"), &error));
-    EXPECT_EQ(diff(bmp.get(), png.get()), "");
+    EXPECT_EQ(run("apply sketch " + p("colour.png") + " " + p("a.bmp")) +
+                  run("apply sketch " + p("colour.png") + " " + p("a.png")),
+              0);
+    EXPECT_EQ(diff(read("a.bmp").get(), read("a.png").get()), "");
 
     // Pictures from a phone: turned upright, written in each output format
     // with the picture options.
@@ -72,9 +69,8 @@ TEST_F(Cli, FormatsAndBatches) {
                       sideways + " " + p(out)),
                   0)
             << out;
-        Owned up(pxio::read_image(p(out), &error));
-        ASSERT_TRUE(up) << error;
-        EXPECT_EQ(up->width, 48) << out;
+        Owned up = read(out);
+        EXPECT_TRUE(up && up->width == 48) << out;
     }
 
     EXPECT_EQ(run("apply neon " + p("colour.png") + " " + p("alpha.png") + " -o " + p("batch") + " -j 2"), 0);

@@ -2,16 +2,9 @@
 // scripts/make-picture-fixtures.py) decodes to the pixels its generator gave
 // it, metadata reaches the outputs, and broken or oversized files fail with a
 // message.
-#include <gtest/gtest.h>
-
 #include <libexif/exif-data.h>
 
-#include <cstdio>
-#include <cstdlib>
 #include <filesystem>
-#include <fstream>
-#include <string>
-#include <vector>
 
 #include <jpeglib.h>
 
@@ -141,10 +134,8 @@ TEST_F(PictureFiles, YcckJpegReadsLikeItsInks) {
     for (int x = 0; x < 64; ++x)
         for (int i = 0; i < 4; ++i)
             row[4 * x + i] = static_cast<uint8_t>(255 - inks[x / 16][i]); // stored inverted, with Adobe's marker
-    for (int y = 0; y < 16; ++y) {
-        JSAMPROW p = row.data();
-        jpeg_write_scanlines(&info, &p, 1);
-    }
+    std::vector<JSAMPROW> rows(16, row.data());
+    jpeg_write_scanlines(&info, rows.data(), 16);
     jpeg_finish_compress(&info);
     jpeg_destroy_compress(&info);
     std::fclose(f);
