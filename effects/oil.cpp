@@ -7,6 +7,7 @@
 #include <optional>
 
 #include "core/internal/image_check.hpp"
+#include "core/internal/math.hpp"
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/rank.hpp"
@@ -48,12 +49,12 @@ template <class S> void remove_pixel(Hist<S> &h, uint32_t c) {
     h.remove(kBlue + k, blue_of(c));
 }
 
-// Mean colour of the most populated class, the lowest class on a tie.
-template <class S> uint32_t dominant(const Hist<S> &h, uint32_t alpha) {
+// Mean colour of the most populated class, the lowest class on a tie: each
+// sum divided (truncating) by the class's count through div(sum, count).
+template <class S, class Div> uint32_t dominant(const Hist<S> &h, uint32_t alpha, const Div &div) {
     const int32_t k = rank::most_frequent(h, 0, kClasses);
     const S n = h.count(k);
-    return pack(static_cast<uint32_t>(h.count(kBlue + k) / n), static_cast<uint32_t>(h.count(kGreen + k) / n),
-                static_cast<uint32_t>(h.count(kRed + k) / n), alpha);
+    return pack(div(h.count(kBlue + k), n), div(h.count(kGreen + k), n), div(h.count(kRed + k), n), alpha);
 }
 
 // Border pixels (closer than r to an edge) are copied; interior pixels take
@@ -61,7 +62,8 @@ template <class S> uint32_t dominant(const Hist<S> &h, uint32_t alpha) {
 // per-column histograms over rows y - r .. y + r; moving down a row updates
 // each column by one pixel out and one in, moving right adds one column and
 // subtracts another, so the cost per pixel does not depend on r.
-template <class F, class S> void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols) {
+template <class F, class S, class Div>
+void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols, const Div &div) {
     const int32_t w = src.width, h = src.height;
     for (int32_t x = 0; x < w; ++x)
         cols[x] = Hist<S>{};
@@ -87,10 +89,10 @@ template <class F, class S> void oil(const View &src, const View &dst, int32_t r
         Hist<S> win{};
         for (int32_t x = 0; x <= 2 * r; ++x)
             win.merge(cols[x]);
-        F::store(out, r, dominant(win, alpha_of(F::load(in, r))));
+        F::store(out, r, dominant(win, alpha_of(F::load(in, r)), div));
         for (int32_t x = r + 1; x < w - r; ++x) {
             win.slide(cols[x + r], cols[x - r - 1]);
-            F::store(out, x, dominant(win, alpha_of(F::load(in, x))));
+            F::store(out, x, dominant(win, alpha_of(F::load(in, x)), div));
         }
         for (int32_t x = w - r; x < w; ++x)
             F::store(out, x, F::load(in, x));
@@ -102,14 +104,25 @@ template <class F, class S> void oil(const View &src, const View &dst, int32_t r
 
 template <class F> bool oil_with_sums(const View &src, const View &dst, int32_t r) {
     const uint64_t side = 2 * static_cast<uint64_t>(r) + 1;
-    if (side < 0x10000 && side * side * 255 <= 0xFFFFFFFFu) {
+    if (side <= 64) {
+        // Windows of at most 4096 pixels: every division of a class's sum by
+        // its count is a multiply by that count's exact reciprocal.
+        const auto area = static_cast<uint32_t>(side * side);
+        Buffer<ExactDivisor> reciprocal = alloc_buffer<ExactDivisor>(area + 1);
+        Buffer<Hist<uint32_t>> cols = alloc_buffer<Hist<uint32_t>>(static_cast<size_t>(src.width));
+        if (!reciprocal || !cols) return false;
+        for (uint32_t n = 0; n <= area; ++n)
+            reciprocal[n] = exact_divisor(n > 0 ? n : 1);
+        const ExactDivisor *table = reciprocal.get();
+        oil<F>(src, dst, r, cols.get(), [table](uint32_t s, uint32_t n) { return table[n].divide(s); });
+    } else if (side < 0x10000 && side * side * 255 <= 0xFFFFFFFFu) {
         Buffer<Hist<uint32_t>> cols = alloc_buffer<Hist<uint32_t>>(static_cast<size_t>(src.width));
         if (!cols) return false;
-        oil<F>(src, dst, r, cols.get());
+        oil<F>(src, dst, r, cols.get(), [](uint32_t s, uint32_t n) { return s / n; });
     } else {
         Buffer<Hist<uint64_t>> cols = alloc_buffer<Hist<uint64_t>>(static_cast<size_t>(src.width));
         if (!cols) return false;
-        oil<F>(src, dst, r, cols.get());
+        oil<F>(src, dst, r, cols.get(), [](uint64_t s, uint64_t n) { return static_cast<uint32_t>(s / n); });
     }
     return true;
 }

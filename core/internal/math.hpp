@@ -44,6 +44,16 @@ constexpr ByteSumDivisor byte_sum_divisor(uint32_t a) {
     return {static_cast<uint16_t>(((1u << (16 + p)) + a - 1) / a), p};
 }
 
+// floor(s / n) as a 64-bit multiply and shift: floor(s M / 2^32) with
+// M = ceil(2^32 / n), for 1 <= n and s e < 2^32 where e = M n - 2^32 < n
+// (every s <= 255 n while n < 4104, say). Then s M / 2^32 exceeds s / n by
+// s e / (n 2^32) < 1 / n, which cannot reach the next integer.
+struct ExactDivisor {
+    uint64_t m;
+    constexpr uint32_t divide(uint32_t s) const { return static_cast<uint32_t>((s * m) >> 32); }
+};
+constexpr ExactDivisor exact_divisor(uint32_t n) { return {((uint64_t{1} << 32) + n - 1) / n}; }
+
 // Bit-by-bit square root over 32 bits, rounded to the nearest integer.
 constexpr uint32_t isqrt_round(uint32_t x) {
     uint32_t root = 0;
