@@ -1,4 +1,6 @@
-// Integer math: square root, distances, table trigonometry, random sign rule.
+// Integer math: square root, distances, table trigonometry, random sign rule,
+// multiply-shift division.
+#include "core/internal/math.hpp"
 #include "support/test_images.hpp"
 
 namespace {
@@ -59,5 +61,20 @@ TEST(IntegerMath, RandomSignRuleOverTheLibcStream) {
         const int32_t n = i % 9 - 2;
         const long r = n == 0 ? nrand48(state) : nrand48(state) % n;
         ASSERT_EQ(PX_rand(n), (nrand48(state) & 1) ? r : -r) << i;
+    }
+}
+
+// The multiply-shift divisions are exact over the ranges they are used on;
+// a quotient goes wrong first just below a multiple of the divisor.
+TEST(IntegerMath, MultiplyShiftDivisionsAreExact) {
+    for (uint32_t n = 2; n <= 129; ++n) {
+        const pxfx::ByteSumDivisor d = pxfx::byte_sum_divisor(n);
+        for (uint32_t s = 0; s <= 255 * n; ++s)
+            ASSERT_EQ(((s * d.m) >> 16) >> d.p, s / n) << s << " / " << n;
+    }
+    for (uint32_t n = 1; n <= 4096; ++n) {
+        const pxfx::ExactDivisor d = pxfx::exact_divisor(n);
+        for (uint32_t q = 1; q <= 255; ++q)
+            ASSERT_TRUE(d.divide(q * n - 1) == q - 1 && d.divide(q * n) == q) << q << " * " << n;
     }
 }
