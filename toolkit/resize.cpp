@@ -9,6 +9,7 @@
 #include <cstring>
 
 #include "core/internal/memory.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "toolkit/pximage_check.hpp"
 #include "toolkit/resize_internal.hpp"
 
@@ -30,6 +31,54 @@ struct Taps {
         : i0(alloc_buffer<int32_t>(n)), i1(alloc_buffer<int32_t>(n)), w(alloc_buffer<float>(n)),
           omw(alloc_buffer<float>(n)) {}
     bool ok() const { return i0 && i1 && w && omw; }
+};
+
+// The taps per result sample for the vector blend (vec::ResizeColumns): the
+// offsets of the taps' bytes in a source row, the weights, and each group's
+// load and shuffles.
+struct SampleTaps {
+    Buffer<int32_t> i0, i1, from;
+    Buffer<float> w, omw;
+    Buffer<uint8_t> shuffle;
+    vec::ResizeColumns columns{};
+
+    // For pixels of C samples in source rows of rowBytes bytes; false when
+    // memory is missing.
+    template <int C> bool build(const Taps &cols, int32_t dstWidth, size_t rowBytes) {
+        const size_t n = static_cast<size_t>(dstWidth) * C, groups = n / vec::kResizeGroup;
+        i0 = alloc_buffer<int32_t>(n), i1 = alloc_buffer<int32_t>(n), w = alloc_buffer<float>(n);
+        omw = alloc_buffer<float>(n), from = alloc_buffer<int32_t>(groups);
+        shuffle = alloc_buffer<uint8_t>(groups * 2 * vec::kResizeShuffle);
+        if (!i0 || !i1 || !w || !omw || (groups > 0 && (!from || !shuffle))) return false;
+        for (int32_t j = 0; j < dstWidth; ++j)
+            for (int c = 0; c < C; ++c) {
+                const size_t k = static_cast<size_t>(j) * C + c;
+                i0[k] = cols.i0[j] * C + c, i1[k] = cols.i1[j] * C + c;
+                w[k] = cols.w[j], omw[k] = cols.omw[j];
+            }
+        // A group loads the 16 bytes from its first tap, or the row's last 16
+        // when they reach past the row, and takes the plain blend when its
+        // taps do not fit them.
+        const auto span = static_cast<int64_t>(vec::kResizeShuffle);
+        for (size_t g = 0; g < groups; ++g) {
+            const size_t k = g * vec::kResizeGroup;
+            int32_t lo = i0[k], hi = i1[k];
+            for (size_t s = k; s < k + vec::kResizeGroup; ++s)
+                lo = std::min({lo, i0[s], i1[s]}), hi = std::max({hi, i0[s], i1[s]});
+            const int64_t start = std::min<int64_t>(lo, static_cast<int64_t>(rowBytes) - span);
+            const bool fits = start >= 0 && hi - start < span;
+            from[g] = fits ? static_cast<int32_t>(start) : -1;
+            uint8_t *sh = shuffle.get() + g * 2 * vec::kResizeShuffle;
+            std::memset(sh, 0x80, 2 * vec::kResizeShuffle);
+            if (!fits) continue;
+            for (size_t l = 0; l < vec::kResizeGroup; ++l) {
+                sh[4 * l] = static_cast<uint8_t>(i0[k + l] - start);
+                sh[vec::kResizeShuffle + 4 * l] = static_cast<uint8_t>(i1[k + l] - start);
+            }
+        }
+        columns = {i0.get(), i1.get(), w.get(), omw.get(), from.get(), shuffle.get(), n};
+        return true;
+    }
 };
 
 } // namespace
@@ -81,6 +130,13 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
     // columns used0 .. used1 (the ones the taps read).
     Buffer<float> row = alloc_buffer<float>(static_cast<size_t>(srcWidth) * C);
     if (!row) return false;
+    // The vector blend reads the source bytes themselves, which needs them
+    // packed; without its working memory the plain blend runs.
+    const vec::ResizeAcross vectorAcross = srcStride == C ? vec::resize_across() : nullptr;
+    SampleTaps samples;
+    const bool bytesAcross =
+        vectorAcross != nullptr && samples.build<C>(cols, dstWidth, static_cast<size_t>(srcWidth) * C);
+    const vec::ResizeDown vectorDown = vec::resize_down();
     int32_t cached[2] = {-1, -1};
     const size_t srcRow = static_cast<size_t>(srcWidth) * srcStride;
     const size_t dstRow = static_cast<size_t>(dstWidth) * dstStride;
@@ -88,6 +144,11 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
         float *h = across.get() + static_cast<size_t>(y & 1) * n;
         if (cached[y & 1] == y) return static_cast<const float *>(h);
         const uint8_t *a = src + static_cast<size_t>(y) * srcRow;
+        cached[y & 1] = y;
+        if (bytesAcross) {
+            vectorAcross(a, samples.columns, h);
+            return static_cast<const float *>(h);
+        }
         float *f = row.get();
         if (srcStride == C) {
             for (size_t k = static_cast<size_t>(used0) * C; k < static_cast<size_t>(used1 + 1) * C; ++k)
@@ -98,7 +159,6 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
                     f[static_cast<size_t>(p) * C + c] = static_cast<float>(a[static_cast<size_t>(p) * srcStride + c]);
         }
         blend_columns<C>(f, cols.i0.get(), cols.i1.get(), cols.w.get(), cols.omw.get(), dstWidth, h);
-        cached[y & 1] = y;
         return static_cast<const float *>(h);
     };
     for (int32_t i = 0; i < dstHeight; ++i) {
@@ -116,7 +176,7 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
         // every result lies well inside int32, where the saturating
         // conversion to uint32 is a plain one held at 0.
         if (weightsInRange && std::fabs(wy) <= kMaxPlainWeight && dstStride == C) {
-            for (size_t j = 0; j < n; ++j) {
+            for (size_t j = vectorDown != nullptr ? vectorDown(top, bottom, omwy, wy, n, out) : 0; j < n; ++j) {
                 const auto v = static_cast<int32_t>(omwy * top[j] + wy * bottom[j]);
                 out[j] = static_cast<uint8_t>(v < 0 ? 0 : v);
             }

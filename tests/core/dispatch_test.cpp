@@ -132,19 +132,39 @@ TEST(Dispatch, PictureKernelsMatchThePlainCode) {
                         << bits << " bits, mode " << mode << ", " << i << ", path " << p;
         }
     }
-    for (int32_t bits : {8, 16, 24}) {
-        const pxtest::PX src = pxtest::px_random(131, 9, bits, static_cast<uint32_t>(bits));
-        const auto runs = on_every_path([&] {
-            std::vector<std::vector<uint8_t>> out;
-            for (const auto &[w, h] : {std::pair(97, 5), std::pair(300, 20), std::pair(1, 3)}) {
-                const pxtest::PX resized(PXImage_Resize(src.get(), w, h));
-                out.push_back(pxtest::bytes(resized.get()));
-            }
-            return out;
-        });
-        for (size_t p = 1; p < runs.size(); ++p)
-            EXPECT_EQ(runs[p], runs[0]) << bits << " bits, path " << p;
-    }
+}
+
+// The resize at factors below 1, above 1 and not whole (1/2, 3/2, a spread
+// past the byte shuffles' 16 bytes), widths that leave partial groups and
+// vectors, rows shorter than 16 bytes; and the plane interpolation at scales
+// whose weights leave 0..1 (negative, and large enough to clamp).
+TEST(Dispatch, ResizeMatchesThePlainLoops) {
+    constexpr std::pair<int32_t, int32_t> kSources[] = {{131, 9}, {40, 30}, {5, 3}};
+    constexpr std::pair<int32_t, int32_t> kTargets[] = {{97, 5}, {300, 20}, {1, 3}, {1000, 11}, {37, 2}};
+    for (int32_t bits : {8, 16, 24})
+        for (const auto &[sw, sh] : kSources) {
+            const pxtest::PX src = pxtest::px_random(sw, sh, bits, static_cast<uint32_t>(bits + sw));
+            std::vector<std::pair<int32_t, int32_t>> sizes(std::begin(kTargets), std::end(kTargets));
+            sizes.insert(sizes.end(), {{sw / 2, sh / 2}, {sw * 3 / 2, sh * 3 / 2}, {sw + 3, sh - 1}});
+            const auto runs = on_every_path([&] {
+                std::vector<std::vector<uint8_t>> out;
+                for (const auto &[w, h] : sizes) {
+                    const pxtest::PX resized(PXImage_Resize(src.get(), w, h));
+                    out.push_back(pxtest::bytes(resized.get()));
+                }
+                if (bits == 8)
+                    for (float scale : {-1.5f, 0.37f, 3.0f}) {
+                        std::vector<uint8_t> plane(77 * 13);
+                        EXPECT_EQ(DualLinearIntepol_KWB(src->data, sw, sh, plane.data(), 77, 13, scale), 1);
+                        out.push_back(plane);
+                    }
+                return out;
+            });
+            for (size_t p = 1; p < runs.size(); ++p)
+                for (size_t i = 0; i < runs[0].size(); ++i)
+                    EXPECT_EQ(runs[p][i], runs[0][i])
+                        << bits << " bits, " << sw << " x " << sh << ", " << i << ", path " << p;
+        }
 }
 
 // The 5 x 5 median (PXImage_Smooth at 60..79) at widths around the vector

@@ -1,0 +1,107 @@
+// The two blends of the bilinear resize in vectors. Across a row, each group
+// of four result samples takes its source bytes from one 16-byte load through
+// two byte shuffles that place every tap's byte in the low byte of a 32-bit
+// lane; the bytes become floats exactly, so the products and sums are the
+// plain loop's. Down the rows, whole vectors of both blended rows are mixed,
+// truncated and held at 0 as the plain loop does, and their low bytes kept.
+#ifndef PXFX_PORTABLE_ONLY
+
+#undef HWY_TARGET_INCLUDE
+#define HWY_TARGET_INCLUDE "toolkit/resize_vector.cpp"
+#include <hwy/foreach_target.h> // IWYU pragma: keep
+#include <hwy/highway.h>
+
+#include "core/internal/vector_kernels.hpp"
+
+HWY_BEFORE_NAMESPACE();
+namespace pxfx::HWY_NAMESPACE {
+namespace {
+
+namespace hn = hwy::HWY_NAMESPACE;
+
+void resize_across(const uint8_t *row, const vec::ResizeColumns &c, float *HWY_RESTRICT h) {
+    const int32_t *HWY_RESTRICT i0 = c.i0, *HWY_RESTRICT i1 = c.i1;
+    const float *HWY_RESTRICT w = c.w, *HWY_RESTRICT omw = c.omw;
+    const size_t n = c.n;
+    auto plain = [&](size_t k) {
+        h[k] = omw[k] * static_cast<float>(row[i0[k]]) + w[k] * static_cast<float>(row[i1[k]]);
+    };
+    size_t k = 0;
+#if HWY_TARGET != HWY_SCALAR
+    // The shuffles work on 16 bytes whatever the target's vector size (single
+    // lanes, never chosen by core/cpu.cpp, blend every sample plainly).
+    const hn::FixedTag<uint8_t, 16> d8;
+    const hn::FixedTag<int32_t, 4> di;
+    const hn::FixedTag<float, 4> df;
+    const int32_t *HWY_RESTRICT from = c.from;
+    const uint8_t *HWY_RESTRICT shuffle = c.shuffle;
+    for (const size_t whole = n / vec::kResizeGroup * vec::kResizeGroup; k < whole; k += vec::kResizeGroup) {
+        const size_t g = k / vec::kResizeGroup;
+        if (from[g] < 0) {
+            for (size_t s = k; s < k + vec::kResizeGroup; ++s)
+                plain(s);
+            continue;
+        }
+        const auto bytes = hn::LoadU(d8, row + from[g]);
+        const uint8_t *sh = shuffle + 2 * vec::kResizeShuffle * g;
+        const auto a = hn::BitCast(di, hn::TableLookupBytesOr0(bytes, hn::LoadU(d8, sh)));
+        const auto b = hn::BitCast(di, hn::TableLookupBytesOr0(bytes, hn::LoadU(d8, sh + vec::kResizeShuffle)));
+        const auto left = hn::Mul(hn::LoadU(df, omw + k), hn::ConvertTo(df, a));
+        const auto right = hn::Mul(hn::LoadU(df, w + k), hn::ConvertTo(df, b));
+        hn::StoreU(hn::Add(left, right), df, h + k);
+    }
+#endif
+    for (; k < n; ++k)
+        plain(k);
+}
+
+// The vertical blend into bytes. Blended rows in 0..255 under weights in 0..1
+// give sums in 0..256, which the truncation keeps in 0..255; on x86 these
+// skip the conversion's repair of out-of-range lanes: rounded toward zero and
+// added to 2^23 (exactly), their integer is the float's low mantissa bits.
+size_t resize_down(const float *HWY_RESTRICT top, const float *HWY_RESTRICT bottom, float omw, float w, size_t n,
+                   uint8_t *HWY_RESTRICT out) {
+    const hn::ScalableTag<float> df;
+    const hn::RebindToSigned<decltype(df)> di;
+    const hn::RebindToUnsigned<decltype(df)> du;
+    const hn::Rebind<uint8_t, decltype(df)> d8;
+    const size_t lanes = hn::Lanes(df);
+    const auto vomw = hn::Set(df, omw), vw = hn::Set(df, w);
+    auto sum = [&](size_t k) {
+        return hn::Add(hn::Mul(vomw, hn::LoadU(df, top + k)), hn::Mul(vw, hn::LoadU(df, bottom + k)));
+    };
+    size_t k = 0;
+#if HWY_ARCH_X86 && HWY_TARGET <= HWY_SSE4
+    if (w >= 0.0f && w <= 1.0f && omw >= 0.0f && omw <= 1.0f) {
+        const auto mantissa = hn::Set(df, 8388608.0f);
+        for (; k + lanes <= n; k += lanes)
+            hn::StoreU(hn::TruncateTo(d8, hn::BitCast(du, hn::Add(hn::Trunc(sum(k)), mantissa))), d8, out + k);
+        return k;
+    }
+#endif
+    const auto zero = hn::Zero(di);
+    for (; k + lanes <= n; k += lanes)
+        hn::StoreU(hn::TruncateTo(d8, hn::BitCast(du, hn::Max(hn::ConvertTo(di, sum(k)), zero))), d8, out + k);
+    return k;
+}
+
+} // namespace
+} // namespace pxfx::HWY_NAMESPACE
+HWY_AFTER_NAMESPACE();
+
+#if HWY_ONCE
+#include "core/internal/simd.hpp"
+
+namespace pxfx {
+namespace {
+HWY_EXPORT(resize_across);
+HWY_EXPORT(resize_down);
+} // namespace
+
+vec::ResizeAcross vec::resize_across() { return PXFX_VECTOR_COPY(resize_across); }
+vec::ResizeDown vec::resize_down() { return PXFX_VECTOR_COPY(resize_down); }
+
+} // namespace pxfx
+#endif
+
+#endif // PXFX_PORTABLE_ONLY
