@@ -55,34 +55,45 @@ void resize_across(const uint8_t *row, const vec::ResizeColumns &c, float *HWY_R
         plain(k);
 }
 
-// The vertical blend into bytes. Blended rows in 0..255 under weights in 0..1
-// give sums in 0..256, which the truncation keeps in 0..255; on x86 these
-// skip the conversion's repair of out-of-range lanes: rounded toward zero and
-// added to 2^23 (exactly), their integer is the float's low mantissa bits.
-size_t resize_down(const float *HWY_RESTRICT top, const float *HWY_RESTRICT bottom, float omw, float w, size_t n,
-                   uint8_t *HWY_RESTRICT out) {
+// The vertical blend into bytes over whole vectors from k; returns where it
+// stopped. Weights 1 and 0 give the top row itself (0 times a finite sample
+// is 0), which spares the products. kSmall: the sums lie in 0..256 (blended
+// rows in 0..255 under weights in 0..1) and their truncations in 0..255; on
+// x86 these skip the conversion's repair of out-of-range lanes: rounded
+// toward zero and added to 2^23 (exactly), their integer is the float's low
+// mantissa bits.
+template <bool kTopOnly, bool kSmall>
+size_t down_vectors(const float *HWY_RESTRICT top, const float *HWY_RESTRICT bottom, float omw, float w, size_t n,
+                    uint8_t *HWY_RESTRICT out) {
     const hn::ScalableTag<float> df;
     const hn::RebindToSigned<decltype(df)> di;
     const hn::RebindToUnsigned<decltype(df)> du;
     const hn::Rebind<uint8_t, decltype(df)> d8;
     const size_t lanes = hn::Lanes(df);
     const auto vomw = hn::Set(df, omw), vw = hn::Set(df, w);
-    auto sum = [&](size_t k) {
-        return hn::Add(hn::Mul(vomw, hn::LoadU(df, top + k)), hn::Mul(vw, hn::LoadU(df, bottom + k)));
-    };
-    size_t k = 0;
-#if HWY_ARCH_X86 && HWY_TARGET <= HWY_SSE4
-    if (w >= 0.0f && w <= 1.0f && omw >= 0.0f && omw <= 1.0f) {
-        const auto mantissa = hn::Set(df, 8388608.0f);
-        for (; k + lanes <= n; k += lanes)
-            hn::StoreU(hn::TruncateTo(d8, hn::BitCast(du, hn::Add(hn::Trunc(sum(k)), mantissa))), d8, out + k);
-        return k;
-    }
-#endif
+    const auto mantissa = hn::Set(df, 8388608.0f);
     const auto zero = hn::Zero(di);
-    for (; k + lanes <= n; k += lanes)
-        hn::StoreU(hn::TruncateTo(d8, hn::BitCast(du, hn::Max(hn::ConvertTo(di, sum(k)), zero))), d8, out + k);
+    size_t k = 0;
+    HWY_UNROLL(4)
+    for (; k + lanes <= n; k += lanes) {
+        const auto t = hn::LoadU(df, top + k);
+        const auto sum = kTopOnly ? t : hn::Add(hn::Mul(vomw, t), hn::Mul(vw, hn::LoadU(df, bottom + k)));
+        const auto v =
+            kSmall ? hn::BitCast(di, hn::Add(hn::Trunc(sum), mantissa)) : hn::Max(hn::ConvertTo(di, sum), zero);
+        hn::StoreU(hn::TruncateTo(d8, hn::BitCast(du, v)), d8, out + k);
+    }
     return k;
+}
+
+size_t resize_down(const float *top, const float *bottom, float omw, float w, size_t n, uint8_t *out) {
+    const bool topOnly = omw == 1.0f && w == 0.0f;
+#if HWY_ARCH_X86 && HWY_TARGET <= HWY_SSE4
+    if (w >= 0.0f && w <= 1.0f && omw >= 0.0f && omw <= 1.0f)
+        return topOnly ? down_vectors<true, true>(top, bottom, omw, w, n, out)
+                       : down_vectors<false, true>(top, bottom, omw, w, n, out);
+#endif
+    return topOnly ? down_vectors<true, false>(top, bottom, omw, w, n, out)
+                   : down_vectors<false, false>(top, bottom, omw, w, n, out);
 }
 
 } // namespace

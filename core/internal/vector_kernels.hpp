@@ -116,7 +116,8 @@ struct ResizeColumns {
     size_t n;
 };
 using ResizeAcross = void (*)(const uint8_t *row, const ResizeColumns &columns, float *h);
-// The vertical blend of two blended rows: out[k] = the low byte of
+// The vertical blend of two blended rows of samples in about 0..255 (as
+// blends of bytes under weights in 0..1 give them): out[k] = the low byte of
 // max(0, (int32_t)(omw * top[k] + w * bottom[k])), every sum inside int32,
 // for the first k < n, a multiple of the vector size; returns how many.
 using ResizeDown = size_t (*)(const float *top, const float *bottom, float omw, float w, size_t n, uint8_t *out);
