@@ -35,21 +35,26 @@ struct Taps {
 
 // The taps per result sample for the vector blend (vec::ResizeColumns): the
 // offsets of the taps' bytes in a source row, the weights, and each group's
-// load and shuffles.
+// load, shuffles and weights.
 struct SampleTaps {
     Buffer<int32_t> i0, i1, from;
     Buffer<float> w, omw;
-    Buffer<uint8_t> shuffle;
+    Buffer<uint8_t> records; // the groups, from its first boundary of their alignment
     vec::ResizeColumns columns{};
 
     // For pixels of C samples in source rows of rowBytes bytes; false when
     // memory is missing.
     template <int C> bool build(const Taps &cols, int32_t dstWidth, size_t rowBytes) {
-        const size_t n = static_cast<size_t>(dstWidth) * C, groups = n / vec::kResizeGroup;
+        const size_t n = static_cast<size_t>(dstWidth) * C, count = n / vec::kResizeGroup;
+        constexpr size_t kAlign = alignof(vec::ResizeGroup);
         i0 = alloc_buffer<int32_t>(n), i1 = alloc_buffer<int32_t>(n), w = alloc_buffer<float>(n);
-        omw = alloc_buffer<float>(n), from = alloc_buffer<int32_t>(groups);
-        shuffle = alloc_buffer<uint8_t>(groups * 2 * vec::kResizeShuffle);
-        if (!i0 || !i1 || !w || !omw || (groups > 0 && (!from || !shuffle))) return false;
+        omw = alloc_buffer<float>(n), from = alloc_buffer<int32_t>(count);
+        // One record more leaves room to start at the boundary (0 bytes, no
+        // buffer, when the size is out of range).
+        records = alloc_buffer<uint8_t>(checked_size(count + 1, sizeof(vec::ResizeGroup)));
+        if (!i0 || !i1 || !w || !omw || (count > 0 && !from) || !records) return false;
+        const uintptr_t at = reinterpret_cast<uintptr_t>(records.get());
+        auto *groups = reinterpret_cast<vec::ResizeGroup *>((at + kAlign - 1) / kAlign * kAlign);
         for (int32_t j = 0; j < dstWidth; ++j)
             for (int c = 0; c < C; ++c) {
                 const size_t k = static_cast<size_t>(j) * C + c;
@@ -59,24 +64,27 @@ struct SampleTaps {
         // A group loads the 16 bytes from its first tap, or the row's last 16
         // when they reach past the row, and takes the plain blend when its
         // taps do not fit them.
-        const auto span = static_cast<int64_t>(vec::kResizeShuffle);
-        for (size_t g = 0; g < groups; ++g) {
+        constexpr int64_t kSpan = sizeof(vec::ResizeGroup::first);
+        for (size_t g = 0; g < count; ++g) {
             const size_t k = g * vec::kResizeGroup;
             int32_t lo = i0[k], hi = i1[k];
             for (size_t s = k; s < k + vec::kResizeGroup; ++s)
                 lo = std::min({lo, i0[s], i1[s]}), hi = std::max({hi, i0[s], i1[s]});
-            const int64_t start = std::min<int64_t>(lo, static_cast<int64_t>(rowBytes) - span);
-            const bool fits = start >= 0 && hi - start < span;
+            const int64_t start = std::min<int64_t>(lo, static_cast<int64_t>(rowBytes) - kSpan);
+            const bool fits = start >= 0 && hi - start < kSpan;
             from[g] = fits ? static_cast<int32_t>(start) : -1;
-            uint8_t *sh = shuffle.get() + g * 2 * vec::kResizeShuffle;
-            std::memset(sh, 0x80, 2 * vec::kResizeShuffle);
-            if (!fits) continue;
+            vec::ResizeGroup &r = groups[g];
+            std::memset(r.first, 0x80, sizeof r.first);
+            std::memset(r.second, 0x80, sizeof r.second);
             for (size_t l = 0; l < vec::kResizeGroup; ++l) {
-                sh[4 * l] = static_cast<uint8_t>(i0[k + l] - start);
-                sh[vec::kResizeShuffle + 4 * l] = static_cast<uint8_t>(i1[k + l] - start);
+                if (fits) {
+                    r.first[4 * l] = static_cast<uint8_t>(i0[k + l] - start);
+                    r.second[4 * l] = static_cast<uint8_t>(i1[k + l] - start);
+                }
+                r.omw[l] = omw[k + l], r.w[l] = w[k + l];
             }
         }
-        columns = {i0.get(), i1.get(), w.get(), omw.get(), from.get(), shuffle.get(), n};
+        columns = {i0.get(), i1.get(), w.get(), omw.get(), from.get(), groups, n};
         return true;
     }
 };

@@ -34,20 +34,20 @@ void resize_across(const uint8_t *row, const vec::ResizeColumns &c, float *HWY_R
     const hn::FixedTag<int32_t, 4> di;
     const hn::FixedTag<float, 4> df;
     const int32_t *HWY_RESTRICT from = c.from;
-    const uint8_t *HWY_RESTRICT shuffle = c.shuffle;
-    for (const size_t whole = n / vec::kResizeGroup * vec::kResizeGroup; k < whole; k += vec::kResizeGroup) {
-        const size_t g = k / vec::kResizeGroup;
-        if (from[g] < 0) {
+    const vec::ResizeGroup *HWY_RESTRICT group = c.groups;
+    HWY_UNROLL(2)
+    for (const size_t whole = n / vec::kResizeGroup * vec::kResizeGroup; k < whole;
+         k += vec::kResizeGroup, ++from, ++group) {
+        if (*from < 0) {
             for (size_t s = k; s < k + vec::kResizeGroup; ++s)
                 plain(s);
             continue;
         }
-        const auto bytes = hn::LoadU(d8, row + from[g]);
-        const uint8_t *sh = shuffle + 2 * vec::kResizeShuffle * g;
-        const auto a = hn::BitCast(di, hn::TableLookupBytesOr0(bytes, hn::LoadU(d8, sh)));
-        const auto b = hn::BitCast(di, hn::TableLookupBytesOr0(bytes, hn::LoadU(d8, sh + vec::kResizeShuffle)));
-        const auto left = hn::Mul(hn::LoadU(df, omw + k), hn::ConvertTo(df, a));
-        const auto right = hn::Mul(hn::LoadU(df, w + k), hn::ConvertTo(df, b));
+        const auto bytes = hn::LoadU(d8, row + *from);
+        const auto a = hn::BitCast(di, hn::TableLookupBytesOr0(bytes, hn::Load(d8, group->first)));
+        const auto b = hn::BitCast(di, hn::TableLookupBytesOr0(bytes, hn::Load(d8, group->second)));
+        const auto left = hn::Mul(hn::Load(df, group->omw), hn::ConvertTo(df, a));
+        const auto right = hn::Mul(hn::Load(df, group->w), hn::ConvertTo(df, b));
         hn::StoreU(hn::Add(left, right), df, h + k);
     }
 #endif

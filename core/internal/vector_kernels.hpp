@@ -101,18 +101,21 @@ inline constexpr int32_t kMinBoxBytes = 2, kMaxBoxBytes = 11;
 // The horizontal blend of the bilinear resize over one row of n result
 // samples: h[k] = omw[k] * row[i0[k]] + w[k] * row[i1[k]], the bytes as
 // floats. The samples go in groups of kResizeGroup: group g reads the 16
-// bytes at row + from[g], and its shuffle bytes (2 kResizeShuffle from
-// shuffle + 2 kResizeShuffle g, those of the first taps, then the second)
-// give the offset of sample k's byte in the low byte of 32-bit lane k - 4g
-// and 0x80 in the three others. A group with from[g] < 0 (taps more than 16
-// bytes apart or a row shorter than 16) and the last n % kResizeGroup samples
-// are blended one by one.
-inline constexpr size_t kResizeGroup = 4, kResizeShuffle = 16;
+// bytes at row + from[g], and groups[g] holds the shuffles that put the
+// offset of each sample's byte among them into the low byte of its 32-bit
+// lane (0x80 in the three others), then the group's weights. A group with
+// from[g] < 0 (taps more than 16 bytes apart or a row shorter than 16) and
+// the last n % kResizeGroup samples are blended one by one.
+inline constexpr size_t kResizeGroup = 4;
+struct alignas(16) ResizeGroup {
+    uint8_t first[16], second[16]; // for the taps i0 and i1
+    float omw[kResizeGroup], w[kResizeGroup];
+};
 struct ResizeColumns {
     const int32_t *i0, *i1;
     const float *w, *omw;
     const int32_t *from;
-    const uint8_t *shuffle;
+    const ResizeGroup *groups;
     size_t n;
 };
 using ResizeAcross = void (*)(const uint8_t *row, const ResizeColumns &columns, float *h);
