@@ -11,6 +11,8 @@
 #include <hwy/foreach_target.h> // IWYU pragma: keep
 #include <hwy/highway.h>
 
+#include <cmath>
+
 #include "core/internal/vector_kernels.hpp"
 
 HWY_BEFORE_NAMESPACE();
@@ -55,14 +57,18 @@ void resize_across(const uint8_t *row, const vec::ResizeColumns &c, float *HWY_R
         plain(k);
 }
 
-// The vertical blend into bytes over whole vectors from k; returns where it
-// stopped. Weights 1 and 0 give the top row itself (0 times a finite sample
-// is 0), which spares the products. kSmall: the sums lie in 0..256 (blended
-// rows in 0..255 under weights in 0..1) and their truncations in 0..255; on
-// x86 these skip the conversion's repair of out-of-range lanes: rounded
-// toward zero and added to 2^23 (exactly), their integer is the float's low
-// mantissa bits.
-template <bool kTopOnly, bool kSmall>
+// How the vertical blend turns its sums into bytes. kConvert: converted to
+// int32 and held at 0. On x86 the conversion repairs out-of-range lanes in
+// extra steps, which sums of known range skip: rounded toward zero and added
+// to 2^23 (exactly), an integer in 0 .. 2^23 - 1 is the float's low mantissa
+// bits. kSmall: the sums lie in 0..256 (blended rows in 0..255 under weights
+// in 0..1); kBounded: they lie within +-2^23 and are held at 0 first.
+enum class Truncation { kConvert, kSmall, kBounded };
+
+// The vertical blend into bytes over whole vectors; returns how many samples
+// it did. Weights 1 and 0 give the top row itself (0 times a finite sample is
+// 0), which spares the products.
+template <bool kTopOnly, Truncation kHow>
 size_t down_vectors(const float *HWY_RESTRICT top, const float *HWY_RESTRICT bottom, float omw, float w, size_t n,
                     uint8_t *HWY_RESTRICT out) {
     const hn::ScalableTag<float> df;
@@ -72,14 +78,18 @@ size_t down_vectors(const float *HWY_RESTRICT top, const float *HWY_RESTRICT bot
     const size_t lanes = hn::Lanes(df);
     const auto vomw = hn::Set(df, omw), vw = hn::Set(df, w);
     const auto mantissa = hn::Set(df, 8388608.0f);
-    const auto zero = hn::Zero(di);
     size_t k = 0;
     HWY_UNROLL(4)
     for (; k + lanes <= n; k += lanes) {
         const auto t = hn::LoadU(df, top + k);
         const auto sum = kTopOnly ? t : hn::Add(hn::Mul(vomw, t), hn::Mul(vw, hn::LoadU(df, bottom + k)));
-        const auto v =
-            kSmall ? hn::BitCast(di, hn::Add(hn::Trunc(sum), mantissa)) : hn::Max(hn::ConvertTo(di, sum), zero);
+        hn::Vec<decltype(di)> v;
+        if constexpr (kHow == Truncation::kConvert) {
+            v = hn::Max(hn::ConvertTo(di, sum), hn::Zero(di));
+        } else {
+            const auto held = kHow == Truncation::kBounded ? hn::Max(sum, hn::Zero(df)) : sum;
+            v = hn::BitCast(di, hn::Add(hn::Trunc(held), mantissa));
+        }
         hn::StoreU(hn::TruncateTo(d8, hn::BitCast(du, v)), d8, out + k);
     }
     return k;
@@ -89,11 +99,14 @@ size_t resize_down(const float *top, const float *bottom, float omw, float w, si
     const bool topOnly = omw == 1.0f && w == 0.0f;
 #if HWY_ARCH_X86 && HWY_TARGET <= HWY_SSE4
     if (w >= 0.0f && w <= 1.0f && omw >= 0.0f && omw <= 1.0f)
-        return topOnly ? down_vectors<true, true>(top, bottom, omw, w, n, out)
-                       : down_vectors<false, true>(top, bottom, omw, w, n, out);
+        return topOnly ? down_vectors<true, Truncation::kSmall>(top, bottom, omw, w, n, out)
+                       : down_vectors<false, Truncation::kSmall>(top, bottom, omw, w, n, out);
+    // Rows below 256 keep the sums below 256 (|omw| + |w|) in magnitude.
+    if (std::fabs(omw) + std::fabs(w) < 32768.0f)
+        return down_vectors<false, Truncation::kBounded>(top, bottom, omw, w, n, out);
 #endif
-    return topOnly ? down_vectors<true, false>(top, bottom, omw, w, n, out)
-                   : down_vectors<false, false>(top, bottom, omw, w, n, out);
+    return topOnly ? down_vectors<true, Truncation::kConvert>(top, bottom, omw, w, n, out)
+                   : down_vectors<false, Truncation::kConvert>(top, bottom, omw, w, n, out);
 }
 
 } // namespace

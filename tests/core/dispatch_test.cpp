@@ -7,6 +7,7 @@
 #include <gtest/gtest.h>
 #include <pxfx/pxfx.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <numeric>
 #include <random>
@@ -16,6 +17,7 @@
 
 #include "core/internal/byte_map.hpp"
 #include "core/internal/cpu.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "support/test_images.hpp"
 #include "toolkit/px_images.hpp"
 
@@ -165,6 +167,33 @@ TEST(Dispatch, ResizeMatchesThePlainLoops) {
                     EXPECT_EQ(runs[p][i], runs[0][i])
                         << bits << " bits, " << sw << " x " << sh << ", " << i << ", path " << p;
         }
+}
+
+// The vertical blend of resize over the whole range its contract allows:
+// weights beyond 0..1 (up to 2^20) under rows that differ, whose sums leave
+// 0..255 both ways; the bytes are the low ones of the truncations held at 0.
+TEST(Dispatch, ResizeDownKeepsTheLowByte) {
+    constexpr std::pair<float, float> kWeights[] = {
+        {1.0f, 0.0f},  {0.5f, 0.5f},        {0.75f, 0.25f},        {1.6667f, -0.6667f},
+        {-0.5f, 1.5f}, {-3749.0f, 3750.0f}, {16384.0f, -16383.0f}, {-1048575.0f, 1048576.0f}};
+    std::mt19937 rng(23);
+    std::vector<float> top(77), bottom(77);
+    for (size_t i = 0; i < top.size(); ++i)
+        top[i] = static_cast<float>(rng() % 2551) / 10.0f, bottom[i] = static_cast<float>(rng() % 2551) / 10.0f;
+    const auto runs = on_every_path([&] {
+        std::vector<uint8_t> out;
+        for (const auto &[omw, w] : kWeights) {
+            std::vector<uint8_t> row(top.size());
+            const pxfx::vec::ResizeDown down = pxfx::vec::resize_down();
+            for (size_t k = down != nullptr ? down(top.data(), bottom.data(), omw, w, row.size(), row.data()) : 0;
+                 k < row.size(); ++k)
+                row[k] = static_cast<uint8_t>(std::max(0, static_cast<int32_t>(omw * top[k] + w * bottom[k])));
+            out.insert(out.end(), row.begin(), row.end());
+        }
+        return out;
+    });
+    for (size_t p = 1; p < runs.size(); ++p)
+        EXPECT_EQ(runs[p], runs[0]) << "path " << p;
 }
 
 // The 5 x 5 median (PXImage_Smooth at 60..79) at widths around the vector
