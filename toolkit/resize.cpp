@@ -39,7 +39,7 @@ struct Taps {
 struct SampleTaps {
     Buffer<int32_t> i0, i1, from;
     Buffer<float> w, omw;
-    Buffer<uint8_t> records; // the groups, from its first boundary of their alignment
+    Buffer<uint8_t> records; // holds the groups from its first 16-byte boundary on
     vec::ResizeColumns columns{};
 
     // For pixels of C samples in source rows of rowBytes bytes; false when
