@@ -9,6 +9,7 @@
 #include <cstring>
 
 #include "core/internal/memory.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "toolkit/pximage_check.hpp"
 #include "toolkit/resize_internal.hpp"
 
@@ -30,6 +31,62 @@ struct Taps {
         : i0(alloc_buffer<int32_t>(n)), i1(alloc_buffer<int32_t>(n)), w(alloc_buffer<float>(n)),
           omw(alloc_buffer<float>(n)) {}
     bool ok() const { return i0 && i1 && w && omw; }
+};
+
+// The taps per result sample for the vector blend (vec::ResizeColumns): the
+// offsets of the taps' bytes in a source row, the weights, and each group's
+// load, shuffles and weights.
+struct SampleTaps {
+    Buffer<int32_t> i0, i1, from;
+    Buffer<float> w, omw;
+    Buffer<uint8_t> records; // holds the groups from its first 16-byte boundary on
+    vec::ResizeColumns columns{};
+
+    // For pixels of C samples in source rows of rowBytes bytes; false when
+    // memory is missing.
+    template <int C> bool build(const Taps &cols, int32_t dstWidth, size_t rowBytes) {
+        const size_t n = static_cast<size_t>(dstWidth) * C, count = n / vec::kResizeGroup;
+        constexpr size_t kAlign = alignof(vec::ResizeGroup);
+        i0 = alloc_buffer<int32_t>(n), i1 = alloc_buffer<int32_t>(n), w = alloc_buffer<float>(n);
+        omw = alloc_buffer<float>(n), from = alloc_buffer<int32_t>(count);
+        // One record more leaves room to start at the boundary (0 bytes, no
+        // buffer, when the size is out of range).
+        records = alloc_buffer<uint8_t>(checked_size(count + 1, sizeof(vec::ResizeGroup)));
+        if (!i0 || !i1 || !w || !omw || (count > 0 && !from) || !records) return false;
+        const uintptr_t at = reinterpret_cast<uintptr_t>(records.get());
+        auto *groups = reinterpret_cast<vec::ResizeGroup *>((at + kAlign - 1) / kAlign * kAlign);
+        for (int32_t j = 0; j < dstWidth; ++j)
+            for (int c = 0; c < C; ++c) {
+                const size_t k = static_cast<size_t>(j) * C + c;
+                i0[k] = cols.i0[j] * C + c, i1[k] = cols.i1[j] * C + c;
+                w[k] = cols.w[j], omw[k] = cols.omw[j];
+            }
+        // A group loads the 16 bytes from its first tap, or the row's last 16
+        // when they reach past the row, and takes the plain blend when its
+        // taps do not fit them.
+        constexpr int64_t kSpan = sizeof(vec::ResizeGroup::first);
+        for (size_t g = 0; g < count; ++g) {
+            const size_t k = g * vec::kResizeGroup;
+            int32_t lo = i0[k], hi = i1[k];
+            for (size_t s = k; s < k + vec::kResizeGroup; ++s)
+                lo = std::min({lo, i0[s], i1[s]}), hi = std::max({hi, i0[s], i1[s]});
+            const int64_t start = std::min<int64_t>(lo, static_cast<int64_t>(rowBytes) - kSpan);
+            const bool fits = start >= 0 && hi - start < kSpan;
+            from[g] = fits ? static_cast<int32_t>(start) : -1;
+            vec::ResizeGroup &r = groups[g];
+            std::memset(r.first, 0x80, sizeof r.first);
+            std::memset(r.second, 0x80, sizeof r.second);
+            for (size_t l = 0; l < vec::kResizeGroup; ++l) {
+                if (fits) {
+                    r.first[4 * l] = static_cast<uint8_t>(i0[k + l] - start);
+                    r.second[4 * l] = static_cast<uint8_t>(i1[k + l] - start);
+                }
+                r.omw[l] = omw[k + l], r.w[l] = w[k + l];
+            }
+        }
+        columns = {i0.get(), i1.get(), w.get(), omw.get(), from.get(), groups, n};
+        return true;
+    }
 };
 
 } // namespace
@@ -81,6 +138,13 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
     // columns used0 .. used1 (the ones the taps read).
     Buffer<float> row = alloc_buffer<float>(static_cast<size_t>(srcWidth) * C);
     if (!row) return false;
+    // The vector blend reads the source bytes themselves, which needs them
+    // packed; without its working memory the plain blend runs.
+    const vec::ResizeAcross vectorAcross = srcStride == C ? vec::resize_across() : nullptr;
+    SampleTaps samples;
+    const bool bytesAcross =
+        vectorAcross != nullptr && samples.build<C>(cols, dstWidth, static_cast<size_t>(srcWidth) * C);
+    const vec::ResizeDown vectorDown = vec::resize_down();
     int32_t cached[2] = {-1, -1};
     const size_t srcRow = static_cast<size_t>(srcWidth) * srcStride;
     const size_t dstRow = static_cast<size_t>(dstWidth) * dstStride;
@@ -88,6 +152,11 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
         float *h = across.get() + static_cast<size_t>(y & 1) * n;
         if (cached[y & 1] == y) return static_cast<const float *>(h);
         const uint8_t *a = src + static_cast<size_t>(y) * srcRow;
+        cached[y & 1] = y;
+        if (bytesAcross) {
+            vectorAcross(a, samples.columns, h);
+            return static_cast<const float *>(h);
+        }
         float *f = row.get();
         if (srcStride == C) {
             for (size_t k = static_cast<size_t>(used0) * C; k < static_cast<size_t>(used1 + 1) * C; ++k)
@@ -98,7 +167,6 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
                     f[static_cast<size_t>(p) * C + c] = static_cast<float>(a[static_cast<size_t>(p) * srcStride + c]);
         }
         blend_columns<C>(f, cols.i0.get(), cols.i1.get(), cols.w.get(), cols.omw.get(), dstWidth, h);
-        cached[y & 1] = y;
         return static_cast<const float *>(h);
     };
     for (int32_t i = 0; i < dstHeight; ++i) {
@@ -116,7 +184,7 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
         // every result lies well inside int32, where the saturating
         // conversion to uint32 is a plain one held at 0.
         if (weightsInRange && std::fabs(wy) <= kMaxPlainWeight && dstStride == C) {
-            for (size_t j = 0; j < n; ++j) {
+            for (size_t j = vectorDown != nullptr ? vectorDown(top, bottom, omwy, wy, n, out) : 0; j < n; ++j) {
                 const auto v = static_cast<int32_t>(omwy * top[j] + wy * bottom[j]);
                 out[j] = static_cast<uint8_t>(v < 0 ? 0 : v);
             }

@@ -98,6 +98,33 @@ using BoxBytes = void (*)(const uint8_t *in, const uint8_t *gone, uint16_t *cols
                           int32_t channels, int32_t offset, uint8_t *out);
 inline constexpr int32_t kMinBoxBytes = 2, kMaxBoxBytes = 11;
 
+// The horizontal blend of the bilinear resize over one row of n result
+// samples: h[k] = omw[k] * row[i0[k]] + w[k] * row[i1[k]], the bytes as
+// floats. The samples go in groups of kResizeGroup: group g reads the 16
+// bytes at row + from[g], and groups[g] holds the shuffles that put the
+// offset of each sample's byte among them into the low byte of its 32-bit
+// lane (0x80 in the three others), then the group's weights. A group with
+// from[g] < 0 (taps more than 16 bytes apart or a row shorter than 16) and
+// the last n % kResizeGroup samples are blended one by one.
+inline constexpr size_t kResizeGroup = 4;
+struct alignas(16) ResizeGroup {
+    uint8_t first[16], second[16]; // for the taps i0 and i1
+    float omw[kResizeGroup], w[kResizeGroup];
+};
+struct ResizeColumns {
+    const int32_t *i0, *i1;
+    const float *w, *omw;
+    const int32_t *from;
+    const ResizeGroup *groups;
+    size_t n;
+};
+using ResizeAcross = void (*)(const uint8_t *row, const ResizeColumns &columns, float *h);
+// The vertical blend of two blended rows of samples in about 0..255 (as
+// blends of bytes under weights in 0..1 give them): out[k] = the low byte of
+// max(0, (int32_t)(omw * top[k] + w * bottom[k])), every sum inside int32,
+// for the first k < n, a multiple of the vector size; returns how many.
+using ResizeDown = size_t (*)(const float *top, const float *bottom, float omw, float w, size_t n, uint8_t *out);
+
 #ifdef PXFX_PORTABLE_ONLY
 inline Median5Row median5_row() { return nullptr; }
 inline Cross19Row cross19_row() { return nullptr; }
@@ -112,6 +139,8 @@ inline DrawingGray drawing_gray(int) { return nullptr; }
 inline ConvolveBytes convolve_bytes() { return nullptr; }
 inline WindowBoxBytes window_box_bytes() { return nullptr; }
 inline BoxBytes box_bytes() { return nullptr; }
+inline ResizeAcross resize_across() { return nullptr; }
+inline ResizeDown resize_down() { return nullptr; }
 #else
 Median5Row median5_row();
 Cross19Row cross19_row();
@@ -130,6 +159,8 @@ DrawingGray drawing_gray(int channels);
 ConvolveBytes convolve_bytes();
 WindowBoxBytes window_box_bytes();
 BoxBytes box_bytes();
+ResizeAcross resize_across();
+ResizeDown resize_down();
 #endif
 
 } // namespace pxfx::vec

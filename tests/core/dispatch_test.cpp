@@ -6,6 +6,7 @@
 // and the runs compare equal copies.
 #include "core/internal/byte_map.hpp"
 #include "core/internal/cpu.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "toolkit/px_images.hpp"
 
 using pxfx::cpu::Path;
@@ -116,19 +117,66 @@ TEST(Dispatch, PictureKernelsMatchThePlainCode) {
         effect([](Image *s, Image **d) { PX_IMG_WARM_YELLOW(s, d); });
         effect([](Image *s, Image **d) { PX_IMG_COLD_PUPRLE(s, d); });
     }
-    for (int32_t bits : {8, 16, 24}) {
-        const pxtest::PX src = pxtest::px_random(131, 9, bits, static_cast<uint32_t>(bits));
-        const auto runs = on_every_path([&] {
-            std::vector<std::vector<uint8_t>> out;
-            for (const auto &[w, h] : {std::pair(97, 5), std::pair(300, 20), std::pair(1, 3)}) {
-                const pxtest::PX resized(PXImage_Resize(src.get(), w, h));
-                out.push_back(pxtest::bytes(resized.get()));
-            }
-            return out;
-        });
-        for (size_t p = 1; p < runs.size(); ++p)
-            EXPECT_EQ(runs[p], runs[0]) << bits << " bits, path " << p;
-    }
+}
+
+// The resize at factors below 1, above 1 and not whole (1/2, 3/2, a spread
+// past the byte shuffles' 16 bytes), widths that leave partial groups and
+// vectors, rows shorter than 16 bytes; and the plane interpolation at scales
+// whose weights leave 0..1 (negative, and large enough to clamp).
+TEST(Dispatch, ResizeMatchesThePlainLoops) {
+    constexpr std::pair<int32_t, int32_t> kSources[] = {{131, 9}, {40, 30}, {5, 3}};
+    constexpr std::pair<int32_t, int32_t> kTargets[] = {{97, 5}, {300, 20}, {1, 3}, {1000, 11}, {37, 2}};
+    for (int32_t bits : {8, 16, 24})
+        for (const auto &[sw, sh] : kSources) {
+            const pxtest::PX src = pxtest::px_random(sw, sh, bits, static_cast<uint32_t>(bits + sw));
+            std::vector<std::pair<int32_t, int32_t>> sizes(std::begin(kTargets), std::end(kTargets));
+            sizes.insert(sizes.end(), {{sw / 2, sh / 2}, {sw * 3 / 2, sh * 3 / 2}, {sw + 3, sh - 1}});
+            const auto runs = on_every_path([&] {
+                std::vector<std::vector<uint8_t>> out;
+                for (const auto &[w, h] : sizes) {
+                    const pxtest::PX resized(PXImage_Resize(src.get(), w, h));
+                    out.push_back(pxtest::bytes(resized.get()));
+                }
+                if (bits == 8)
+                    for (float scale : {-1.5f, 0.37f, 3.0f}) {
+                        std::vector<uint8_t> plane(77 * 13);
+                        EXPECT_EQ(DualLinearIntepol_KWB(src->data, sw, sh, plane.data(), 77, 13, scale), 1);
+                        out.push_back(plane);
+                    }
+                return out;
+            });
+            for (size_t p = 1; p < runs.size(); ++p)
+                for (size_t i = 0; i < runs[0].size(); ++i)
+                    EXPECT_EQ(runs[p][i], runs[0][i])
+                        << bits << " bits, " << sw << " x " << sh << ", " << i << ", path " << p;
+        }
+}
+
+// The vertical blend of resize over the whole range its contract allows:
+// weights beyond 0..1 (up to 2^20) under rows that differ, whose sums leave
+// 0..255 both ways; the bytes are the low ones of the truncations held at 0.
+TEST(Dispatch, ResizeDownKeepsTheLowByte) {
+    constexpr std::pair<float, float> kWeights[] = {
+        {1.0f, 0.0f},  {0.5f, 0.5f},        {0.75f, 0.25f},        {1.6667f, -0.6667f},
+        {-0.5f, 1.5f}, {-3749.0f, 3750.0f}, {16384.0f, -16383.0f}, {-1048575.0f, 1048576.0f}};
+    std::mt19937 rng(23);
+    std::vector<float> top(77), bottom(77);
+    for (size_t i = 0; i < top.size(); ++i)
+        top[i] = static_cast<float>(rng() % 2551) / 10.0f, bottom[i] = static_cast<float>(rng() % 2551) / 10.0f;
+    const auto runs = on_every_path([&] {
+        std::vector<uint8_t> out;
+        for (const auto &[omw, w] : kWeights) {
+            std::vector<uint8_t> row(top.size());
+            const pxfx::vec::ResizeDown down = pxfx::vec::resize_down();
+            for (size_t k = down != nullptr ? down(top.data(), bottom.data(), omw, w, row.size(), row.data()) : 0;
+                 k < row.size(); ++k)
+                row[k] = static_cast<uint8_t>(std::max(0, static_cast<int32_t>(omw * top[k] + w * bottom[k])));
+            out.insert(out.end(), row.begin(), row.end());
+        }
+        return out;
+    });
+    for (size_t p = 1; p < runs.size(); ++p)
+        EXPECT_EQ(runs[p], runs[0]) << "path " << p;
 }
 
 // The 5 x 5 median (PXImage_Smooth at 60..79) at widths around the vector
