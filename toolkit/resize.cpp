@@ -108,12 +108,12 @@ inline void blend_columns(const float *__restrict f, const int32_t *__restrict i
     }
 }
 
-// Interpolates pixels of C interleaved samples (pixel p at p * srcStride /
-// p * dstStride, its samples consecutive); every sample as interpolate_plane
-// would on its own plane.
+// Interpolates pixels of C interleaved samples (source pixel p at p * C,
+// result pixel p at p * dstStride, its samples consecutive); every sample as
+// interpolate_plane would on its own plane.
 template <int C>
-bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
-                 int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
+bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, uint8_t *dst, int32_t dstWidth,
+                 int32_t dstHeight, size_t dstStride, float ry, float rx) {
     Taps cols(static_cast<size_t>(dstWidth));
     if (!cols.ok()) return false;
     // With every column weight in 0..1 the row blends stay in 0..255 (no NaN).
@@ -138,15 +138,15 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
     // columns used0 .. used1 (the ones the taps read).
     Buffer<float> row = alloc_buffer<float>(static_cast<size_t>(srcWidth) * C);
     if (!row) return false;
-    // The vector blend reads the source bytes themselves, which needs them
-    // packed; without its working memory the plain blend runs.
-    const vec::ResizeAcross vectorAcross = srcStride == C ? vec::resize_across() : nullptr;
+    // The vector blend reads the source bytes themselves; without its
+    // working memory the plain blend runs.
+    const vec::ResizeAcross vectorAcross = vec::resize_across();
     SampleTaps samples;
     const bool bytesAcross =
         vectorAcross != nullptr && samples.build<C>(cols, dstWidth, static_cast<size_t>(srcWidth) * C);
     const vec::ResizeDown vectorDown = vec::resize_down();
     int32_t cached[2] = {-1, -1};
-    const size_t srcRow = static_cast<size_t>(srcWidth) * srcStride;
+    const size_t srcRow = static_cast<size_t>(srcWidth) * C;
     const size_t dstRow = static_cast<size_t>(dstWidth) * dstStride;
     auto row_across = [&](int32_t y) {
         float *h = across.get() + static_cast<size_t>(y & 1) * n;
@@ -158,14 +158,8 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
             return static_cast<const float *>(h);
         }
         float *f = row.get();
-        if (srcStride == C) {
-            for (size_t k = static_cast<size_t>(used0) * C; k < static_cast<size_t>(used1 + 1) * C; ++k)
-                f[k] = static_cast<float>(a[k]);
-        } else {
-            for (int32_t p = used0; p <= used1; ++p)
-                for (int c = 0; c < C; ++c)
-                    f[static_cast<size_t>(p) * C + c] = static_cast<float>(a[static_cast<size_t>(p) * srcStride + c]);
-        }
+        for (size_t k = static_cast<size_t>(used0) * C; k < static_cast<size_t>(used1 + 1) * C; ++k)
+            f[k] = static_cast<float>(a[k]);
         blend_columns<C>(f, cols.i0.get(), cols.i1.get(), cols.w.get(), cols.omw.get(), dstWidth, h);
         return static_cast<const float *>(h);
     };
@@ -198,9 +192,9 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t
     return true;
 }
 
-bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, size_t srcStride, uint8_t *dst,
-                       int32_t dstWidth, int32_t dstHeight, size_t dstStride, float ry, float rx) {
-    return interpolate<1>(src, srcWidth, srcHeight, srcStride, dst, dstWidth, dstHeight, dstStride, ry, rx);
+bool interpolate_plane(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, uint8_t *dst, int32_t dstWidth,
+                       int32_t dstHeight, size_t dstStride, float ry, float rx) {
+    return interpolate<1>(src, srcWidth, srcHeight, dst, dstWidth, dstHeight, dstStride, ry, rx);
 }
 
 } // namespace pxfx::packed
@@ -235,7 +229,7 @@ int32_t DualLinearIntepol(const uint8_t *src, int32_t srcWidth, int32_t srcHeigh
     if (outcome >= 0) return outcome;
     const float ry = static_cast<float>(srcHeight) / static_cast<float>(dstHeight);
     const float rx = static_cast<float>(srcWidth) / static_cast<float>(dstWidth);
-    return interpolate_plane(src, srcWidth, srcHeight, 1, dst, dstWidth, dstHeight, 1, ry, rx) ? 1 : 0;
+    return interpolate_plane(src, srcWidth, srcHeight, dst, dstWidth, dstHeight, 1, ry, rx) ? 1 : 0;
 }
 
 int32_t DualLinearIntepol_KWB(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, uint8_t *dst, int32_t dstWidth,
@@ -243,7 +237,7 @@ int32_t DualLinearIntepol_KWB(const uint8_t *src, int32_t srcWidth, int32_t srcH
     if (dstWidth <= 0) return 0;
     const int32_t outcome = plane_outcome(src, srcWidth, srcHeight, dst, dstWidth, dstHeight);
     if (outcome >= 0) return outcome;
-    return interpolate_plane(src, srcWidth, srcHeight, 1, dst, dstWidth, dstHeight, 1, scale, scale) ? 1 : 0;
+    return interpolate_plane(src, srcWidth, srcHeight, dst, dstWidth, dstHeight, 1, scale, scale) ? 1 : 0;
 }
 
 PXImage *PXImage_Resize(const PXImage *src, int32_t newWidth, int32_t newHeight) {
@@ -269,9 +263,9 @@ PXImage *PXImage_Resize(const PXImage *src, int32_t newWidth, int32_t newHeight)
     const float rx = static_cast<float>(w) / static_cast<float>(newWidth);
     bool ok = true;
     if (from->bitCount == 8) {
-        ok = interpolate_plane(from->bits, w, h, 1, to->bits, newWidth, newHeight, 1, ry, rx);
+        ok = interpolate_plane(from->bits, w, h, to->bits, newWidth, newHeight, 1, ry, rx);
     } else if (from->bitCount == 24) {
-        ok = interpolate<3>(from->bits, w, h, 3, to->bits, newWidth, newHeight, 3, ry, rx);
+        ok = interpolate<3>(from->bits, w, h, to->bits, newWidth, newHeight, 3, ry, rx);
     } else {
         // A 16-bit source is read as three-byte pixels; the bytes that this
         // stride puts past the end of its block read as 0.
@@ -285,7 +279,7 @@ PXImage *PXImage_Resize(const PXImage *src, int32_t newWidth, int32_t newHeight)
                 const size_t k = p * 3 + static_cast<size_t>(c);
                 plane[p] = k < have ? block[k] : 0;
             }
-            ok = interpolate_plane(plane.get(), w, h, 1, to->bits + c, newWidth, newHeight, 3, ry, rx);
+            ok = interpolate_plane(plane.get(), w, h, to->bits + c, newWidth, newHeight, 3, ry, rx);
         }
     }
     if (!ok) {

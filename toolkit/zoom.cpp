@@ -114,7 +114,7 @@ bool zoom_planes(const PXImage *src, int64_t startRow, int64_t x, int64_t gather
     const float rx = static_cast<float>(v->width) / static_cast<float>(rw);
     for (int32_t b = 0; b < 4; ++b) {
         gather_plane(*v, startRow, x, gatherWidth, b, plane.get());
-        if (!interpolate_plane(plane.get(), v->width, v->height, 1, out + outSize * b, rw, rh, 1, ry, rx)) return false;
+        if (!interpolate_plane(plane.get(), v->width, v->height, out + outSize * b, rw, rh, 1, ry, rx)) return false;
     }
     return true;
 }
