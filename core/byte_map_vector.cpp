@@ -158,6 +158,11 @@ vec::ToneBytes vec::tone_bytes(int channels) {
     return channels == 3 ? PXFX_VECTOR_COPY(tone3) : PXFX_VECTOR_COPY(tone4);
 }
 
+bool vec::pair_tables_pay() {
+    const int64_t t = cpu::target();
+    return t == HWY_SSSE3 || t == HWY_SSE4;
+}
+
 } // namespace pxfx
 #endif
 
