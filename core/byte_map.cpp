@@ -98,22 +98,41 @@ template <int C> void pair_map(const uint8_t *in, uint8_t *out, size_t blocks, c
     }
 }
 
-// Blue through its table, green and red as one pair, alpha kept, in one
-// 4-byte word per pixel. For 3-byte pixels the word's last byte is the next
-// pixel's blue, stored back as it was read; the last pixel is left to the
-// caller. Returns the pixels mapped.
+// Blue through its table, green and red as one pair, alpha kept. Two 4-byte
+// pixels make one 8-byte word; eight 3-byte pixels three words, where the
+// pair of the third pixel straddles the first two words. Little-endian
+// words: the caller takes this route only there. Returns the pixels mapped.
 template <int C>
 size_t pair_tone(const uint8_t *in, uint8_t *out, size_t pixels, const uint8_t *b, const uint16_t *gr) {
-    constexpr int blue = kLittle ? 0 : 24, last = kLittle ? 24 : 0;
-    const size_t n = C == 4 || pixels == 0 ? pixels : pixels - 1;
-    for (size_t i = 0; i < n; ++i, in += C, out += C) {
-        uint32_t w;
-        std::memcpy(&w, in, 4);
-        const uint32_t o =
-            uint32_t{b[(w >> blue) & 255]} << blue | uint32_t{gr[(w >> 8) & 0xFFFF]} << 8 | (w & uint32_t{255} << last);
-        std::memcpy(out, &o, 4);
+    auto blue = [b](uint64_t w, int pos) { return uint64_t{b[(w >> 8 * pos) & 255]} << 8 * pos; };
+    auto pair = [gr](uint64_t w, int pos) { return uint64_t{gr[(w >> 8 * pos) & 0xFFFF]} << 8 * pos; };
+    if constexpr (C == 4) {
+        const size_t n = pixels / 2 * 2;
+        for (size_t i = 0; i < n; i += 2, in += 8, out += 8) {
+            uint64_t w;
+            std::memcpy(&w, in, 8);
+            const uint64_t o = blue(w, 0) | pair(w, 1) | blue(w, 4) | pair(w, 5) | (w & 0xFF000000FF000000u);
+            std::memcpy(out, &o, 8);
+        }
+        return n;
+    } else {
+        const size_t n = pixels / 8 * 8;
+        for (size_t i = 0; i < n; i += 8, in += 24, out += 24) {
+            uint64_t w0, w1, w2;
+            std::memcpy(&w0, in, 8);
+            std::memcpy(&w1, in + 8, 8);
+            std::memcpy(&w2, in + 16, 8);
+            const uint32_t straddle = gr[(w0 >> 56 | w1 << 8) & 0xFFFF];
+            const uint64_t o0 =
+                blue(w0, 0) | pair(w0, 1) | blue(w0, 3) | pair(w0, 4) | blue(w0, 6) | uint64_t{straddle & 255} << 56;
+            const uint64_t o1 = (straddle >> 8) | blue(w1, 1) | pair(w1, 2) | blue(w1, 4) | pair(w1, 5) | blue(w1, 7);
+            const uint64_t o2 = pair(w2, 0) | blue(w2, 2) | pair(w2, 3) | blue(w2, 5) | pair(w2, 6);
+            std::memcpy(out, &o0, 8);
+            std::memcpy(out + 8, &o1, 8);
+            std::memcpy(out + 16, &o2, 8);
+        }
+        return n;
     }
-    return n;
 }
 
 } // namespace
@@ -131,7 +150,7 @@ ByteMap::ByteMap(int channels, const uint8_t *const *tables, size_t pixels) : ch
     const int c = channels == 1 || channels == 3 ? channels : 4;
     for (int k = 0; k < c; ++k)
         tables_[k] = tables[k];
-    if (!vec::pair_tables_pay()) return;
+    if (!vec::pair_tables_pay(c, false)) return;
     // Pattern k maps the bytes of channels 2k and 2k + 1 (modulo the pixel);
     // patterns of the same two tables share one pair table.
     const int patterns = c == 1 ? kPatterns<1> : (c == 3 ? kPatterns<3> : kPatterns<4>);
@@ -162,7 +181,9 @@ ByteMap::ByteMap(int channels, const uint8_t *const *tables, size_t pixels) : ch
 
 ByteMap::ByteMap(int channels, const ToneTables &tone, size_t pixels)
     : channels_(channels == 3 ? 3 : 4), tone_(true), toneTables_(tone) {
-    if (!vec::pair_tables_pay() || pixels * static_cast<size_t>(channels_) < kBytesPerPairTable) return;
+    if (!kLittle || !vec::pair_tables_pay(channels_, true) ||
+        pixels * static_cast<size_t>(channels_) < kBytesPerPairTable)
+        return;
     pairs_ = alloc_buffer<uint16_t>(kPairEntries);
     if (pairs_) build_tone_pairs(pairs_.get(), tone);
 }

@@ -25,11 +25,11 @@ struct ToneTables {
 };
 
 // A byte map set up once for the rows of a picture. Where the chosen target
-// looks bytes up faster in pair tables than in its vectors (x86 with 16-byte
-// vectors), and the pixels to map are enough to pay for building them, two
-// neighbouring bytes go through one lookup in a table of 65536 two-byte
-// entries, one such table per pattern of channels. Otherwise the rows go
-// through the target's vector copy and the plain loop.
+// looks bytes up faster in pair tables than in its vectors
+// (vec::pair_tables_pay), and the pixels to map are enough to pay for
+// building them, two neighbouring bytes go through one lookup in a table of
+// 65536 two-byte entries, one such table per pattern of channels. Otherwise
+// the rows go through the target's vector copy and the plain loop.
 class ByteMap {
   public:
     // Pixels of `channels` bytes (1, 3 or 4) through tables[0 .. channels - 1],
