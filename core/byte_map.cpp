@@ -146,11 +146,12 @@ const uint8_t kIdentityMap[256] = {
 #undef PXFX_ROW
 };
 
-ByteMap::ByteMap(int channels, const uint8_t *const *tables, size_t pixels) : channels_(channels), tone_(false) {
+ByteMap::ByteMap(int channels, const uint8_t *const *tables, size_t pixels, bool inPlace)
+    : channels_(channels), tone_(false) {
     const int c = channels == 1 || channels == 3 ? channels : 4;
     for (int k = 0; k < c; ++k)
         tables_[k] = tables[k];
-    if (!vec::pair_tables_pay(c, false)) return;
+    if (!vec::pair_tables_pay(c, false, inPlace)) return;
     // Pattern k maps the bytes of channels 2k and 2k + 1 (modulo the pixel);
     // patterns of the same two tables share one pair table.
     const int patterns = c == 1 ? kPatterns<1> : (c == 3 ? kPatterns<3> : kPatterns<4>);
@@ -181,7 +182,7 @@ ByteMap::ByteMap(int channels, const uint8_t *const *tables, size_t pixels) : ch
 
 ByteMap::ByteMap(int channels, const ToneTables &tone, size_t pixels)
     : channels_(channels == 3 ? 3 : 4), tone_(true), toneTables_(tone) {
-    if (!kLittle || !vec::pair_tables_pay(channels_, true) ||
+    if (!kLittle || !vec::pair_tables_pay(channels_, true, false) ||
         pixels * static_cast<size_t>(channels_) < kBytesPerPairTable)
         return;
     pairs_ = alloc_buffer<uint16_t>(kPairEntries);
@@ -225,7 +226,7 @@ void ByteMap::operator()(const uint8_t *in, uint8_t *out, size_t pixels) const {
 }
 
 void map_bytes(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const uint8_t *const *tables) {
-    ByteMap(channels, tables, pixels)(in, out, pixels);
+    ByteMap(channels, tables, pixels, in == out)(in, out, pixels);
 }
 
 void tone_bytes(const uint8_t *in, uint8_t *out, size_t pixels, int channels, const ToneTables &t) {

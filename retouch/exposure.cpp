@@ -24,7 +24,7 @@ void shift_plane(const View &plane, int32_t delta) {
     }
     const uint8_t *const tables[1] = {table};
     const auto w = static_cast<size_t>(plane.width);
-    const ByteMap map(1, tables, w * static_cast<size_t>(plane.height));
+    const ByteMap map(1, tables, w * static_cast<size_t>(plane.height), true);
     for (int32_t y = 0; y < plane.height; ++y)
         map(plane.row(y), plane.row(y), w);
 }

@@ -45,7 +45,7 @@ template <int Bpp> void apply(const View &img, const Map *m, const View *mask) {
         const uint8_t *tables[Bpp];
         for (int k = 0; k < Bpp; ++k)
             tables[k] = m[k];
-        const ByteMap map(Bpp, tables, static_cast<size_t>(w) * static_cast<size_t>(h));
+        const ByteMap map(Bpp, tables, static_cast<size_t>(w) * static_cast<size_t>(h), true);
         for (int32_t y = 0; y < h; ++y)
             map(img.row(y), img.row(y), static_cast<size_t>(w));
         return;

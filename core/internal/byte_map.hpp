@@ -33,8 +33,9 @@ struct ToneTables {
 class ByteMap {
   public:
     // Pixels of `channels` bytes (1, 3 or 4) through tables[0 .. channels - 1],
-    // about `pixels` pixels in all.
-    ByteMap(int channels, const uint8_t *const *tables, size_t pixels);
+    // about `pixels` pixels in all, mapped in place or not as inPlace says
+    // (a choice of route: either way gives the same bytes).
+    ByteMap(int channels, const uint8_t *const *tables, size_t pixels, bool inPlace);
     // The tone map of 3- or 4-byte pixels.
     ByteMap(int channels, const ToneTables &tone, size_t pixels);
 

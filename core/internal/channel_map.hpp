@@ -56,7 +56,8 @@ template <class F, class Pick> void map_channel_rows(const View &src, const View
             while (end < src.height && pick(end) == &m)
                 ++end;
             const uint8_t *tables[4] = {channels == 1 ? m.g : m.b, m.g, m.r, kIdentityMap};
-            const ByteMap map(channels, tables, static_cast<size_t>(w) * static_cast<size_t>(end - y));
+            const ByteMap map(channels, tables, static_cast<size_t>(w) * static_cast<size_t>(end - y),
+                              src.bits == dst.bits);
             for (; y < end; ++y)
                 map(src.row(y), dst.row(y), static_cast<size_t>(w));
         }

@@ -103,7 +103,7 @@ inline Median5Row median5_row() { return nullptr; }
 inline Cross19Row cross19_row() { return nullptr; }
 inline MapBytes map_bytes(int) { return nullptr; }
 inline ToneBytes tone_bytes(int) { return nullptr; }
-inline bool pair_tables_pay(int, bool) { return false; }
+inline bool pair_tables_pay(int, bool, bool) { return false; }
 inline SplitPlanes split_planes(int, int) { return nullptr; }
 inline CombinePlanes combine_planes(int, int) { return nullptr; }
 inline PhotocopyMeans photocopy_means() { return nullptr; }
@@ -123,8 +123,9 @@ ToneBytes tone_bytes(int channels);
 // bytes run faster through pair tables in the plain code (ByteMap) than
 // through the vector copies: every map on x86 with 16-byte vectors, whose
 // 256-entry lookups take sixteen shuffles and blends, and maps of 3-byte
-// pixels with 32-byte vectors, which must split and join their channels.
-bool pair_tables_pay(int channels, bool tone);
+// pixels in place with 32-byte vectors, which must split and join their
+// channels (out of place, both wait on memory and the vectors keep ahead).
+bool pair_tables_pay(int channels, bool tone, bool inPlace);
 // For a mode number and pixels of `channels` bytes (3 or 4); null for the
 // modes without vector code (RGB, XYZ).
 SplitPlanes split_planes(int mode, int channels);

@@ -85,7 +85,7 @@ TEST(Dispatch, ByteTablesMatchThePlainLoop) {
                         const size_t total = setUpFor != 0 ? setUpFor : pixels;
                         auto run = [&](const uint8_t *from, uint8_t *to) {
                             if (kind == kMap)
-                                pxfx::ByteMap(channels, t, total)(from, to, pixels);
+                                pxfx::ByteMap(channels, t, total, from == to)(from, to, pixels);
                             else
                                 pxfx::ByteMap(channels, tone, total)(from, to, pixels);
                         };
