@@ -151,7 +151,7 @@ ByteMap::ByteMap(int channels, const uint8_t *const *tables, size_t pixels, bool
     const int c = channels == 1 || channels == 3 ? channels : 4;
     for (int k = 0; k < c; ++k)
         tables_[k] = tables[k];
-    if (!vec::pair_tables_pay(c, false, inPlace)) return;
+    if (pixels * static_cast<size_t>(c) < kBytesPerPairTable || !vec::pair_tables_pay(c, false, inPlace)) return;
     // Pattern k maps the bytes of channels 2k and 2k + 1 (modulo the pixel);
     // patterns of the same two tables share one pair table.
     const int patterns = c == 1 ? kPatterns<1> : (c == 3 ? kPatterns<3> : kPatterns<4>);
