@@ -158,6 +158,11 @@ vec::ToneBytes vec::tone_bytes(int channels) {
     return channels == 3 ? PXFX_VECTOR_COPY(tone3) : PXFX_VECTOR_COPY(tone4);
 }
 
+bool vec::pair_tables_pay(int channels, bool tone, bool inPlace) {
+    const int64_t t = cpu::target();
+    return t == HWY_SSSE3 || t == HWY_SSE4 || (t == HWY_AVX2 && channels == 3 && !tone && inPlace);
+}
+
 } // namespace pxfx
 #endif
 

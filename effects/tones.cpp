@@ -107,10 +107,10 @@ ToneTables tone_tables(bool warm) {
 }
 
 template <bool Warm> void tone_rows(const View &src, const View &dst) {
-    const ToneTables t = tone_tables(Warm);
     const int channels = static_cast<int>(src.bitCount / 8);
+    const ByteMap map(channels, tone_tables(Warm), static_cast<size_t>(src.width) * static_cast<size_t>(src.height));
     for (int32_t y = 0; y < src.height; ++y)
-        tone_bytes(src.row(y), dst.row(y), static_cast<size_t>(src.width), channels, t);
+        map(src.row(y), dst.row(y), static_cast<size_t>(src.width));
 }
 
 template <bool Warm, class Fn> uint32_t tone_effect(Image *src, Image **dst, Fn fn) {

@@ -24,8 +24,9 @@ void shift_plane(const View &plane, int32_t delta) {
     }
     const uint8_t *const tables[1] = {table};
     const auto w = static_cast<size_t>(plane.width);
+    const ByteMap map(1, tables, w * static_cast<size_t>(plane.height), true);
     for (int32_t y = 0; y < plane.height; ++y)
-        map_bytes(plane.row(y), plane.row(y), w, 1, tables);
+        map(plane.row(y), plane.row(y), w);
 }
 
 } // namespace

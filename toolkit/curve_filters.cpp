@@ -41,15 +41,17 @@ bool mask_usable(const Image *mask) { return mask == nullptr || (mask->bitCount 
 template <int Bpp> void apply(const View &img, const Map *m, const View *mask) {
     const int32_t w = mask ? std::min(mask->width, img.width) : img.width;
     const int32_t h = mask ? std::min(mask->height, img.height) : img.height;
+    if (mask == nullptr) {
+        const uint8_t *tables[Bpp];
+        for (int k = 0; k < Bpp; ++k)
+            tables[k] = m[k];
+        const ByteMap map(Bpp, tables, static_cast<size_t>(w) * static_cast<size_t>(h), true);
+        for (int32_t y = 0; y < h; ++y)
+            map(img.row(y), img.row(y), static_cast<size_t>(w));
+        return;
+    }
     for (int32_t y = 0; y < h; ++y) {
         uint8_t *row = img.row(y);
-        if (mask == nullptr) {
-            const uint8_t *tables[Bpp];
-            for (int k = 0; k < Bpp; ++k)
-                tables[k] = m[k];
-            map_bytes(row, row, static_cast<size_t>(w), Bpp, tables);
-            continue;
-        }
         const uint8_t *sel = mask->row(y);
         for (int32_t x = 0; x < w; ++x)
             if (sel[x] != 0)

@@ -1,7 +1,7 @@
 // Per-channel byte tables over pictures: blue, green and red of every pixel
 // through a 256-entry table each, alpha kept; the result is what loading the
 // colour, mapping its channels and storing it gives. Rows of 8-, 24- and
-// 32-bit records go through map_bytes and so its vector lookups (a gray
+// 32-bit records go through ByteMap and so its fast lookups (a gray
 // pixel reads as three equal channels and stores its green, so it maps
 // through the green table). 16-bit words, whose fields straddle their bytes,
 // go through one small table per field; any other bit count, or a source and
@@ -49,10 +49,17 @@ template <class F, class Pick> void map_channel_rows(const View &src, const View
     const int32_t w = src.width;
     if constexpr (F::kBitCount == 8 || F::kBitCount == 24 || F::kBitCount == 32) {
         constexpr int channels = static_cast<int>(F::kBitCount / 8);
-        for (int32_t y = 0; y < src.height; ++y) {
+        // One ByteMap per run of rows with the same tables.
+        for (int32_t y = 0; y < src.height;) {
             const ChannelMap &m = *pick(y);
+            int32_t end = y + 1;
+            while (end < src.height && pick(end) == &m)
+                ++end;
             const uint8_t *tables[4] = {channels == 1 ? m.g : m.b, m.g, m.r, kIdentityMap};
-            map_bytes(src.row(y), dst.row(y), static_cast<size_t>(w), channels, tables);
+            const ByteMap map(channels, tables, static_cast<size_t>(w) * static_cast<size_t>(end - y),
+                              src.bits == dst.bits);
+            for (; y < end; ++y)
+                map(src.row(y), dst.row(y), static_cast<size_t>(w));
         }
     } else if constexpr (F::kBitCount == 16) {
         const ChannelMap *built = pick(0);

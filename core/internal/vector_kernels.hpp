@@ -130,6 +130,7 @@ inline Median5Row median5_row() { return nullptr; }
 inline Cross19Row cross19_row() { return nullptr; }
 inline MapBytes map_bytes(int) { return nullptr; }
 inline ToneBytes tone_bytes(int) { return nullptr; }
+inline bool pair_tables_pay(int, bool, bool) { return false; }
 inline SplitPlanes split_planes(int, int) { return nullptr; }
 inline CombinePlanes combine_planes(int, int) { return nullptr; }
 inline PhotocopyMeans photocopy_means() { return nullptr; }
@@ -147,6 +148,13 @@ Cross19Row cross19_row();
 // For pixels of `channels` bytes (1, 3 or 4; 3 or 4 for the tone map).
 MapBytes map_bytes(int channels);
 ToneBytes tone_bytes(int channels);
+// Whether byte maps (tone maps with tone) of large pictures of `channels`
+// bytes run faster through pair tables in the plain code (ByteMap) than
+// through the vector copies: every map on x86 with 16-byte vectors, whose
+// 256-entry lookups take sixteen shuffles and blends, and maps of 3-byte
+// pixels in place with 32-byte vectors, which must split and join their
+// channels (out of place, both wait on memory and the vectors keep ahead).
+bool pair_tables_pay(int channels, bool tone, bool inPlace);
 // For a mode number and pixels of `channels` bytes (3 or 4); null for the
 // modes without vector code (RGB, XYZ).
 SplitPlanes split_planes(int mode, int channels);

@@ -73,34 +73,46 @@ TEST(Dispatch, ByteTablesMatchThePlainLoop) {
     std::vector<uint8_t> tables(4 * 256);
     for (auto &v : tables)
         v = static_cast<uint8_t>(rng());
-    const uint8_t *t[4] = {&tables[0], &tables[256], &tables[512], &tables[768]};
     enum Kind { kMap, kRaise, kLower };
-    for (int channels : {1, 3, 4})
-        for (Kind kind : {kMap, kRaise, kLower})
-            for (size_t pixels : {0, 1, 15, 16, 17, 31, 32, 33, 63, 64, 65, 127, 128, 129, 200, 1000}) {
-                if (channels == 1 && kind != kMap) continue;
-                const pxfx::ToneTables tone{t[0], t[1], t[2], kind == kLower};
-                auto run = [&](const uint8_t *from, uint8_t *to) {
-                    if (kind == kMap)
-                        pxfx::map_bytes(from, to, pixels, channels, t);
-                    else
-                        pxfx::tone_bytes(from, to, pixels, channels, tone);
-                };
-                // One byte past the pixels stays as it was; in place gives the same.
-                std::vector<uint8_t> in(pixels * channels + 1);
-                for (auto &v : in)
-                    v = static_cast<uint8_t>(rng());
-                const auto runs = on_every_path([&] {
-                    std::vector<uint8_t> out(in.size(), in.back()), inPlace = in;
-                    run(in.data(), out.data());
-                    run(inPlace.data(), inPlace.data());
-                    return std::pair(out, inPlace);
-                });
-                for (size_t p = 1; p < runs.size(); ++p)
-                    EXPECT_EQ(runs[p], runs[0])
-                        << channels << " channels, kind " << kind << ", " << pixels << " pixels, path " << p;
-                EXPECT_EQ(runs[0].second, runs[0].first) << channels << " channels, " << pixels << " pixels in place";
-            }
+    // A map set up for many pixels builds pair tables where they pay (one
+    // per channel pattern, or one shared by equal tables) and then maps
+    // short runs and their tails with them.
+    for (size_t setUpFor : {size_t{0}, size_t{1} << 21})
+        for (bool shared : {false, true})
+            for (int channels : {1, 3, 4})
+                for (Kind kind : {kMap, kRaise, kLower})
+                    for (size_t pixels : {0, 1, 15, 16, 17, 31, 32, 33, 63, 64, 65, 127, 128, 129, 200, 1000}) {
+                        if (channels == 1 && kind != kMap) continue;
+                        const uint8_t *t[4];
+                        for (int k = 0; k < 4; ++k)
+                            t[k] = &tables[shared ? 0 : 256 * k];
+                        const pxfx::ToneTables tone{t[0], t[1], t[2], kind == kLower};
+                        const size_t total = setUpFor != 0 ? setUpFor : pixels;
+                        auto run = [&](const uint8_t *from, uint8_t *to) {
+                            if (kind == kMap)
+                                pxfx::ByteMap(channels, t, total, from == to)(from, to, pixels);
+                            else
+                                pxfx::ByteMap(channels, tone, total)(from, to, pixels);
+                        };
+                        // The byte past the pixels stays as it was; in place gives the same.
+                        std::vector<uint8_t> in(pixels * channels + 1);
+                        for (auto &v : in)
+                            v = static_cast<uint8_t>(rng());
+                        const auto runs = on_every_path([&] {
+                            std::vector<uint8_t> out(in.size(), static_cast<uint8_t>(~in.back())), inPlace = in;
+                            run(in.data(), out.data());
+                            run(inPlace.data(), inPlace.data());
+                            return std::pair(out, inPlace);
+                        });
+                        const std::string where = std::to_string(channels) + " channels, kind " + std::to_string(kind) +
+                                                  ", " + std::to_string(pixels) + " pixels, set up for " +
+                                                  std::to_string(total) + (shared ? ", shared tables" : "");
+                        for (size_t p = 1; p < runs.size(); ++p)
+                            EXPECT_EQ(runs[p], runs[0]) << where << ", path " << p;
+                        const auto &[out, inPlace] = runs[0];
+                        EXPECT_EQ(out.back(), static_cast<uint8_t>(~in.back())) << where;
+                        EXPECT_TRUE(std::equal(out.begin(), out.end() - 1, inPlace.begin())) << where << " in place";
+                    }
 }
 
 TEST(Dispatch, PictureKernelsMatchThePlainCode) {
