@@ -108,12 +108,55 @@ inline void blend_columns(const float *__restrict f, const int32_t *__restrict i
     }
 }
 
+// The interpolation of a plane at a ratio of exactly 2 each way, where
+// result index i reads source index i / 2 and every tap stays inside the
+// source (the second one held at its last row or column): every weight is 0
+// or 1/2, and every product and sum of the float blends is exact, so each
+// result is the floored mean of one, two or four samples. Result columns 2k
+// and 2k + 1 of a row take column sums v of source rows y and y' (y' = y for
+// even result rows): v[k] / 2 and (v[k] + v[k + 1]) / 4.
+namespace {
+
+void floored_means(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, uint8_t *dst, int32_t dstWidth,
+                   int32_t dstHeight) {
+    // Pairs k whose k + 1 is a source column and whose odd result exists.
+    const int32_t inner = std::min(srcWidth - 1, dstWidth / 2);
+    for (int32_t i = 0; i < dstHeight; ++i) {
+        const int32_t y = i / 2, y1 = i % 2 == 0 ? y : std::min(y + 1, srcHeight - 1);
+        const uint8_t *__restrict t = src + static_cast<size_t>(y) * static_cast<size_t>(srcWidth);
+        const uint8_t *__restrict u = src + static_cast<size_t>(y1) * static_cast<size_t>(srcWidth);
+        uint8_t *__restrict out = dst + static_cast<size_t>(i) * static_cast<size_t>(dstWidth);
+        for (int32_t k = 0; k < inner; ++k) {
+            const uint32_t a = t[k] + u[k], b = t[k + 1] + u[k + 1];
+            out[2 * k] = static_cast<uint8_t>(a >> 1);
+            out[2 * k + 1] = static_cast<uint8_t>((a + b) >> 2);
+        }
+        for (int32_t k = inner; 2 * k < dstWidth; ++k) {
+            const int32_t k1 = std::min(k + 1, srcWidth - 1);
+            const uint32_t a = t[k] + u[k], b = t[k1] + u[k1];
+            out[2 * k] = static_cast<uint8_t>(a >> 1);
+            if (2 * k + 1 < dstWidth) out[2 * k + 1] = static_cast<uint8_t>((a + b) >> 2);
+        }
+    }
+}
+
+} // namespace
+
 // Interpolates pixels of C interleaved samples (source pixel p at p * C,
 // result pixel p at p * dstStride, its samples consecutive); every sample as
 // interpolate_plane would on its own plane.
 template <int C>
 bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, uint8_t *dst, int32_t dstWidth,
                  int32_t dstHeight, size_t dstStride, float ry, float rx) {
+    // Planes only: the compilers vectorise this loop of single samples,
+    // while three-sample pixels run faster through the blends' vector copy.
+    if constexpr (C == 1) {
+        if (rx == 2.0f && ry == 2.0f && dstStride == 1 && dstWidth > 0 && dstHeight > 0 &&
+            (dstWidth - 1) / 2 < srcWidth && (dstHeight - 1) / 2 < srcHeight) {
+            floored_means(src, srcWidth, srcHeight, dst, dstWidth, dstHeight);
+            return true;
+        }
+    }
     Taps cols(static_cast<size_t>(dstWidth));
     if (!cols.ok()) return false;
     // With every column weight in 0..1 the row blends stay in 0..255 (no NaN).

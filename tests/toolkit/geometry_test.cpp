@@ -25,9 +25,10 @@ void ref_interp(const uint8_t *s, int sw, int sh, size_t ss, uint8_t *d, int dw,
 }
 
 TEST(Resize, MatchesInvertedBilinearMappingAtEveryBitCount) {
-    // The last two take rows past the widest vector loops.
-    const int sizes[][4] = {{1, 1, 3, 2}, {7, 5, 3, 9}, {13, 11, 26, 22}, {5, 1, 1, 5},
-                            {9, 9, 4, 4}, {4, 4, 8, 8}, {100, 3, 151, 4}, {203, 4, 97, 3}};
+    // The last two take rows past the widest vector loops; 26 x 22 to 13 x
+    // 11 and 202 x 6 to 101 x 3 are ratios of exactly 2.
+    const int sizes[][4] = {{1, 1, 3, 2}, {7, 5, 3, 9},     {13, 11, 26, 22}, {5, 1, 1, 5},     {9, 9, 4, 4},
+                            {4, 4, 8, 8}, {100, 3, 151, 4}, {203, 4, 97, 3},  {26, 22, 13, 11}, {202, 6, 101, 3}};
     for (int bits : {8, 16, 24})
         for (const auto &s : sizes) {
             PX src = px_random(s[0], s[1], bits, 7u + bits);
@@ -47,6 +48,14 @@ TEST(Resize, MatchesInvertedBilinearMappingAtEveryBitCount) {
     PX src = px_random(6, 5, 8, 1);
     std::vector<uint8_t> got(35);
     EXPECT_EQ(DualLinearIntepol_KWB(src->data, 6, 5, got.data(), 7, 5, 0.0f), 1);
+    // At scale 2 the taps of a 9 x 7 result reach the source's last row and
+    // column (held there); those of 10 x 8 and 11 x 9 go past them.
+    for (int n : {9, 10, 11}) {
+        std::vector<uint8_t> out(size_t(n) * (n - 2)), want(out.size());
+        ASSERT_EQ(DualLinearIntepol_KWB(src->data, 5, 4, out.data(), n, n - 2, 2.0f), 1);
+        ref_interp(src->data, 5, 4, 1, want.data(), n, n - 2, 1, 2.0f, 2.0f);
+        EXPECT_EQ(out, want) << n;
+    }
 }
 
 // Negative destination sizes leave empty loops (KWB refuses a width <= 0);
