@@ -67,10 +67,10 @@ WHAT = {
 # beside the measured range of every family that misses.
 NOTES = {
     "memcpy": "one 256-entry table lookup per byte. NEON looks up 64 entries per instruction, "
-              "so phones map 16 bytes with four lookups; x86's 16-byte lookups (SSSE3) cover 16 "
-              "entries, so a vector takes 16 lookups and selects, about what the plain loop's one "
-              "load per byte costs (3- and 4-byte pixels keep the plain loop on 128-bit x86). "
-              "memcpy streams, while the maps read a table and write another picture.",
+              "so phones map 16 bytes with four lookups; on x86 with 16-byte vectors a large "
+              "picture goes through pair tables (65536 two-byte entries built per call: one load "
+              "maps two bytes, words are loaded and stored whole). memcpy streams, while the maps "
+              "read a table and write another picture.",
     "FilterFast": "the box means of 24-bit pictures at 128 bits measured 0.60-0.68 of cv::blur in "
                   "two other runs today on the same shared machine; this run's 1.08 is its worst.",
     "Smooth": "the 24-bit 5x5 median on 128 bits is about level with OpenCV (0.85-1.18 across "
@@ -78,23 +78,24 @@ NOTES = {
               "tie.",
     "Blur": "the kernel filter keeps the general path (any kernel, divisor, offset, mask, 32-bit "
             "wrap); at 1.00 it is level with cv::filter2D.",
-    "ResizeHalf": "the source coordinate of result pixel i is i / r in single precision per "
-                  "column and row (at r = 2 only the top-left quarter is read and enlarged), and "
-                  "each result is two float blends of gathered columns; OpenCV halves by "
-                  "averaging 2x2 blocks in fixed point, a different and cheaper computation.",
-    "ResizeOneAndAHalf": "single-precision blends of gathered columns, as for the halving; a "
-                         "vector copy with 16-byte gathers was slower than the plain loop.",
+    "ResizeHalf": "at a ratio of exactly 2 a plane takes floored integer means of one, two or "
+                  "four samples (the float blends' own bytes); 24-bit pixels blend bytes gathered "
+                  "by byte shuffles in float vectors.",
+    "ResizeOneAndAHalf": "single-precision blends of source bytes gathered by byte shuffles, four "
+                         "samples per group, then the vertical blend over whole vectors; this "
+                         "pair measured 0.86-1.25 from run to run on the shared machine.",
     "Effect": "photocopy (effect 2) builds its local means per row in 16-bit vectors; its "
               "32-bit case varied 119-165 ms between runs today against 240-280 before.",
     "Sketch": "one pass over the rows with a single dodge table; 1.9-2.5x across the two "
               "pictures here.",
-    "Oil": "the dominant intensity class is picked per pixel from sliding histograms; 16-bit "
-           "window sums and word-wide bin moves gave no gain that a same-run comparison could "
-           "separate from noise and were not kept.",
+    "Oil": "the dominant intensity class is picked per pixel from sliding histograms and its "
+           "sums divided through a table of exact reciprocals; 16-bit window sums and word-wide "
+           "bin moves gave no gain that a same-run comparison could separate from noise.",
     "Skin": "about 29 % of the call builds the face mask and 23 % the spot map and lift, the rest "
             "is table maps and page faults: no single step gives 2x.",
-    "ZoomIn": "about 60 % of the call is the kernel's page faults on the fresh result, four "
-              "times the picture.",
+    "ZoomIn": "the result is a fresh block four times the picture: on this machine the first "
+              "write of 48 MB of fresh memory takes about 42 ms of page faults (3.5 ms when "
+              "written again), so the 8-bit zoom is almost all page faults, before and after.",
 }
 ALLOC_NOTES = {
     "MyResample2x4": "the vertically resampled plane (factor 4, four times the input) is what "
