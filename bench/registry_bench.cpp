@@ -1,8 +1,8 @@
 // Every operation of the registry at its default parameters, on a 1000 x 750
 // picture of the first format it accepts (32 bits for colour operations):
 // the broad view that the hand-made benchmarks beside it, at full size and
-// against OpenCV, go deeper into. Registered at start-up from the registry, so
-// a new operation is measured without a line here.
+// against OpenCV, go deeper into. Registered in main from the registry, so a
+// new operation is measured without a line here.
 #include "bench_support.hpp"
 #include "operations.hpp"
 
@@ -30,11 +30,18 @@ void run_operation(benchmark::State &state, const pxop::Operation *op) {
     free_Image(&src, 0);
 }
 
-const bool kRegistered = [] {
+} // namespace
+
+// The operations are registered in main, not during static initialisation:
+// the registry's rows copy parameter tables defined in other files, which
+// may not be initialised yet at that point.
+int main(int argc, char **argv) {
     for (const pxop::Operation &op : pxop::operations())
         benchmark::RegisterBenchmark(("BM_Operation/" + std::string(op.name)).c_str(), run_operation, &op)
             ->Unit(benchmark::kMillisecond);
-    return true;
-}();
-
-} // namespace
+    benchmark::Initialize(&argc, argv);
+    if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 1;
+    benchmark::RunSpecifiedBenchmarks();
+    benchmark::Shutdown();
+    return 0;
+}
