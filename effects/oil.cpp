@@ -28,8 +28,8 @@ constexpr uint32_t intensity_class(uint32_t c) {
 // Pixel count and red, green, blue sums per class in one histogram of four
 // groups of bins (class k counts at k, its red sum at kRed + k, and so on),
 // so that merging and sliding run over all of them in one pass. `S` holds the
-// sums of one window exactly: 32 bits while (2r + 1)^2 * 255 fits, 64 bits
-// beyond.
+// sums of one window exactly: 16 or 32 bits while (2r + 1)^2 * 255 fits,
+// 64 bits beyond.
 constexpr int32_t kRed = kClasses, kGreen = 2 * kClasses, kBlue = 3 * kClasses;
 template <class S> using Hist = rank::Histogram<4 * kClasses, S>;
 
@@ -59,11 +59,15 @@ template <class S, class Div> uint32_t dominant(const Hist<S> &h, uint32_t alpha
 
 // Border pixels (closer than r to an edge) are copied; interior pixels take
 // the dominant class of their (2r + 1)^2 window. The window is the sum of
-// per-column histograms over rows y - r .. y + r; moving down a row updates
-// each column by one pixel out and one in, moving right adds one column and
-// subtracts another, so the cost per pixel does not depend on r.
+// per-column histograms over rows y - r .. y + r; moving right adds one
+// column and subtracts another, so the cost per pixel does not depend on r.
+// A row runs in chunks of columns: the columns a chunk's windows will add
+// take the entering row first, and those its windows have subtracted give
+// up the leaving row after, so the columns are updated while in cache, and
+// never just before the window reads them whole.
 template <class F, class S, class Div>
 void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols, const Div &div) {
+    constexpr int32_t kChunk = 64;
     const int32_t w = src.width, h = src.height;
     for (int32_t x = 0; x < w; ++x)
         cols[x] = Hist<S>{};
@@ -80,42 +84,62 @@ void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols, const Div &
                 F::store(out, x, F::load(in, x));
             continue;
         }
-        // Columns now cover rows y - r .. y + r.
-        const typename F::CRow enter = F::crow(src, y + r);
-        for (int32_t x = 0; x < w; ++x)
-            add_pixel(cols[x], F::load(enter, x));
+        // Columns below `added` cover rows y - r .. y + r; those below
+        // `removed` already y - r + 1 .. y + r.
+        const typename F::CRow enter = F::crow(src, y + r), leave = F::crow(src, y - r);
+        int32_t added = 0, removed = 0;
+        auto add_until = [&](int32_t end) {
+            for (; added < end; ++added)
+                add_pixel(cols[added], F::load(enter, added));
+        };
+        auto remove_until = [&](int32_t end) {
+            for (; removed < end; ++removed)
+                remove_pixel(cols[removed], F::load(leave, removed));
+        };
         for (int32_t x = 0; x < r; ++x)
             F::store(out, x, F::load(in, x));
+        add_until(2 * r + 1);
         Hist<S> win{};
         for (int32_t x = 0; x <= 2 * r; ++x)
             win.merge(cols[x]);
         F::store(out, r, dominant(win, alpha_of(F::load(in, r)), div));
-        for (int32_t x = r + 1; x < w - r; ++x) {
-            win.slide(cols[x + r], cols[x - r - 1]);
-            F::store(out, x, dominant(win, alpha_of(F::load(in, x)), div));
+        for (int32_t first = r + 1; first < w - r; first += kChunk) {
+            const int32_t end = first + kChunk < w - r ? first + kChunk : w - r;
+            add_until(end + r);
+            for (int32_t x = first; x < end; ++x) {
+                win.slide(cols[x + r], cols[x - r - 1]);
+                F::store(out, x, dominant(win, alpha_of(F::load(in, x)), div));
+            }
+            remove_until(end - r - 1);
         }
+        remove_until(w);
         for (int32_t x = w - r; x < w; ++x)
             F::store(out, x, F::load(in, x));
-        const typename F::CRow leave = F::crow(src, y - r);
-        for (int32_t x = 0; x < w; ++x)
-            remove_pixel(cols[x], F::load(leave, x));
     }
+}
+
+// Windows of at most 4096 pixels: every division of a class's sum by its
+// count is a multiply by that count's exact reciprocal.
+template <class F, class S> bool oil_with_reciprocals(const View &src, const View &dst, int32_t r) {
+    const auto area = static_cast<uint32_t>((2 * r + 1) * (2 * r + 1));
+    Buffer<ExactDivisor> reciprocal = alloc_buffer<ExactDivisor>(area + 1);
+    Buffer<Hist<S>> cols = alloc_buffer<Hist<S>>(static_cast<size_t>(src.width));
+    if (!reciprocal || !cols) return false;
+    for (uint32_t n = 0; n <= area; ++n)
+        reciprocal[n] = exact_divisor(n > 0 ? n : 1);
+    const ExactDivisor *table = reciprocal.get();
+    oil<F>(src, dst, r, cols.get(), [table](uint32_t s, uint32_t n) { return table[n].divide(s); });
+    return true;
 }
 
 template <class F> bool oil_with_sums(const View &src, const View &dst, int32_t r) {
     const uint64_t side = 2 * static_cast<uint64_t>(r) + 1;
-    if (side <= 64) {
-        // Windows of at most 4096 pixels: every division of a class's sum by
-        // its count is a multiply by that count's exact reciprocal.
-        const auto area = static_cast<uint32_t>(side * side);
-        Buffer<ExactDivisor> reciprocal = alloc_buffer<ExactDivisor>(area + 1);
-        Buffer<Hist<uint32_t>> cols = alloc_buffer<Hist<uint32_t>>(static_cast<size_t>(src.width));
-        if (!reciprocal || !cols) return false;
-        for (uint32_t n = 0; n <= area; ++n)
-            reciprocal[n] = exact_divisor(n > 0 ? n : 1);
-        const ExactDivisor *table = reciprocal.get();
-        oil<F>(src, dst, r, cols.get(), [table](uint32_t s, uint32_t n) { return table[n].divide(s); });
-    } else if (side < 0x10000 && side * side * 255 <= 0xFFFFFFFFu) {
+    // Windows of at most 257 pixels: sums and counts fit 16 bits, so a
+    // column's histogram is one 64-byte line and the window slides in
+    // eight-lane vectors.
+    if (side * side * 255 <= 0xFFFF) return oil_with_reciprocals<F, uint16_t>(src, dst, r);
+    if (side <= 64) return oil_with_reciprocals<F, uint32_t>(src, dst, r);
+    if (side < 0x10000 && side * side * 255 <= 0xFFFFFFFFu) {
         Buffer<Hist<uint32_t>> cols = alloc_buffer<Hist<uint32_t>>(static_cast<size_t>(src.width));
         if (!cols) return false;
         oil<F>(src, dst, r, cols.get(), [](uint32_t s, uint32_t n) { return s / n; });

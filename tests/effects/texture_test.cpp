@@ -76,9 +76,14 @@ TEST(Texture, AquarelleSeededJitterAndItsSignRule) {
 
 TEST(Texture, OilMatchesWindowRescanAndCopiesTheBorder) {
     uint32_t seed = 900;
-    for (int r : {0, 1, 2, 3, 8}) // 16-bit window sums up to radius 7, 32-bit beyond
+    // 16-bit window sums up to radius 7, 32-bit beyond; rows of interior
+    // pixels run in chunks of 64, so the widest picture takes several.
+    std::vector<std::pair<int32_t, int32_t>> sizes{{150, 17}};
+    for (const auto &[w, h] : kAwkwardSizes)
+        sizes.emplace_back(w, h);
+    for (int r : {0, 1, 2, 3, 7, 8})
         for (int32_t bc : kBitCounts)
-            for (const auto &[w, h] : kAwkwardSizes) {
+            for (const auto &[w, h] : sizes) {
                 Owned src = random_image(w, h, bc, seed++);
                 Slot dst;
                 const bool fits = 2 * r < w && 2 * r < h;
