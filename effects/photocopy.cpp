@@ -150,10 +150,27 @@ uint32_t tone(uint32_t a, int32_t uu, int32_t ratio, const int32_t *weight) {
     return static_cast<uint32_t>(v < 0 ? 0 : (v > 255 ? 255 : v));
 }
 
+// Gray pixels of a row of the result, opaque; 32-bit pixels take their alpha
+// from `alpha` instead where it is given (a source row apart from the result).
+template <class F> void store_gray(typename F::Row out, const uint8_t *gray, int32_t w, const uint8_t *alpha) {
+    if constexpr (F::kBitCount == 32) {
+        if (alpha != nullptr) {
+            for (int32_t x = 0; x < w; ++x) {
+                out[4 * x] = out[4 * x + 1] = out[4 * x + 2] = gray[x];
+                out[4 * x + 3] = alpha[4 * x + 3];
+            }
+            return;
+        }
+    }
+    for (int32_t x = 0; x < w; ++x)
+        F::store(out, x, pack(gray[x], gray[x], gray[x], 255));
+}
+
 // Two passes over the rows: the first counts the ratios, the second sets the
 // thresholds from them and writes the result, working the local means out
-// again rather than keeping planes of them.
-template <class F> bool photocopy(const View &dst, const uint8_t *g, int32_t w, int32_t h) {
+// again rather than keeping planes of them. With `alpha` (32-bit pixels of a
+// source apart from the result) the result takes the source's alpha.
+template <class F> bool photocopy(const View &dst, const uint8_t *g, int32_t w, int32_t h, const View *alpha) {
     LocalMeans means(w);
     Buffer<uint8_t> u = alloc_buffer<uint8_t>(static_cast<size_t>(w));
     Buffer<int32_t> ratio = alloc_buffer<int32_t>(static_cast<size_t>(w));
@@ -184,9 +201,7 @@ template <class F> bool photocopy(const View &dst, const uint8_t *g, int32_t w, 
             t[w - 1] = gray[w - 1];
             gray = t;
         }
-        const typename F::Row out = F::row(dst, y);
-        for (int32_t x = 0; x < w; ++x)
-            F::store(out, x, pack(gray[x], gray[x], gray[x], 255));
+        store_gray<F>(F::row(dst, y), gray, w, alpha != nullptr ? alpha->row(y) : nullptr);
     }
     return true;
 }
@@ -217,10 +232,13 @@ extern "C" uint32_t PX_IMG_Photocopy(Image *src, Image **dst) {
         return 0;
     }
     drawing_gray_plane(from, g.get());
-    if (!with_format(to->bitCount, [&](auto f) { return photocopy<decltype(f)>(*to, g.get(), w, h); })) {
+    // 32-bit results take the source's alpha: as the rows are written when
+    // the two blocks are apart, else (one block) opaque first and then copied.
+    const View *alpha = to->bitCount == 32 && blocks_apart(from, *to) ? &from : nullptr;
+    if (!with_format(to->bitCount, [&](auto f) { return photocopy<decltype(f)>(*to, g.get(), w, h, alpha); })) {
         free_Image(dst, 0);
         return 0;
     }
-    PX_Img_CopyAlpha(out, src);
+    if (alpha == nullptr) PX_Img_CopyAlpha(out, src);
     return 1;
 }

@@ -106,3 +106,17 @@ TEST(SketchPhotocopy, TempExReadsOneColumnPastTheRow) {
     EXPECT_EQ(temp_ex(plane, 3, 2, right, 3, 1, 2), 99); // the byte after the plane
     EXPECT_EQ(temp_ex(plane, 3, 2, ones, 3, 0, 0), 1 + 2 + 40 + 50);
 }
+
+// A slot holding the source itself: the result is written over the source
+// opaque, and the alpha then copied onto itself stays 255.
+TEST(SketchPhotocopy, InPlaceResultIsOpaque) {
+    Owned src = random_image(33, 17, 32, 77);
+    Owned expected = reference_photocopy(src.get());
+    for (int32_t y = 0; y < 17; ++y)
+        for (int32_t x = 0; x < 33; ++x)
+            SetPixelColor(expected.get(), x, y, GetPixelColor(expected.get(), x, y) | 0xFF000000u);
+    Image *img = src.get();
+    ASSERT_EQ(PX_ProcessImage(img, &img, 2), 1u);
+    ASSERT_EQ(img, src.get());
+    EXPECT_EQ(diff(img, expected.get()), "");
+}
