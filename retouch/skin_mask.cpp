@@ -54,35 +54,48 @@ void remove_short_runs(const View &mask) {
 // window sees are the original zeros outside the visited area: everywhere in
 // the rows below, at and right of x in row y, and in the border band (outside
 // the visited rectangle) in row y to the left and in the rows above. These
-// counts come from a summed-area table of the original zeros.
+// counts come from a summed-area table of the original zeros. The window of
+// row y reads the table's rows y - 5 .. y + 6 only, so the table is kept as
+// a ring of its last rows, each built from a mask row before any pixel of
+// that row is visited.
 bool erode(const View &mask) {
+    constexpr int32_t kRing = 16; // a power of two above the 12 rows in use
     const int32_t w = mask.width, h = mask.height;
     const int32_t x0 = kErodeHalf, x1 = w - kErodeHalf - 1, y0 = kErodeHalf, y1 = h - kErodeHalf - 1;
     if (x1 <= x0 || y1 <= y0) return true;
     const size_t sw = static_cast<size_t>(w) + 1;
-    Buffer<uint32_t> sat = alloc_buffer<uint32_t>(checked_size(sw, static_cast<uint64_t>(h) + 1));
+    Buffer<uint32_t> sat = alloc_buffer<uint32_t>(checked_size(sw, kRing));
     if (!sat) return false;
-    uint32_t *s = sat.get();
-    for (size_t i = 0; i < sw; ++i)
-        s[i] = 0;
-    for (int32_t y = 0; y < h; ++y) {
-        const uint8_t *m = mask.row(y);
-        uint32_t *prev = s + static_cast<size_t>(y) * sw, *cur = prev + sw;
-        uint32_t run = 0;
-        cur[0] = 0;
-        for (int32_t x = 0; x < w; ++x) {
-            run += m[x] == 0;
-            cur[x + 1] = prev[x + 1] + run;
+    auto table_row = [&](int32_t r) { return sat.get() + static_cast<size_t>(r & (kRing - 1)) * sw; };
+    // Table row r + 1 counts the zeros of mask rows 0 .. r.
+    int32_t built = 0;
+    auto build_until = [&](int32_t end) {
+        for (; built <= end; ++built) {
+            uint32_t *cur = table_row(built);
+            if (built == 0) {
+                for (size_t i = 0; i < sw; ++i)
+                    cur[i] = 0;
+                continue;
+            }
+            const uint8_t *m = mask.row(built - 1);
+            const uint32_t *prev = table_row(built - 1);
+            uint32_t run = 0;
+            cur[0] = 0;
+            for (int32_t x = 0; x < w; ++x) {
+                run += m[x] == 0;
+                cur[x + 1] = prev[x + 1] + run;
+            }
         }
-    }
+    };
     // Zeros in rows [ya, yb) and columns [xa, xb), empty ranges giving 0.
     auto zeros = [&](int32_t ya, int32_t yb, int32_t xa, int32_t xb) -> uint32_t {
         if (ya >= yb || xa >= xb) return 0;
-        const uint32_t *ra = s + static_cast<size_t>(ya) * sw, *rb = s + static_cast<size_t>(yb) * sw;
+        const uint32_t *ra = table_row(ya), *rb = table_row(yb);
         return rb[xb] - rb[xa] - ra[xb] + ra[xa];
     };
     auto clip = [](int32_t v, int32_t lo, int32_t hi) { return v < lo ? lo : (v > hi ? hi : v); };
     for (int32_t y = y0; y < y1; ++y) {
+        build_until(y + kErodeHalf + 1);
         uint8_t *m = mask.row(y);
         const int32_t above = y - kErodeHalf;
         const int32_t aboveInner = clip(above, y0, y); // rows [aboveInner, y) are visited rows
