@@ -9,11 +9,14 @@
 // above a value - come from a sliding grouped histogram of the window.
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
+#include <cstring>
 
 #include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 #include "core/internal/rank.hpp"
+#include "core/internal/view.hpp"
 
 namespace pxfx {
 
@@ -26,12 +29,17 @@ inline Buffer<uint8_t> padded_plane(const uint8_t *plane, size_t stride, int32_t
     const int64_t pw = static_cast<int64_t>(w) + side - 1, ph = static_cast<int64_t>(h) + side - 1;
     Buffer<uint8_t> pad = alloc_buffer<uint8_t>(checked_size(static_cast<uint64_t>(pw), static_cast<uint64_t>(ph)));
     if (!pad) return pad;
+    // Columns below `left` read the first column, those from `right` on the
+    // last, those between their own column X + lo.
+    const int64_t left = std::clamp<int64_t>(-int64_t{lo}, 0, pw);
+    const int64_t right = std::clamp<int64_t>(int64_t{w} - lo, left, pw);
     for (int64_t Y = 0; Y < ph; ++Y) {
         const int64_t sy = Y + lo < 0 ? 0 : (Y + lo >= h ? h - 1 : Y + lo);
         const uint8_t *in = plane + static_cast<size_t>(sy) * stride;
         uint8_t *out = pad.get() + static_cast<size_t>(Y) * static_cast<size_t>(pw);
-        for (int64_t X = 0; X < pw; ++X)
-            out[X] = in[X + lo < 0 ? 0 : (X + lo >= w ? w - 1 : X + lo)];
+        std::memset(out, in[0], static_cast<size_t>(left));
+        std::memcpy(out + left, in + left + lo, static_cast<size_t>(right - left));
+        std::memset(out + right, in[w - 1], static_cast<size_t>(pw - right));
     }
     return pad;
 }
@@ -88,16 +96,48 @@ template <class FS, class FD>
 void lift_pixels(const View &src, const View &dst, const uint8_t *amount, size_t stride, double wb, double wg,
                  double wr) {
     const int32_t w = src.width, h = src.height;
+    auto lift = [&](typename FS::CRow in, typename FD::Row out, int32_t x, uint32_t d) {
+        const uint32_t c = FS::load(in, x);
+        FD::store(out, x,
+                  pack(lift_channel(blue_of(c), d, wb), lift_channel(green_of(c), d, wg),
+                       lift_channel(red_of(c), d, wr), alpha_of(c)));
+    };
+    if constexpr (FS::kBitCount == FD::kBitCount && (FS::kBitCount == 24 || FS::kBitCount == 32)) {
+        // Byte pixels of one format load and store unchanged: the rows are
+        // copied whole and only the lifted pixels written again, found eight
+        // amount bytes at a time. One block or two apart; blocks that
+        // partly overlap take the pixel loop below.
+        const bool same = src.bits == dst.bits && src.pitch == dst.pitch;
+        if (same || blocks_apart(src, dst)) {
+            const size_t rowBytes = static_cast<size_t>(w) * (FS::kBitCount / 8);
+            for (int32_t y = 0; y < h; ++y) {
+                const uint8_t *in = src.row(y);
+                uint8_t *out = dst.row(y);
+                if (!same) std::memcpy(out, in, rowBytes);
+                const uint8_t *a = amount + static_cast<size_t>(y) * stride;
+                for (int32_t x = 0; x < w;) {
+                    uint64_t eight = 1;
+                    if (x + 8 <= w) std::memcpy(&eight, a + x, 8);
+                    if (eight == 0) {
+                        x += 8;
+                        continue;
+                    }
+                    if (a[x] != 0) lift(in, out, x, a[x]);
+                    ++x;
+                }
+            }
+            return;
+        }
+    }
     for (int32_t y = 0; y < h; ++y) {
         const typename FS::CRow in = FS::crow(src, y);
         const typename FD::Row out = FD::row(dst, y);
         const uint8_t *a = amount + static_cast<size_t>(y) * stride;
         for (int32_t x = 0; x < w; ++x) {
-            uint32_t c = FS::load(in, x);
             if (a[x] != 0)
-                c = pack(lift_channel(blue_of(c), a[x], wb), lift_channel(green_of(c), a[x], wg),
-                         lift_channel(red_of(c), a[x], wr), alpha_of(c));
-            FD::store(out, x, c);
+                lift(in, out, x, a[x]);
+            else
+                FD::store(out, x, FS::load(in, x));
         }
     }
 }

@@ -25,9 +25,9 @@ constexpr uint32_t kMinBrighter = 3; // neighbours brighter than the centre
 constexpr double kSpotBlue = 0.8, kSpotGreen = 0.8, kSpotRed = 0.7;
 
 // Spot map of the skin mask: the second largest value of the 5 x 5 window
-// minus the centre, where at least kMinBrighter values exceed a non-zero
-// centre. Rows are gathered offset by offset on an edge-padded copy, so the
-// inner loops run over whole rows of bytes.
+// minus the centre where at least kMinBrighter values exceed a non-zero
+// centre, else 0 (every byte is written). Rows are gathered offset by offset
+// on an edge-padded copy, so the inner loops run over whole rows of bytes.
 bool spot_map(const View &mask, uint8_t *spots) {
     constexpr int32_t side = 2 * kSpotHalf + 1;
     const int32_t w = mask.width, h = mask.height;
@@ -49,7 +49,7 @@ bool spot_map(const View &mask, uint8_t *spots) {
         });
         uint8_t *out = spots + static_cast<size_t>(y) * w;
         for (int32_t x = 0; x < w; ++x)
-            if (centre[x] != 0 && above[x] >= kMinBrighter) out[x] = static_cast<uint8_t>(second[x] - centre[x]);
+            out[x] = centre[x] != 0 && above[x] >= kMinBrighter ? static_cast<uint8_t>(second[x] - centre[x]) : 0;
     }
     return true;
 }
@@ -63,7 +63,8 @@ int32_t alg_Img_smooth_1(const Image *src, Image **dst) {
     Image *out = prepare_slot(src, dst);
     if (out == nullptr) return 0;
     const int32_t w = src->width, h = src->height;
-    Buffer<uint8_t> spots = alloc_zeroed<uint8_t>(checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h)));
+    const size_t pixels = checked_size(static_cast<uint64_t>(w), static_cast<uint64_t>(h));
+    Buffer<uint8_t> spots = alloc_buffer<uint8_t>(pixels);
     if (!spots) return 0;
     const std::optional<View> to = view_of(out);
     if (!to) return 1;
@@ -79,6 +80,8 @@ int32_t alg_Img_smooth_1(const Image *src, Image **dst) {
         const bool ok = m && spot_map(*m, spots.get());
         free_Image(&mask, 0);
         if (!ok) return 0;
+    } else {
+        std::memset(spots.get(), 0, pixels);
     }
     const View &in = view.view();
     with_formats(in, *to, [&](auto fs, auto fd) {

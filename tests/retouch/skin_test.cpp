@@ -37,6 +37,12 @@ TEST(SkinMask, MaskAndSpotBrighteningMatchAccessorVersions) {
         EXPECT_EQ(diff(dst.get(), ref_smooth_1(src.get()).get()), "") << src->width << "x" << src->height;
     }
     const Image *portrait = pics.back().get();
+    // Smoothed in place: each pixel is read before it is written.
+    Owned inPlace = clone(portrait);
+    Image *same = inPlace.get();
+    ASSERT_EQ(alg_Img_smooth_1(same, &same), 1);
+    ASSERT_EQ(same, inPlace.get());
+    EXPECT_EQ(diff(same, ref_smooth_1(portrait).get()), "");
     // Skin tone: LightUP once without lighten, twice with, then the 52:75 blend.
     for (int32_t lighten : {0, 1}) {
         Owned want = mapped(ref_smooth_1(portrait).get(),
