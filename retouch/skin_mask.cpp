@@ -19,6 +19,19 @@ constexpr int32_t kErodeHalf = 5;
 
 template <class F> void colour_rule(const View &src, const View &mask) {
     const int32_t w = src.width, h = src.height;
+    if constexpr (F::kBitCount == 24 || F::kBitCount == 32) {
+        // Blue, green and red straight from the bytes of each pixel.
+        constexpr int32_t n = F::kBitCount / 8;
+        for (int32_t y = 0; y < h; ++y) {
+            const uint8_t *in = src.row(y);
+            uint8_t *m = mask.row(y);
+            for (int32_t x = 0; x < w; ++x) {
+                const uint8_t b = in[n * x], g = in[n * x + 1], r = in[n * x + 2];
+                m[x] = r >= g && r >= b && r > 49 ? g : 0;
+            }
+        }
+        return;
+    }
     for (int32_t y = 0; y < h; ++y) {
         const typename F::CRow in = F::crow(src, y);
         uint8_t *m = mask.row(y);
