@@ -136,12 +136,34 @@ PXImage *rotate_quarter(const PXImage *src, bool clockwise) {
     return out;
 }
 
+// The 2-byte units of a word in reverse order, and then also the bytes of
+// each unit (compilers turn the second into one byte-swap instruction).
+constexpr uint64_t reverse_units(uint64_t v) {
+    v = v >> 32 | v << 32;
+    return (v >> 16 & 0x0000FFFF0000FFFFu) | (v & 0x0000FFFF0000FFFFu) << 16;
+}
+constexpr uint64_t reverse_bytes(uint64_t v) {
+    v = reverse_units(v);
+    return (v >> 8 & 0x00FF00FF00FF00FFu) | (v & 0x00FF00FF00FF00FFu) << 8;
+}
+
 template <int32_t B> void half_turn(const View &src, const View &dst) {
     const int32_t w = src.width, h = src.height;
     for (int32_t i = 0; i < h; ++i) {
         const uint8_t *in = src.row(h - 1 - i);
         uint8_t *out = dst.row(i);
-        for (int32_t j = 0; j < w; ++j)
+        int32_t j = 0;
+        if constexpr (B == 1 || B == 2) {
+            // Eight bytes at a time: the pixels of a word in reverse order.
+            constexpr int32_t kPerWord = 8 / B;
+            for (; j + kPerWord <= w; j += kPerWord) {
+                uint64_t v;
+                std::memcpy(&v, in + static_cast<size_t>(w - j - kPerWord) * B, 8);
+                v = B == 1 ? reverse_bytes(v) : reverse_units(v);
+                std::memcpy(out + static_cast<size_t>(j) * B, &v, 8);
+            }
+        }
+        for (; j < w; ++j)
             std::memcpy(out + static_cast<size_t>(j) * B, in + static_cast<size_t>(w - 1 - j) * B, B);
     }
 }

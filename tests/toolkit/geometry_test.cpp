@@ -191,3 +191,19 @@ TEST(Helpers, SimilaritySqrtAndPointInRect) {
 }
 
 } // namespace
+
+// Pixels of every width up to two words and a tail, in reverse order of
+// rows and of pixels within a row.
+TEST(Rotate, HalfTurnReversesRowsAndPixels) {
+    for (int bits : {8, 16, 24})
+        for (int w = 1; w <= 19; ++w) {
+            PX src = px_random(w, 3, bits, 40u + w);
+            PX out(PXImage_Rotate180(src.get()));
+            ASSERT_TRUE(out);
+            const size_t px = bits / 8;
+            std::vector<uint8_t> want(px_size(src.get()));
+            for (size_t i = 0; i < size_t(w) * 3; ++i)
+                std::memcpy(&want[i * px], src->data + (size_t(w) * 3 - 1 - i) * px, px);
+            EXPECT_EQ(bytes(out.get()), want) << bits << " bits, width " << w;
+        }
+}
