@@ -118,7 +118,7 @@ void straighten(const View &img, const int32_t *line, const View &res) {
                 int32_t e = c + 1;
                 while (e < w && line[e] == line[c])
                     ++e;
-                std::memcpy(out + c, source(c, r) + c, static_cast<size_t>(e - c));
+                std::memmove(out + c, source(c, r) + c, static_cast<size_t>(e - c));
                 c = e;
             }
         }
@@ -138,6 +138,33 @@ void straighten(const View &img, const int32_t *line, const View &res) {
 }
 
 } // namespace pxfx::lines
+
+namespace {
+
+// RecognizeYUV(img, nullptr) on MyResample2's own new image, which the caller
+// drops when this fails. Where no column of the boundary line lies above the
+// picture, output row r reads only rows at or below r, not yet written, so
+// the image is straightened within its own block; otherwise through a copy.
+bool recognize_own(Image *img) {
+    const std::optional<View> in = plane_view_of(img);
+    if (!in || in->width < lines::kMinRecognizeWidth || in->height < lines::kMinRecognizeHeight)
+        return RecognizeYUV(img, nullptr) != 0;
+    Buffer<int32_t> line = alloc_buffer<int32_t>(static_cast<size_t>(in->width));
+    if (!line) return false;
+    lines::detect_boundary(*in, line.get());
+    const int32_t w = in->width, h = in->height;
+    // The line is monotone: its ends bound it.
+    if (line[0] < 0 || line[w - 1] < 0) return RecognizeYUV(img, nullptr) != 0;
+    lines::straighten(*in, line.get(), *in);
+    // Rows past the copied ones are cleared, as in a new result.
+    const int64_t rows = std::min(static_cast<int64_t>(h) - line[0], static_cast<int64_t>(h) - line[w - 1]);
+    for (int64_t r = std::max<int64_t>(rows, 0); r < h; ++r)
+        std::memset(in->row(static_cast<int32_t>(r)), 0, static_cast<size_t>(w));
+    line.reset();
+    return BinImg(img, nullptr) != 0;
+}
+
+} // namespace
 
 extern "C" {
 
@@ -192,8 +219,7 @@ Image *MyResample2(Image *img, int32_t factor) {
     if (in) std::memcpy(to->row(to->height - 1), in->row(h - 1), static_cast<size_t>(w));
     // A plane below the straightening's minimum size is returned as it is; a
     // straightening that runs out of memory fails the call.
-    if (RecognizeYUV(res.get(), nullptr) == 0 && w >= lines::kMinRecognizeWidth &&
-        to->height >= lines::kMinRecognizeHeight)
+    if (!recognize_own(res.get()) && w >= lines::kMinRecognizeWidth && to->height >= lines::kMinRecognizeHeight)
         return nullptr;
     return res.release();
 }

@@ -139,3 +139,32 @@ TEST(CheckLapOver, CrossingIntervalWinsElseTheNextOneIsReported) {
     EXPECT_EQ(CheckLapOver(list.data(), -1, &s, &e) + s + e, 0);
     EXPECT_EQ(lap({}, 5, 9), (Ints{0, 0, 0}));
 }
+
+// Planes wide enough to be straightened: the result is the resampled plane
+// recognised in place, also where the boundary starts above the picture (dark
+// specks tell where each row was read from).
+TEST(MyResample2, StraightensLikeRecognizeYUV) {
+    const int32_t cases[][4] = {{200, 30, 8, 10}, {700, 16, 200, 5}, {200, 75, 8, -3}, {200, 75, 8, -6}};
+    std::vector<int32_t> line(700);
+    int aboveThePicture = 0;
+    for (auto [w, h, run, top] : cases)
+        for (int32_t f : {2, 4}) {
+            Owned src = tilted(w, h, run, top), want = make(w, f * (h - 1) + 1, 8);
+            for (int32_t y = 0; y < h; ++y)
+                for (int32_t x = 0; x < w; ++x)
+                    if ((x * 7 + y * 13) % 11 == 0) src->bits[y * src->pitch + x] = 20;
+            for (int32_t y = 0; y < want->height; ++y)
+                for (int32_t x = 0; x < w; ++x) {
+                    const int32_t a = GetPixelIndex(src.get(), x, y / f), k = y % f;
+                    const int32_t b = k == 0 ? a : GetPixelIndex(src.get(), x, y / f + 1);
+                    SetPixelIndex(want.get(), x, y, (a * (f - k) + b * k + (f + 1) / 2) / f);
+                }
+            pxfx::lines::detect_boundary(*pxfx::view_of(want.get()), line.data());
+            aboveThePicture += line[0] < 0;
+            ASSERT_EQ(RecognizeYUV(want.get(), nullptr), 1);
+            Owned got(MyResample2(src.get(), f));
+            ASSERT_NE(got, nullptr);
+            EXPECT_EQ(diff(got.get(), want.get()), "") << w << "x" << h << " top " << top << " factor " << f;
+        }
+    EXPECT_GT(aboveThePicture, 0);
+}
