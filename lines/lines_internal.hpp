@@ -29,7 +29,7 @@ void detect_boundary(const View &img, int32_t *line);
 
 // result(r, c) = img(line[c] + r, c) for the rows that every column can fill;
 // rows above the picture read as row 0. The rest of res is left as it is.
-// res may be img itself where no line value is negative.
+// res may be img itself.
 void straighten(const View &img, const int32_t *line, const View &res);
 
 // Binarises src into dst (same size, 8 bits) in bands of 37 rows: 1 for levels

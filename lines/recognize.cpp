@@ -97,26 +97,27 @@ void detect_boundary(const View &img, int32_t *line) {
             line[c] += shift;
 }
 
-// line[] is monotone in c (a truncated linear function plus a constant), so
-// its largest value is at one end and every source row line[c] + r of the
-// rows copied lies below the last row. Column 65 holds r1 >= 0, so at most
-// `height` rows are copied. Only ends extrapolated above the picture can ask
-// for a negative row; those read row 0.
-void straighten(const View &img, const int32_t *line, const View &res) {
-    const int32_t w = img.width, h = img.height;
-    const int64_t rows = std::min(static_cast<int64_t>(h) - line[0], static_cast<int64_t>(h) - line[w - 1]);
+namespace {
+
+// Rows 0 .. rows - 1 of columns [c0, c1) of res: res(r, c) = img(line[c] + r, c),
+// row 0 above the picture; from the bottom row up where `upward`.
+void straighten_columns(const View &img, const int32_t *line, const View &res, int32_t c0, int32_t c1, int64_t rows,
+                        bool upward) {
+    if (c0 >= c1 || rows <= 0) return;
     auto source = [&](int32_t c, int64_t r) {
         const int64_t sr = line[c] + r;
         return img.row(static_cast<int32_t>(sr < 0 ? 0 : sr));
     };
+    auto row_at = [&](int64_t i) { return upward ? rows - 1 - i : i; };
     // A nearly level line changes its value rarely: columns sharing a value
     // are copied as pieces of their source row.
-    if (std::abs(static_cast<int64_t>(line[w - 1]) - line[0]) * 64 <= w) {
-        for (int64_t r = 0; r < rows; ++r) {
+    if (std::abs(static_cast<int64_t>(line[c1 - 1]) - line[c0]) * 64 <= c1 - c0) {
+        for (int64_t i = 0; i < rows; ++i) {
+            const int64_t r = row_at(i);
             uint8_t *out = res.row(static_cast<int32_t>(r));
-            for (int32_t c = 0; c < w;) {
+            for (int32_t c = c0; c < c1;) {
                 int32_t e = c + 1;
-                while (e < w && line[e] == line[c])
+                while (e < c1 && line[e] == line[c])
                     ++e;
                 std::memmove(out + c, source(c, r) + c, static_cast<size_t>(e - c));
                 c = e;
@@ -127,14 +128,47 @@ void straighten(const View &img, const int32_t *line, const View &res) {
     // A steeper line reads many source rows per output row: going down the
     // picture in strips of 64 columns keeps those rows in cache.
     constexpr int32_t kStrip = 64;
-    for (int32_t c0 = 0; c0 < w; c0 += kStrip) {
-        const int32_t c1 = std::min(c0 + kStrip, w);
-        for (int64_t r = 0; r < rows; ++r) {
+    for (int32_t s0 = c0; s0 < c1; s0 += kStrip) {
+        const int32_t s1 = std::min(s0 + kStrip, c1);
+        for (int64_t i = 0; i < rows; ++i) {
+            const int64_t r = row_at(i);
             uint8_t *out = res.row(static_cast<int32_t>(r));
-            for (int32_t c = c0; c < c1; ++c)
+            for (int32_t c = s0; c < s1; ++c)
                 out[c] = source(c, r)[c];
         }
     }
+}
+
+} // namespace
+
+// line[] is monotone in c (a truncated linear function plus a constant), so
+// its largest value is at one end and every source row line[c] + r of the
+// rows copied lies below the last row. Column 65 holds r1 >= 0, so at most
+// `height` rows are copied. Only ends extrapolated above the picture can ask
+// for a negative row; those read row 0.
+void straighten(const View &img, const int32_t *line, const View &res) {
+    const int32_t w = img.width, h = img.height;
+    const int64_t rows = std::min(static_cast<int64_t>(h) - line[0], static_cast<int64_t>(h) - line[w - 1]);
+    if (res.bits != img.bits) {
+        straighten_columns(img, line, res, 0, w, rows, false);
+        return;
+    }
+    // Within one block: the columns whose line lies above the picture read
+    // rows above the one written (or row 0) and go from the bottom up, the
+    // others read rows at or below it and go from the top down. The line is
+    // monotone, so the first kind is a run at one end.
+    int32_t up0 = 0, up1 = 0;
+    if (line[0] < 0) {
+        while (up1 < w && line[up1] < 0)
+            ++up1;
+    } else if (line[w - 1] < 0) {
+        up0 = up1 = w;
+        while (up0 > 0 && line[up0 - 1] < 0)
+            --up0;
+    }
+    straighten_columns(img, line, res, 0, up0, rows, false);
+    straighten_columns(img, line, res, up0, up1, rows, true);
+    straighten_columns(img, line, res, up1, w, rows, false);
 }
 
 } // namespace pxfx::lines
@@ -142,9 +176,8 @@ void straighten(const View &img, const int32_t *line, const View &res) {
 namespace {
 
 // RecognizeYUV(img, nullptr) on MyResample2's own new image, which the caller
-// drops when this fails. Where no column of the boundary line lies above the
-// picture, output row r reads only rows at or below r, not yet written, so
-// the image is straightened within its own block; otherwise through a copy.
+// drops when this fails: straightened within its own block rather than
+// through a copy.
 bool recognize_own(Image *img) {
     const std::optional<View> in = plane_view_of(img);
     if (!in || in->width < lines::kMinRecognizeWidth || in->height < lines::kMinRecognizeHeight)
@@ -153,8 +186,6 @@ bool recognize_own(Image *img) {
     if (!line) return false;
     lines::detect_boundary(*in, line.get());
     const int32_t w = in->width, h = in->height;
-    // The line is monotone: its ends bound it.
-    if (line[0] < 0 || line[w - 1] < 0) return RecognizeYUV(img, nullptr) != 0;
     lines::straighten(*in, line.get(), *in);
     // Rows past the copied ones are cleared, as in a new result.
     const int64_t rows = std::min(static_cast<int64_t>(h) - line[0], static_cast<int64_t>(h) - line[w - 1]);
