@@ -61,10 +61,10 @@ template <class S, class Div> uint32_t dominant(const Hist<S> &h, uint32_t alpha
 // the dominant class of their (2r + 1)^2 window. The window is the sum of
 // per-column histograms over rows y - r .. y + r; moving right adds one
 // column and subtracts another, so the cost per pixel does not depend on r.
-// A row runs in chunks of columns: the columns a chunk's windows will add
-// take the entering row first, and those its windows have subtracted give
-// up the leaving row after, so the columns are updated while in cache, and
-// never just before the window reads them whole.
+// A row runs in chunks of columns: before a chunk's windows read them, the
+// columns they will add move down one row in one pass (the row that left
+// the window out, the entering row in), so each column is updated once per
+// row while in cache, and never just before a window reads it whole.
 template <class F, class S, class Div>
 void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols, const Div &div) {
     constexpr int32_t kChunk = 64;
@@ -84,42 +84,42 @@ void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols, const Div &
                 F::store(out, x, F::load(in, x));
             continue;
         }
-        // Columns below `added` cover rows y - r .. y + r; those below
-        // `removed` already y - r + 1 .. y + r.
-        const typename F::CRow enter = F::crow(src, y + r), leave = F::crow(src, y - r);
-        int32_t added = 0, removed = 0;
-        auto add_until = [&](int32_t end) {
-            for (; added < end; ++added)
-                add_pixel(cols[added], F::load(enter, added));
-        };
-        auto remove_until = [&](int32_t end) {
-            for (; removed < end; ++removed)
-                remove_pixel(cols[removed], F::load(leave, removed));
+        // Columns below `moved` cover rows y - r .. y + r, the others still
+        // y - r - 1 .. y + r - 1 (the first interior row: 0 .. 2r - 1).
+        const typename F::CRow enter = F::crow(src, y + r);
+        int32_t moved = 0;
+        auto move_until = [&](int32_t end) {
+            if (y == r) {
+                for (; moved < end; ++moved)
+                    add_pixel(cols[moved], F::load(enter, moved));
+                return;
+            }
+            const typename F::CRow leave = F::crow(src, y - r - 1);
+            for (; moved < end; ++moved) {
+                remove_pixel(cols[moved], F::load(leave, moved));
+                add_pixel(cols[moved], F::load(enter, moved));
+            }
         };
         for (int32_t x = 0; x < r; ++x)
             F::store(out, x, F::load(in, x));
-        add_until(2 * r + 1);
+        move_until(2 * r + 1);
         Hist<S> win{};
         for (int32_t x = 0; x <= 2 * r; ++x)
             win.merge(cols[x]);
         F::store(out, r, dominant(win, alpha_of(F::load(in, r)), div));
         for (int32_t first = r + 1; first < w - r; first += kChunk) {
             const int32_t end = first + kChunk < w - r ? first + kChunk : w - r;
-            add_until(end + r);
+            move_until(end + r);
             for (int32_t x = first; x < end; ++x) {
                 win.slide(cols[x + r], cols[x - r - 1]);
                 F::store(out, x, dominant(win, alpha_of(F::load(in, x)), div));
             }
-            remove_until(end - r - 1);
         }
-        remove_until(w);
         for (int32_t x = w - r; x < w; ++x)
             F::store(out, x, F::load(in, x));
     }
 }
 
-// Windows of at most 4096 pixels: every division of a class's sum by its
-// count is a multiply by that count's exact reciprocal.
 template <class F, class S> bool oil_with_reciprocals(const View &src, const View &dst, int32_t r) {
     const auto area = static_cast<uint32_t>((2 * r + 1) * (2 * r + 1));
     Buffer<ExactDivisor> reciprocal = alloc_buffer<ExactDivisor>(area + 1);
