@@ -4,7 +4,10 @@
 #include <pxfx/color.h>
 #include <pxfx/effects.h>
 
+#include <bit>
+#include <cstring>
 #include <optional>
+#include <type_traits>
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
@@ -12,6 +15,7 @@
 #include "core/internal/pixel.hpp"
 #include "core/internal/rank.hpp"
 #include "core/internal/result.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "core/internal/view.hpp"
 
 using namespace pxfx;
@@ -25,36 +29,62 @@ constexpr uint32_t intensity_class(uint32_t c) {
     return (306 * red_of(c) + 601 * green_of(c) + 117 * blue_of(c)) >> 15;
 }
 
-// Pixel count and red, green, blue sums per class in one histogram of four
-// groups of bins (class k counts at k, its red sum at kRed + k, and so on),
-// so that merging and sliding run over all of them in one pass. `S` holds the
-// sums of one window exactly: 16 or 32 bits while (2r + 1)^2 * 255 fits,
-// 64 bits beyond.
-constexpr int32_t kRed = kClasses, kGreen = 2 * kClasses, kBlue = 3 * kClasses;
-template <class S> using Hist = rank::Histogram<4 * kClasses, S>;
+// Pixel count and red, green and blue sums of each class in one histogram,
+// class k at bins 4k .. 4k + 3 in that order, so that merging and sliding run
+// over all bins in one pass and a pixel enters or leaves its class through
+// four neighbouring bins. `S` holds the sums of one window exactly: 16 or 32
+// bits while (2r + 1)^2 * 255 fits, 64 bits beyond.
+constexpr int32_t kBins = 4;
+template <class S> using Hist = rank::Histogram<kBins * kClasses, S>;
+
+// The four bins of a pixel's class as one 64-bit word of 16-bit lanes (bins
+// in memory order on either byte order): a column's bins never go below 0 or
+// past 2^16, so adding or subtracting the word moves each lane alone.
+uint64_t class_word(uint32_t c) {
+    constexpr bool little = std::endian::native == std::endian::little;
+    const uint64_t r = red_of(c), g = green_of(c), b = blue_of(c);
+    return little ? 1 | r << 16 | g << 32 | b << 48 : uint64_t{1} << 48 | r << 32 | g << 16 | b;
+}
+
+template <class S> S *class_bins(Hist<S> &h, uint32_t c) {
+    return h.bins + kBins * static_cast<int32_t>(intensity_class(c));
+}
 
 template <class S> void add_pixel(Hist<S> &h, uint32_t c) {
-    const auto k = static_cast<int32_t>(intensity_class(c));
-    h.add(k);
-    h.add(kRed + k, red_of(c));
-    h.add(kGreen + k, green_of(c));
-    h.add(kBlue + k, blue_of(c));
+    S *bins = class_bins(h, c);
+    if constexpr (sizeof(S) == 2) {
+        uint64_t word;
+        std::memcpy(&word, bins, 8);
+        word += class_word(c);
+        std::memcpy(bins, &word, 8);
+    } else {
+        bins[0] += 1, bins[1] += red_of(c), bins[2] += green_of(c), bins[3] += blue_of(c);
+    }
 }
 
 template <class S> void remove_pixel(Hist<S> &h, uint32_t c) {
-    const auto k = static_cast<int32_t>(intensity_class(c));
-    h.remove(k);
-    h.remove(kRed + k, red_of(c));
-    h.remove(kGreen + k, green_of(c));
-    h.remove(kBlue + k, blue_of(c));
+    S *bins = class_bins(h, c);
+    if constexpr (sizeof(S) == 2) {
+        uint64_t word;
+        std::memcpy(&word, bins, 8);
+        word -= class_word(c);
+        std::memcpy(bins, &word, 8);
+    } else {
+        bins[0] -= 1, bins[1] -= red_of(c), bins[2] -= green_of(c), bins[3] -= blue_of(c);
+    }
 }
+
+// The class counts of a histogram, as rank::most_frequent reads them.
+template <class S> struct ClassCounts {
+    const Hist<S> &h;
+    S count(int32_t k) const { return h.bins[kBins * k]; }
+};
 
 // Mean colour of the most populated class, the lowest class on a tie: each
 // sum divided (truncating) by the class's count through div(sum, count).
 template <class S, class Div> uint32_t dominant(const Hist<S> &h, uint32_t alpha, const Div &div) {
-    const int32_t k = rank::most_frequent(h, 0, kClasses);
-    const S n = h.count(k);
-    return pack(div(h.count(kBlue + k), n), div(h.count(kGreen + k), n), div(h.count(kRed + k), n), alpha);
+    const S *bins = h.bins + kBins * rank::most_frequent(ClassCounts<S>{h}, 0, kClasses);
+    return pack(div(bins[3], bins[0]), div(bins[2], bins[0]), div(bins[1], bins[0]), alpha);
 }
 
 // Border pixels (closer than r to an edge) are copied; interior pixels take
@@ -65,10 +95,19 @@ template <class S, class Div> uint32_t dominant(const Hist<S> &h, uint32_t alpha
 // columns they will add move down one row in one pass (the row that left
 // the window out, the entering row in), so each column is updated once per
 // row while in cache, and never just before a window reads it whole.
+// Windows with 16-bit sums, whose divisions go through `reciprocal`, slide in
+// the target's vectors where it has them (vec::oil_windows).
 template <class F, class S, class Div>
-void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols, const Div &div) {
+void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols, const Div &div,
+         const ExactDivisor *reciprocal = nullptr) {
     constexpr int32_t kChunk = 64;
     const int32_t w = src.width, h = src.height;
+    vec::OilWindows vector = nullptr;
+    if constexpr (std::is_same_v<S, uint16_t>) {
+        static_assert(sizeof(Hist<S>) == vec::kOilBins * sizeof(uint16_t));
+        if (reciprocal != nullptr) vector = vec::oil_windows();
+    }
+    uint32_t colours[kChunk];
     for (int32_t x = 0; x < w; ++x)
         cols[x] = Hist<S>{};
     for (int32_t y = 0; y < 2 * r; ++y) {
@@ -110,6 +149,15 @@ void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols, const Div &
         for (int32_t first = r + 1; first < w - r; first += kChunk) {
             const int32_t end = first + kChunk < w - r ? first + kChunk : w - r;
             move_until(end + r);
+            if constexpr (std::is_same_v<S, uint16_t>) {
+                if (vector != nullptr) {
+                    vector(cols[0].bins, static_cast<size_t>(r), static_cast<size_t>(first), static_cast<size_t>(end),
+                           win.bins, reciprocal, colours);
+                    for (int32_t x = first; x < end; ++x)
+                        F::store(out, x, colours[x - first] | alpha_of(F::load(in, x)) << 24);
+                    continue;
+                }
+            }
             for (int32_t x = first; x < end; ++x) {
                 win.slide(cols[x + r], cols[x - r - 1]);
                 F::store(out, x, dominant(win, alpha_of(F::load(in, x)), div));
@@ -128,7 +176,8 @@ template <class F, class S> bool oil_with_reciprocals(const View &src, const Vie
     for (uint32_t n = 0; n <= area; ++n)
         reciprocal[n] = exact_divisor(n > 0 ? n : 1);
     const ExactDivisor *table = reciprocal.get();
-    oil<F>(src, dst, r, cols.get(), [table](uint32_t s, uint32_t n) { return table[n].divide(s); });
+    oil<F>(
+        src, dst, r, cols.get(), [table](uint32_t s, uint32_t n) { return table[n].divide(s); }, table);
     return true;
 }
 

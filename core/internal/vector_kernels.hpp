@@ -8,6 +8,10 @@
 
 #include "core/internal/byte_map.hpp"
 
+namespace pxfx {
+struct ExactDivisor; // core/internal/math.hpp
+}
+
 namespace pxfx::vec {
 
 // Median of the 5 x 5 window of byte samples: rows[0..4] are the window's
@@ -48,6 +52,17 @@ using PhotocopyMeans = size_t (*)(const uint8_t *const *rows, size_t n, uint16_t
 // (0 .. 1009), into out[i]; the first outputs of n, as above.
 using PhotocopyTone = size_t (*)(const uint8_t *gray, const uint8_t *u, const int32_t *ratio, size_t n, int32_t t1,
                                  int32_t t2, uint8_t *out);
+
+// Oil's windows along a row, for windows of at most 257 pixels (16-bit
+// sums): win holds kOilBins words, four per intensity class (its count, red,
+// green and blue sums), of the window before pixel `first`; the column histograms, in the same layout, lie kOilBins
+// words apart from cols. For x = first .. end - 1 the window adds column x + r and subtracts column x - r - 1, and
+// colours[x - first] gets blue | green << 8 | red << 16: the sums of the most populated class (the lowest on a tie)
+// divided by its count n through reciprocal[n]. win ends as the window of
+// end - 1.
+inline constexpr size_t kOilBins = 32;
+using OilWindows = void (*)(const uint16_t *cols, size_t r, size_t first, size_t end, uint16_t *win,
+                            const ExactDivisor *reciprocal, uint32_t *colours);
 
 // Auto levels with a local screen over one row of `pixels` pixels of
 // `channels` bytes (1, 3 or 4, the fourth alpha): cur is the row, mUp, mCur
@@ -135,6 +150,7 @@ inline SplitPlanes split_planes(int, int) { return nullptr; }
 inline CombinePlanes combine_planes(int, int) { return nullptr; }
 inline PhotocopyMeans photocopy_means() { return nullptr; }
 inline PhotocopyTone photocopy_tone() { return nullptr; }
+inline OilWindows oil_windows() { return nullptr; }
 inline GradationRow gradation_row() { return nullptr; }
 inline DrawingGray drawing_gray(int) { return nullptr; }
 inline ConvolveBytes convolve_bytes() { return nullptr; }
@@ -161,6 +177,7 @@ SplitPlanes split_planes(int mode, int channels);
 CombinePlanes combine_planes(int mode, int channels);
 PhotocopyMeans photocopy_means();
 PhotocopyTone photocopy_tone();
+OilWindows oil_windows();
 GradationRow gradation_row();
 // For pixels of `channels` bytes, 3 or 4.
 DrawingGray drawing_gray(int channels);

@@ -277,6 +277,29 @@ TEST(Dispatch, PhotocopyAndAutoGradationMatchThePlainLoops) {
             }
 }
 
+// Oil's windows (16-bit sums up to radius 7) at widths across its row
+// chunks, on noise and on stripes of three classes, whose counts tie.
+TEST(Dispatch, OilMatchesThePlainLoop) {
+    uint32_t seed = 3;
+    for (int32_t bits : pxtest::kBitCounts)
+        for (int32_t r : {1, 3, 7})
+            for (int32_t width : {2 * r + 1, 2 * r + 9, 70, 140})
+                for (bool stripes : {false, true}) {
+                    const Owned src = pxtest::random_image(width, 2 * r + 4, bits, ++seed);
+                    for (int32_t y = 0; stripes && y < src->height; ++y)
+                        for (int32_t x = 0; x < width; ++x)
+                            SetPixelColor(src.get(), x, y,
+                                          (x % 3 == 0   ? 0x000000u
+                                           : x % 3 == 1 ? 0x808080u
+                                                        : 0xFFFFFFu));
+                    expect_same_on_every_path(Message() << bits << " bits, r " << r << ", " << width << " wide", [&] {
+                        Image *out = nullptr;
+                        EXPECT_EQ(imOil(src.get(), &out, r), 1u);
+                        return Owned(out);
+                    });
+                }
+}
+
 // The line filters' medians (selection networks in vectors where they run)
 // at every width around the vector sizes.
 TEST(Dispatch, LineMediansMatchTheHistograms) {
