@@ -177,16 +177,19 @@ bool interpolate(const uint8_t *src, int32_t srcWidth, int32_t srcHeight, uint8_
     const size_t n = static_cast<size_t>(dstWidth) * C;
     Buffer<float> across = alloc_buffer<float>(2 * n);
     if (!across) return false;
-    // One source row as floats (exact), converted once per row in one pass,
-    // columns used0 .. used1 (the ones the taps read).
-    Buffer<float> row = alloc_buffer<float>(static_cast<size_t>(srcWidth) * C);
-    if (!row) return false;
     // The vector blend reads the source bytes themselves; without its
     // working memory the plain blend runs.
     const vec::ResizeAcross vectorAcross = vec::resize_across();
     SampleTaps samples;
     const bool bytesAcross =
         vectorAcross != nullptr && samples.build<C>(cols, dstWidth, static_cast<size_t>(srcWidth) * C);
+    // For the plain blend, one source row as floats (exact), converted once
+    // per row in one pass, columns used0 .. used1 (the ones the taps read).
+    Buffer<float> row;
+    if (!bytesAcross) {
+        row = alloc_buffer<float>(static_cast<size_t>(srcWidth) * C);
+        if (!row) return false;
+    }
     const vec::ResizeDown vectorDown = vec::resize_down();
     int32_t cached[2] = {-1, -1};
     const size_t srcRow = static_cast<size_t>(srcWidth) * C;
