@@ -1,8 +1,9 @@
 // The sliding histograms of the rank filters against sorted copies of random
 // windows: byte and word samples, counts of several widths, samples entering
-// and leaving in random order, ranks drawn anew at every step. Cross windows,
-// merged and slid column histograms and the most frequent level are checked
-// through their users: the cross medians, oil painting and level compression.
+// and leaving in random order, ranks drawn anew at every step, also through
+// a cross window that adds a centre and leaves it out again. Merged and slid
+// column histograms and the most frequent level are checked through their
+// users: oil painting and level compression.
 #include "core/internal/rank.hpp"
 #include "support/test_images.hpp"
 
@@ -20,6 +21,9 @@ template <int32_t Levels> int32_t draw(std::mt19937 &rng, bool few) {
 template <int32_t Levels, class Count> void check_windows(uint32_t seed) {
     auto grouped = std::make_unique<rank::GroupedHistogram<Levels, Count>>();
     auto flat = std::make_unique<rank::Histogram<Levels, Count>>();
+    // The other arm of a cross window: its centre alone, left out once.
+    auto arm = std::make_unique<rank::GroupedHistogram<Levels, Count>>();
+    arm->reset();
     std::mt19937 rng(seed);
     for (size_t size : {1, 2, 9, 49, 250}) {
         for (bool few : {false, true}) {
@@ -48,6 +52,11 @@ template <int32_t Levels, class Count> void check_windows(uint32_t seed) {
                 EXPECT_EQ(rank::kth_smallest(*grouped, k), s[k]);
                 EXPECT_EQ(rank::kth_largest(*grouped, k), s[n - 1 - k]);
                 EXPECT_EQ(cursor.settle(*flat, static_cast<int32_t>(k)), s[k]);
+                const int32_t centre = s[rng() % n];
+                arm->add(centre);
+                EXPECT_EQ(rank::kth_smallest(rank::Cross(*grouped, *arm, centre), k), s[k]) << centre;
+                EXPECT_EQ(rank::kth_largest(rank::Cross(*grouped, *arm, centre), k), s[n - 1 - k]) << centre;
+                arm->remove(centre);
                 for (int32_t v : {s[k], s[k] + 1, s[k] - 1, draw<Levels>(rng, few)}) {
                     if (v < 0 || v >= Levels) continue;
                     const auto above = s.end() - std::upper_bound(s.begin(), s.end(), v);
