@@ -98,12 +98,7 @@ PXFX_API int32_t PX_Img_CopyAlpha(Image *dst, const Image *src);
 
 /* ---- Memory and files ------------------------------------------------------ */
 
-/* malloc; null for a size of 0. On Linux a block of 4 MiB or more is also
- * advised for transparent huge pages (madvise MADV_HUGEPAGE on its 2 MiB-aligned
- * interior): where the kernel grants them on request, the first write of a
- * fresh picture-sized block faults once per 2 MiB instead of once per 4 KiB.
- * The contents and the release (PX_free) are those of malloc either way; the
- * kernel's own setting decides whether the advice is taken. */
+/* malloc; null for a size of 0. */
 PXFX_API void *PX_malloc(size_t size);
 /* free; null is ignored. */
 PXFX_API void PX_free(void *block);
