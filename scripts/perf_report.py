@@ -84,25 +84,24 @@ NOTES = {
     "ResizeOneAndAHalf": "single-precision blends of source bytes gathered by byte shuffles, four "
                          "samples per group, then the vertical blend over whole vectors; this "
                          "pair measured 0.86-1.25 from run to run on the shared machine.",
-    "Effect": "photocopy (effect 2) builds its local means per row in 16-bit vectors; its "
-              "32-bit case varied 119-165 ms between runs today against 240-280 before.",
+    "Effect": "photocopy (effect 2) builds its local means per row in 16-bit vectors and writes "
+              "32-bit results with the source's alpha in the same pass.",
     "Sketch": "one pass over the rows with a single dodge table; 1.9-2.5x across the two "
               "pictures here.",
-    "Oil": "the dominant intensity class is picked per pixel from sliding histograms and its "
-           "sums divided through a table of exact reciprocals; 16-bit window sums and word-wide "
-           "bin moves gave no gain that a same-run comparison could separate from noise.",
-    "Skin": "about 29 % of the call builds the face mask and 23 % the spot map and lift, the rest "
-            "is table maps and page faults: no single step gives 2x.",
+    "Oil": "the column histograms keep 16-bit sums and move down one row per pass over "
+           "cache-sized chunks (one 64-bit add per pixel in and one out), and the window "
+           "slides in 16-bit vectors that pick the dominant class from the keys count * 8 + "
+           "7 - class; what is left per pixel is moving two column histograms and the pick.",
+    "Skin": "the face mask's erosion table is a ring of 16 rows and the lift copies rows "
+            "whole; what is left is the mask's colour rule and erosion, the 5 x 5 spot map "
+            "and the table maps.",
     "ZoomIn": "the result is a fresh block four times the picture: on this machine the first "
               "write of 48 MB of fresh memory takes about 42 ms of page faults (3.5 ms when "
-              "written again), so the 8-bit zoom is almost all page faults, before and after.",
+              "written again), so the 8-bit zoom is almost all page faults.",
 }
 ALLOC_NOTES = {
-    "MyResample2x4": "the vertically resampled plane (factor 4, four times the input) is what "
-                     "the line recognition runs on to make the returned image, so the result "
-                     "needs it.",
-    "Skin": "the skin mask is built from a summed-area table of 32-bit sums (4 bytes per "
-            "pixel) beside the mask and the spot map; at 32 bits the same 84 MB stays under 2x.",
+    "MyResample2x4": "the result itself is four times the input; the straightening works "
+                     "within it.",
 }
 
 
