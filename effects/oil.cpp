@@ -168,6 +168,8 @@ void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols, const Div &
     }
 }
 
+// Windows of at most 4096 pixels: every division of a class's sum by its
+// count is a multiply by that count's exact reciprocal.
 template <class F, class S> bool oil_with_reciprocals(const View &src, const View &dst, int32_t r) {
     const auto area = static_cast<uint32_t>((2 * r + 1) * (2 * r + 1));
     Buffer<ExactDivisor> reciprocal = alloc_buffer<ExactDivisor>(area + 1);
