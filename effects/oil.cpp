@@ -33,17 +33,20 @@ constexpr uint32_t intensity_class(uint32_t c) {
 // class k at bins 4k .. 4k + 3 in that order, so that merging and sliding run
 // over all bins in one pass and a pixel enters or leaves its class through
 // four neighbouring bins. `S` holds the sums of one window exactly: 16 or 32
-// bits while (2r + 1)^2 * 255 fits, 64 bits beyond.
+// bits while (2r + 1)^2 * 255 fits, 64 bits beyond. 16-bit histograms, the
+// layout of the vector windows, count each pixel as kUnit = 8.
 constexpr int32_t kBins = 4;
 template <class S> using Hist = rank::Histogram<kBins * kClasses, S>;
+template <class S> constexpr S kUnit = std::is_same_v<S, uint16_t> ? vec::kOilCount : 1;
 
 // The four bins of a pixel's class as one 64-bit word of 16-bit lanes (bins
 // in memory order on either byte order): a column's bins never go below 0 or
 // past 2^16, so adding or subtracting the word moves each lane alone.
 uint64_t class_word(uint32_t c) {
     constexpr bool little = std::endian::native == std::endian::little;
+    constexpr uint64_t n = kUnit<uint16_t>;
     const uint64_t r = red_of(c), g = green_of(c), b = blue_of(c);
-    return little ? 1 | r << 16 | g << 32 | b << 48 : uint64_t{1} << 48 | r << 32 | g << 16 | b;
+    return little ? n | r << 16 | g << 32 | b << 48 : n << 48 | r << 32 | g << 16 | b;
 }
 
 template <class S> S *class_bins(Hist<S> &h, uint32_t c) {
@@ -84,7 +87,8 @@ template <class S> struct ClassCounts {
 // sum divided (truncating) by the class's count through div(sum, count).
 template <class S, class Div> uint32_t dominant(const Hist<S> &h, uint32_t alpha, const Div &div) {
     const S *bins = h.bins + kBins * rank::most_frequent(ClassCounts<S>{h}, 0, kClasses);
-    return pack(div(bins[3], bins[0]), div(bins[2], bins[0]), div(bins[1], bins[0]), alpha);
+    const S n = bins[0] / kUnit<S>;
+    return pack(div(bins[3], n), div(bins[2], n), div(bins[1], n), alpha);
 }
 
 // Border pixels (closer than r to an edge) are copied; interior pixels take
@@ -103,9 +107,12 @@ void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols, const Div &
     constexpr int32_t kChunk = 64;
     const int32_t w = src.width, h = src.height;
     vec::OilWindows vector = nullptr;
+    vec::OilMoves moves = nullptr;
+    constexpr int32_t kPixelBytes = F::kBitCount / 8;
     if constexpr (std::is_same_v<S, uint16_t>) {
         static_assert(sizeof(Hist<S>) == vec::kOilBins * sizeof(uint16_t));
         if (reciprocal != nullptr) vector = vec::oil_windows();
+        if constexpr (kPixelBytes >= 3) moves = vec::oil_moves(kPixelBytes);
     }
     uint32_t colours[kChunk];
     for (int32_t x = 0; x < w; ++x)
@@ -134,6 +141,11 @@ void oil(const View &src, const View &dst, int32_t r, Hist<S> *cols, const Div &
                 return;
             }
             const typename F::CRow leave = F::crow(src, y - r - 1);
+            if constexpr (F::kDirect && std::is_same_v<S, uint16_t>) {
+                if (moves != nullptr)
+                    moved += static_cast<int32_t>(moves(leave + kPixelBytes * moved, enter + kPixelBytes * moved,
+                                                        static_cast<size_t>(end - moved), cols[moved].bins));
+            }
             for (; moved < end; ++moved) {
                 remove_pixel(cols[moved], F::load(leave, moved));
                 add_pixel(cols[moved], F::load(enter, moved));

@@ -54,15 +54,24 @@ using PhotocopyTone = size_t (*)(const uint8_t *gray, const uint8_t *u, const in
                                  int32_t t2, uint8_t *out);
 
 // Oil's windows along a row, for windows of at most 257 pixels (16-bit
-// sums): win holds kOilBins words, four per intensity class (its count, red,
-// green and blue sums), of the window before pixel `first`; the column histograms, in the same layout, lie kOilBins
-// words apart from cols. For x = first .. end - 1 the window adds column x + r and subtracts column x - r - 1, and
-// colours[x - first] gets blue | green << 8 | red << 16: the sums of the most populated class (the lowest on a tie)
+// sums): win holds kOilBins words, four per intensity class (its count
+// times kOilCount, red, green and blue sums), of the window before pixel
+// `first`; the column histograms, in the same layout, lie kOilBins words
+// apart from cols. For x = first .. end - 1 the window adds column x + r and
+// subtracts column x - r - 1, and colours[x - first] gets blue | green << 8 |
+// red << 16: the sums of the most populated class (the lowest on a tie)
 // divided by its count n through reciprocal[n]. win ends as the window of
 // end - 1.
 inline constexpr size_t kOilBins = 32;
+inline constexpr uint16_t kOilCount = 8;
 using OilWindows = void (*)(const uint16_t *cols, size_t r, size_t first, size_t end, uint16_t *win,
                             const ExactDivisor *reciprocal, uint32_t *colours);
+// Oil's column histograms (kOilBins words each, in the layout above) moved
+// down one row: column x, for x < n, loses pixel x of `leave` and gains
+// pixel x of `enter`, pixels of 3 or 4 bytes (blue, green, red, alpha).
+// Moves the first columns, a multiple of the vector size, and returns how
+// many.
+using OilMoves = size_t (*)(const uint8_t *leave, const uint8_t *enter, size_t n, uint16_t *cols);
 
 // Auto levels with a local screen over one row of `pixels` pixels of
 // `channels` bytes (1, 3 or 4, the fourth alpha): cur is the row, mUp, mCur
@@ -151,6 +160,7 @@ inline CombinePlanes combine_planes(int, int) { return nullptr; }
 inline PhotocopyMeans photocopy_means() { return nullptr; }
 inline PhotocopyTone photocopy_tone() { return nullptr; }
 inline OilWindows oil_windows() { return nullptr; }
+inline OilMoves oil_moves(int) { return nullptr; }
 inline GradationRow gradation_row() { return nullptr; }
 inline DrawingGray drawing_gray(int) { return nullptr; }
 inline ConvolveBytes convolve_bytes() { return nullptr; }
@@ -178,6 +188,8 @@ CombinePlanes combine_planes(int mode, int channels);
 PhotocopyMeans photocopy_means();
 PhotocopyTone photocopy_tone();
 OilWindows oil_windows();
+// For pixels of `channels` bytes, 3 or 4.
+OilMoves oil_moves(int channels);
 GradationRow gradation_row();
 // For pixels of `channels` bytes, 3 or 4.
 DrawingGray drawing_gray(int channels);
