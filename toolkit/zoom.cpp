@@ -7,6 +7,7 @@
 #include <cstring>
 
 #include "core/internal/memory.hpp"
+#include "core/internal/vector_kernels.hpp"
 #include "toolkit/pximage_check.hpp"
 #include "toolkit/resize_internal.hpp"
 
@@ -18,52 +19,40 @@ namespace {
 // Sample traits: 8-bit and 24-bit pictures average single bytes (three per
 // pixel for 24), 16-bit pictures average whole little-endian words.
 struct ByteSamples {
-    using T = uint8_t;
     static uint32_t get(const uint8_t *row, size_t i) { return row[i]; }
     static void put(uint8_t *row, size_t i, uint32_t v) { row[i] = static_cast<uint8_t>(v); }
 };
 struct WordSamples {
-    using T = uint16_t;
     static uint32_t get(const uint8_t *row, size_t i) { return load16(row + 2 * i); }
     static void put(uint8_t *row, size_t i, uint32_t v) { store16(row + 2 * i, v); }
 };
 
-// Doubles one source row horizontally: even columns copy X0, odd columns
-// average X0 and X0 + 1 (held at the last pixel), per sample of C channels.
-// The samples keep their type: an average of two fits it.
-template <class S, int32_t C> void widen_row(const uint8_t *in, int32_t w, typename S::T *out) {
-    using T = typename S::T;
-    for (int32_t x = 0; x < w; ++x) {
-        const int32_t x1 = x + 1 < w ? x + 1 : w - 1;
-        for (int32_t c = 0; c < C; ++c) {
-            const uint32_t a = S::get(in, static_cast<size_t>(x) * C + c);
-            const uint32_t b = S::get(in, static_cast<size_t>(x1) * C + c);
-            out[static_cast<size_t>(2 * x) * C + c] = static_cast<T>(a);
-            out[static_cast<size_t>(2 * x + 1) * C + c] = static_cast<T>((a + b + 1) >> 1);
-        }
-    }
-}
+constexpr uint32_t rounded_mean(uint32_t a, uint32_t b) { return (a + b + 1) >> 1; }
 
-template <class S, int32_t C> bool zoom_in(const View &src, const View &dst) {
-    using T = typename S::T;
+// Result rows 2y and 2y + 1 come from source rows y and y + 1 (y again at
+// the bottom): even columns take pixel X0, odd ones the mean of X0 and X0 + 1
+// (held at the last pixel), per sample of C channels; the odd row is the mean
+// of both rows' values. The target's vectors do each row but its last pixels.
+template <class S, int32_t C> void zoom_in(const View &src, const View &dst) {
     const int32_t w = src.width, h = src.height;
-    const size_t n = static_cast<size_t>(2 * static_cast<int64_t>(w)) * C;
-    Buffer<T> rows = alloc_buffer<T>(2 * n);
-    if (!rows) return false;
-    T *top = rows.get(), *bottom = top + n;
-    widen_row<S, C>(src.row(0), w, top);
-    for (int32_t a = 0; a < h; ++a) {
-        const int32_t b = a + 1 < h ? a + 1 : a;
-        widen_row<S, C>(src.row(b), w, bottom);
-        uint8_t *even = dst.row(2 * a);
-        uint8_t *odd = dst.row(2 * a + 1);
-        for (size_t i = 0; i < n; ++i) {
-            S::put(even, i, top[i]);
-            S::put(odd, i, (static_cast<uint32_t>(top[i]) + bottom[i] + 1) >> 1);
+    const vec::ZoomRows vector = vec::zoom_rows(src.bitCount / 8);
+    for (int32_t y = 0; y < h; ++y) {
+        const uint8_t *a = src.row(y), *b = src.row(y + 1 < h ? y + 1 : y);
+        uint8_t *even = dst.row(2 * y), *odd = dst.row(2 * y + 1);
+        size_t x = vector != nullptr ? vector(a, b, static_cast<size_t>(w), even, odd) : 0;
+        for (; x < static_cast<size_t>(w); ++x) {
+            const size_t x1 = x + 1 < static_cast<size_t>(w) ? x + 1 : x;
+            for (int32_t c = 0; c < C; ++c) {
+                const uint32_t a0 = S::get(a, x * C + c), a1 = S::get(a, x1 * C + c);
+                const uint32_t b0 = S::get(b, x * C + c), b1 = S::get(b, x1 * C + c);
+                const uint32_t ma = rounded_mean(a0, a1), mb = rounded_mean(b0, b1);
+                S::put(even, 2 * x * C + c, a0);
+                S::put(even, (2 * x + 1) * C + c, ma);
+                S::put(odd, 2 * x * C + c, rounded_mean(a0, b0));
+                S::put(odd, (2 * x + 1) * C + c, rounded_mean(ma, mb));
+            }
         }
-        std::swap(top, bottom);
     }
-    return true;
 }
 
 template <int32_t B> void zoom_out(const View &src, const View &dst) {
@@ -130,15 +119,10 @@ PXImage *PXImage_ZoomIn(const PXImage *src) {
     // cleared. A result with rows has them because the source has.
     const std::optional<View> to = view_of(out), from = view_of(src);
     if (!to || !from) return out;
-    bool ok;
     switch (from->bitCount) {
-    case 8: ok = zoom_in<ByteSamples, 1>(*from, *to); break;
-    case 16: ok = zoom_in<WordSamples, 1>(*from, *to); break;
-    default: ok = zoom_in<ByteSamples, 3>(*from, *to); break;
-    }
-    if (!ok) {
-        PXImage_Free(out);
-        return nullptr;
+    case 8: zoom_in<ByteSamples, 1>(*from, *to); break;
+    case 16: zoom_in<WordSamples, 1>(*from, *to); break;
+    default: zoom_in<ByteSamples, 3>(*from, *to); break;
     }
     return out;
 }

@@ -149,6 +149,15 @@ using ResizeAcross = void (*)(const uint8_t *row, const ResizeColumns &columns, 
 // for the first k < n, a multiple of the vector size; returns how many.
 using ResizeDown = size_t (*)(const float *top, const float *bottom, float omw, float w, size_t n, uint8_t *out);
 
+// The 2x zoom of the source rows a and b (the row below a, or a again at the
+// bottom) into the result rows even and odd, pixels of `bytes` bytes (1 or 3:
+// bytes averaged one by one; 2: little-endian 16-bit words): for source pixel
+// x, even gets a[x] then (a[x] + a[x + 1] + 1) >> 1, and odd the rounded
+// averages of those two and their counterparts from b. Does pixels 0 .. k - 1
+// for a k below `pixels` (the last pixel, whose neighbour is itself, is the
+// caller's) and returns k.
+using ZoomRows = size_t (*)(const uint8_t *a, const uint8_t *b, size_t pixels, uint8_t *even, uint8_t *odd);
+
 #ifdef PXFX_PORTABLE_ONLY
 inline Median5Row median5_row() { return nullptr; }
 inline Cross19Row cross19_row() { return nullptr; }
@@ -168,6 +177,7 @@ inline WindowBoxBytes window_box_bytes() { return nullptr; }
 inline BoxBytes box_bytes() { return nullptr; }
 inline ResizeAcross resize_across() { return nullptr; }
 inline ResizeDown resize_down() { return nullptr; }
+inline ZoomRows zoom_rows(int) { return nullptr; }
 #else
 Median5Row median5_row();
 Cross19Row cross19_row();
@@ -198,6 +208,8 @@ WindowBoxBytes window_box_bytes();
 BoxBytes box_bytes();
 ResizeAcross resize_across();
 ResizeDown resize_down();
+// For pixels of `bytes` bytes, 1, 2 or 3.
+ZoomRows zoom_rows(int bytes);
 #endif
 
 } // namespace pxfx::vec

@@ -164,6 +164,22 @@ TEST(Dispatch, ResizeMatchesThePlainLoops) {
         }
 }
 
+// The 2x zoom at every width up to past two vector steps (whose last pixel
+// is held) at 8, 16 and 24 bits, with and without a row below.
+TEST(Dispatch, ZoomInMatchesThePlainLoop) {
+    for (int32_t bits : {8, 16, 24})
+        for (int32_t width = 1; width <= 40; ++width)
+            for (int32_t height : {1, 3}) {
+                const pxtest::PX src = pxtest::px_random(width, height, bits, static_cast<uint32_t>(bits * width));
+                const auto runs = on_every_path([&] {
+                    const pxtest::PX zoomed(PXImage_ZoomIn(src.get()));
+                    return pxtest::bytes(zoomed.get());
+                });
+                for (size_t p = 1; p < runs.size(); ++p)
+                    EXPECT_EQ(runs[p], runs[0]) << bits << " bits, " << width << " x " << height << ", path " << p;
+            }
+}
+
 // The vertical blend of resize over the whole range its contract allows:
 // weights beyond 0..1 (up to 2^20) under rows that differ, whose sums leave
 // 0..255 both ways; the bytes are the low ones of the truncations held at 0.
