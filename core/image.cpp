@@ -4,6 +4,7 @@
 #include <cstring>
 
 #include "core/internal/image_check.hpp"
+#include "core/internal/memory.hpp"
 #include "core/internal/pixel.hpp"
 
 using namespace pxfx;
@@ -54,6 +55,7 @@ Image *malloc_Image(int32_t width, int32_t height, int32_t bitCount) {
         PX_free(im);
         return nullptr;
     }
+    prefault(im->bits, static_cast<size_t>(bytes));
     std::memset(im->bits, 255, static_cast<size_t>(bytes));
     im->width = width;
     im->height = height;

@@ -11,6 +11,7 @@
 
 #include "core/internal/image_check.hpp"
 #include "core/internal/math.hpp"
+#include "core/internal/memory.hpp"
 #include "core/internal/view.hpp"
 
 namespace pxfx::packed {
@@ -66,6 +67,8 @@ inline PXImage *px_record(int64_t width, int64_t height, int32_t bitcount, int64
             PX_free(im);
             return nullptr;
         }
+        // Results are written whole right after.
+        prefault(im->data, static_cast<size_t>(bytes));
     }
     im->width = static_cast<int32_t>(width);
     im->height = static_cast<int32_t>(height);

@@ -35,6 +35,15 @@ template <class T> Buffer<T> alloc_zeroed(size_t count) {
     return b;
 }
 
+// Backs a block that is about to be written whole with pages at once, in
+// one call to the kernel instead of one page fault per page (Linux 5.14 and
+// later). The contents stay as they are; where the kernel refuses, or off
+// Linux, the pages come on first write as before. Only blocks of at least
+// kPrefaultBytes ask: smaller ones are mostly reused from the allocator's
+// free lists, where there is nothing to gain.
+inline constexpr size_t kPrefaultBytes = size_t{16} << 20;
+void prefault(void *block, size_t bytes);
+
 struct ImageFree {
     void operator()(Image *im) const { free_Image(&im, 0); }
 };

@@ -13,6 +13,8 @@ set(allowed
   # C library
   malloc free memcpy memmove memset memcmp strlen fopen fclose fread fwrite fseek ftell lrand48 getenv
   abort __stack_chk_fail __stack_chk_guard __errno_location __assert_fail
+  # Linux and Android only (the library asks for them there alone)
+  madvise sysconf
   # maths library
   sqrt sqrtf pow powf exp expf log logf sin sinf cos cosf sincos sincosf atan2 atan2f floor ceil
   # loader and toolchain artifacts
