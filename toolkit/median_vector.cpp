@@ -30,34 +30,117 @@ namespace {
 
 // The compare-exchanges after the column sort over 25 wires (wire 5 * r + c
 // holds rank r of window column c): the sort of every rank across the
-// columns, then the selection of the middle of the 13 undecided values, with
-// the comparators that cannot reach the result dropped.
+// columns, then the selection of the middle of the 13 undecided values.
+// That selection starts as the generic network for 13 values; as the 13 are
+// partly ordered already (the table's rows and columns are sorted), each of
+// its comparators in turn is dropped when the median still comes out right
+// without it, and then the comparators that cannot reach the result go too.
+// "Comes out right" is checked on 0/1 values (a network that selects the
+// median of every 0/1 input of a kind selects it for all inputs of that
+// kind, as thresholds commute with min and max): the 252 tables of 0s and
+// 1s with sorted rows and columns. The whole network, rank sorts included,
+// is checked again on all 6^5 inputs whose columns are sorted (`proven`).
 struct Median25Network {
     using Op = CompareOp;
-    Op ops[5 * 9 + 64] = {};
+    static constexpr int kMax = 5 * 9 + 64;
+    Op ops[kMax] = {};
     int count = 0;
     int out = 0;
+    bool proven = false;
+
+    // Bit i of a wire's set: its value in the i-th 0/1 input of a family.
+    template <int W> struct Bits {
+        uint64_t w[W] = {};
+    };
+
+    // Runs ops[0 .. n) over the wires' bit sets (min is and, max is or) and
+    // tells whether wire `out` ends as `median`.
+    template <int W>
+    static constexpr bool selects(const Op *ops, int n, const Bits<W> (&in)[25], const Bits<W> &median, int out) {
+        Bits<W> v[25] = {};
+        for (int i = 0; i < 25; ++i)
+            v[i] = in[i];
+        for (int k = 0; k < n; ++k) {
+            Bits<W> &a = v[ops[k].lo], &b = v[ops[k].hi];
+            for (int j = 0; j < W; ++j) {
+                const uint64_t lo = a.w[j] & b.w[j], hi = a.w[j] | b.w[j];
+                a.w[j] = lo, b.w[j] = hi;
+            }
+        }
+        for (int j = 0; j < W; ++j)
+            if (v[out].w[j] != median.w[j]) return false;
+        return true;
+    }
+
+    // The 0/1 tables whose column c holds 0s above row top[c] and 1s from
+    // it down (tops non-increasing across the columns when `sortedRows`),
+    // one bit each, and the bit set of their medians (at least 13 ones).
+    template <int W> static constexpr int tables(bool sortedRows, Bits<W> (&in)[25], Bits<W> &median) {
+        int count = 0;
+        for (int code = 0; code < 7776; ++code) {
+            int top[5] = {}, ones = 0;
+            bool keep = true;
+            for (int c = 0, rest = code; c < 5; ++c, rest /= 6) {
+                top[c] = rest % 6;
+                ones += 5 - top[c];
+                if (sortedRows && c > 0 && top[c] > top[c - 1]) keep = false;
+            }
+            if (!keep) continue;
+            for (int r = 0; r < 5; ++r)
+                for (int c = 0; c < 5; ++c)
+                    if (r >= top[c]) in[5 * r + c].w[count / 64] |= uint64_t{1} << (count % 64);
+            if (ones >= 13) median.w[count / 64] |= uint64_t{1} << (count % 64);
+            ++count;
+        }
+        return count;
+    }
 
     constexpr Median25Network() {
         constexpr uint8_t kSort5[9][2] = {{0, 1}, {3, 4}, {2, 4}, {2, 3}, {0, 3}, {0, 2}, {1, 4}, {1, 3}, {1, 2}};
         // (rank, position in the sorted rank) of the undecided values.
         constexpr uint8_t kOpen[13][2] = {{0, 3}, {0, 4}, {1, 2}, {1, 3}, {1, 4}, {2, 1}, {2, 2},
                                           {2, 3}, {3, 0}, {3, 1}, {3, 2}, {4, 0}, {4, 1}};
-        Op all[5 * 9 + 64] = {};
+        Op all[kMax] = {};
         int n = 0;
         for (int r = 0; r < 5; ++r)
             for (const auto &op : kSort5)
                 all[n++] = {static_cast<uint8_t>(5 * r + op[0]), static_cast<uint8_t>(5 * r + op[1])};
         constexpr const auto &kMid = kSelect<13, 6>;
         auto wire = [&](int i) { return static_cast<uint8_t>(5 * kOpen[i][0] + kOpen[i][1]); };
+        Op select[kMax] = {};
+        int kept = 0;
         for (int i = 0; i < kMid.count; ++i)
-            all[n++] = {wire(kMid.ops[i].lo), wire(kMid.ops[i].hi)};
+            select[kept++] = {wire(kMid.ops[i].lo), wire(kMid.ops[i].hi)};
         out = wire(kMid.out);
+
+        Bits<4> sorted[25] = {};
+        Bits<4> sortedMedian = {};
+        tables(true, sorted, sortedMedian);
+        for (int i = 0; i < kept;) {
+            Op without[kMax] = {};
+            for (int k = 0, m = 0; k < kept; ++k)
+                if (k != i) without[m++] = select[k];
+            if (selects(without, kept - 1, sorted, sortedMedian, out)) {
+                for (int k = 0; k < kept - 1; ++k)
+                    select[k] = without[k];
+                --kept;
+            } else {
+                ++i;
+            }
+        }
+        for (int i = 0; i < kept; ++i)
+            all[n++] = select[i];
         count = keep_reaching(all, n, out, ops);
+
+        Bits<122> columns[25] = {};
+        Bits<122> columnsMedian = {};
+        tables(false, columns, columnsMedian);
+        proven = selects(ops, count, columns, columnsMedian, out);
     }
 };
 
 inline constexpr Median25Network kMedian25{};
+static_assert(kMedian25.proven);
 
 // Samples per strip: the sorted columns of a strip stay on the stack, with
 // room for the window's reach (2 columns of at most 4 channels each side) and
