@@ -73,9 +73,10 @@ NOTES = {
               "read a table and write another picture.",
     "FilterFast": "the box means of 24-bit pictures at 128 bits measured 0.60-0.68 of cv::blur in "
                   "two other runs today on the same shared machine; this run's 1.08 is its worst.",
-    "Smooth": "the 24-bit 5x5 median on 128 bits is about level with OpenCV (0.85-1.18 across "
-              "pictures and runs): a sorted-column selection over 16-byte vectors, exact at every "
-              "tie.",
+    "Smooth": "the 5x5 median sorts each window column once, sorts the ranks across the "
+              "columns and takes the middle of the 13 undecided values through a network pruned "
+              "for the order those already have (proven at compile time on every 0/1 input), "
+              "in 16-byte vectors.",
     "Blur": "the kernel filter keeps the general path (any kernel, divisor, offset, mask, 32-bit "
             "wrap); at 1.00 it is level with cv::filter2D.",
     "ResizeHalf": "at a ratio of exactly 2 a plane takes floored integer means of one, two or "
@@ -88,16 +89,17 @@ NOTES = {
               "32-bit results with the source's alpha in the same pass.",
     "Sketch": "one pass over the rows with a single dodge table; 1.9-2.5x across the two "
               "pictures here.",
-    "Oil": "the column histograms keep 16-bit sums and move down one row per pass over "
-           "cache-sized chunks (one 64-bit add per pixel in and one out), and the window "
-           "slides in 16-bit vectors that pick the dominant class from the keys count * 8 + "
-           "7 - class; what is left per pixel is moving two column histograms and the pick.",
+    "Oil": "the column histograms move down a row with the classes and bin words of 16 pixels "
+           "found in vectors, then one 64-bit add per pixel in and one out; the window slides in "
+           "16-bit vectors whose count lanes hold the pick's keys count * 8 + 7 - class; what is "
+           "left per pixel is the two scattered adds and the pick.",
     "Skin": "the face mask's erosion table is a ring of 16 rows and the lift copies rows "
             "whole; what is left is the mask's colour rule and erosion, the 5 x 5 spot map "
             "and the table maps.",
-    "ZoomIn": "the result is a fresh block four times the picture: on this machine the first "
-              "write of 48 MB of fresh memory takes about 42 ms of page faults (3.5 ms when "
-              "written again), so the 8-bit zoom is almost all page faults.",
+    "ZoomIn": "the result is a fresh block four times the picture: its pages come in one call "
+              "before the rows are written (MADV_POPULATE_WRITE), about 20 ms per 48 MB on this "
+              "virtual machine (2.4 ms to write them again); the rows themselves are byte "
+              "averages and shuffles in vectors.",
 }
 ALLOC_NOTES = {
     "MyResample2x4": "the result itself is four times the input; the straightening works "
