@@ -29,8 +29,8 @@ void detect_boundary(const View &img, int32_t *line);
 
 // result(r, c) = img(line[c] + r, c) for the rows that every column can fill;
 // rows above the picture read as row 0. The rest of res is left as it is.
-// res may be img itself.
-void straighten(const View &img, const int32_t *line, const View &res);
+// res may be img itself. Returns the number of rows filled (0 or below: none).
+int64_t straighten(const View &img, const int32_t *line, const View &res);
 
 // Binarises src into dst (same size, 8 bits) in bands of 37 rows: 1 for levels
 // up to the band's threshold, 255 above. src and dst may be the same image.

@@ -146,12 +146,12 @@ void straighten_columns(const View &img, const int32_t *line, const View &res, i
 // rows copied lies below the last row. Column 65 holds r1 >= 0, so at most
 // `height` rows are copied. Only ends extrapolated above the picture can ask
 // for a negative row; those read row 0.
-void straighten(const View &img, const int32_t *line, const View &res) {
+int64_t straighten(const View &img, const int32_t *line, const View &res) {
     const int32_t w = img.width, h = img.height;
     const int64_t rows = std::min(static_cast<int64_t>(h) - line[0], static_cast<int64_t>(h) - line[w - 1]);
     if (res.bits != img.bits) {
         straighten_columns(img, line, res, 0, w, rows, false);
-        return;
+        return rows;
     }
     // Within one block: the columns whose line lies above the picture read
     // rows above the one written (or row 0) and go from the bottom up, the
@@ -169,6 +169,7 @@ void straighten(const View &img, const int32_t *line, const View &res) {
     straighten_columns(img, line, res, 0, up0, rows, false);
     straighten_columns(img, line, res, up0, up1, rows, true);
     straighten_columns(img, line, res, up1, w, rows, false);
+    return rows;
 }
 
 } // namespace pxfx::lines
@@ -186,9 +187,8 @@ bool recognize_own(Image *img) {
     if (!line) return false;
     lines::detect_boundary(*in, line.get());
     const int32_t w = in->width, h = in->height;
-    lines::straighten(*in, line.get(), *in);
     // Rows past the copied ones are cleared, as in a new result.
-    const int64_t rows = std::min(static_cast<int64_t>(h) - line[0], static_cast<int64_t>(h) - line[w - 1]);
+    const int64_t rows = lines::straighten(*in, line.get(), *in);
     for (int64_t r = std::max<int64_t>(rows, 0); r < h; ++r)
         std::memset(in->row(static_cast<int32_t>(r)), 0, static_cast<size_t>(w));
     line.reset();
